@@ -1,0 +1,197 @@
+#include "support/Vexlan_NIC_Properties.h"
+
+#include "support/Vexlan_FC_Utils_CMPI.h"
+#include "support/Vexlan_NIC_Utils.h"
+
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <fstream>
+#include <iostream>
+#include <mutex>
+#include <strings.h>
+
+bool g_EnableZORAPLog = false;
+char g_InteropNamespace[256];
+char g_CIMOMNameVersion[256];
+char g_CIMSchemaVersion[256];
+
+namespace {
+
+char const kDefaultInteropNamespace[] = "root/PG_InterOp";
+char const kDefaultImplementationNamespace[] = "root/vexlan_cmpi";
+
+// Copies a configured text, cut to the size of the global.
+void setText(char (&target)[256], char const* value) {
+    std::snprintf(target, sizeof target, "%s", value);
+}
+
+// Keys of the provider constructor's reading, in the order they are tried.
+enum class ProviderKey { ErrorLog, DebugLog, ZORAPLog, InteropNamespace, CIMOMNameVersion, CIMSchemaVersion };
+
+struct ProviderKeyRow {
+    char const* name;
+    ProviderKey key;
+};
+
+ProviderKeyRow const kProviderKeys[] = {
+    {"ErrorLog", ProviderKey::ErrorLog},
+    {"DebugLog", ProviderKey::DebugLog},
+    {"ZORAPLog", ProviderKey::ZORAPLog},
+    {"InteropNamespace", ProviderKey::InteropNamespace},
+    {"CIMOMNameVersion", ProviderKey::CIMOMNameVersion},
+    {"CIMSchemaVersion", ProviderKey::CIMSchemaVersion},
+};
+
+}  // namespace
+
+void LoadProviderProperties() {
+    g_EnableLogError = false;
+    g_EnableDebugPrint = false;
+    setText(g_InteropNamespace, kDefaultInteropNamespace);
+    setText(g_CIMOMNameVersion, "Pegasus CIM Server");
+    setText(g_CIMSchemaVersion, "Unknown Version");
+
+    char path[256];
+    std::snprintf(path, sizeof path, VEXLAN_PROPERTIES_DIRECTORY_FORMAT, VEXLAN_PROPERTIES_FILE_NAME);
+
+    std::ifstream file(path);
+    if (file.is_open()) {
+        long errorLog = 0;
+        long debugLog = 0;
+        long zorapLog = 0;
+        char line[256];
+        while (!file.eof()) {
+            file.getline(line, sizeof line);
+            // A line too long for the buffer ends the reading after its first
+            // 255 characters; the stream delivers nothing more.
+            bool lastLine = file.fail() && !file.eof();
+            if (file.fail() && file.gcount() == 0) line[0] = '\0';
+
+            Trim(line);
+            if (line[0] != '#') {
+                for (ProviderKeyRow const& row : kProviderKeys) {
+                    if (std::strstr(line, row.name) == nullptr) continue;
+                    char const* equals = std::strrchr(line, '=');
+                    if (equals != nullptr) {
+                        char const* value = equals + 1;
+                        switch (row.key) {
+                        case ProviderKey::ErrorLog: errorLog = std::strtol(value, nullptr, 10); break;
+                        case ProviderKey::DebugLog: debugLog = std::strtol(value, nullptr, 10); break;
+                        case ProviderKey::ZORAPLog: zorapLog = std::strtol(value, nullptr, 10); break;
+                        case ProviderKey::InteropNamespace:
+                            setText(g_InteropNamespace, value);
+                            Trim(g_InteropNamespace);
+                            break;
+                        case ProviderKey::CIMOMNameVersion: setText(g_CIMOMNameVersion, value); break;
+                        case ProviderKey::CIMSchemaVersion: setText(g_CIMSchemaVersion, value); break;
+                        }
+                    }
+                    break;
+                }
+            }
+            if (lastLine) break;
+        }
+        g_EnableLogError = errorLog > 0;
+        g_EnableDebugPrint = debugLog > 0;
+        g_EnableZORAPLog = zorapLog > 0;
+    }
+
+    if (g_EnableDebugPrint) {
+        Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider constructor was called *****");
+        Vexlan_FC_Utils_CMPI::DebugPrint("PropertiesFileName=%s", path);
+        Vexlan_FC_Utils_CMPI::DebugPrint("Config: %s=%d", "DebugLog", 1);
+        Vexlan_FC_Utils_CMPI::DebugPrint("Config: %s=%d", "ErrorLog", g_EnableLogError ? 1 : 0);
+        if (g_EnableZORAPLog) Vexlan_FC_Utils_CMPI::DebugPrint("Config: %s=%d", "ZORAPLog", 1);
+        Vexlan_FC_Utils_CMPI::DebugPrint("Config: %s=%s", "InteropNamespace", g_InteropNamespace);
+        Vexlan_FC_Utils_CMPI::DebugPrint("Config: %s=%s", "CIMOMNameVersion", g_CIMOMNameVersion);
+        Vexlan_FC_Utils_CMPI::DebugPrint("Config: %s=%s", "CIMSchemaVersion", g_CIMSchemaVersion);
+    }
+}
+
+int getPropertyFilePath(char* buffer, unsigned int size) {
+    if (buffer == nullptr || size <= 20) return 0;
+    int length = std::snprintf(buffer, size, "%s", VEXLAN_PROPERTIES_FILE_NAME);
+    return (length >= 0 && static_cast<unsigned int>(length) < size) ? 1 : 0;
+}
+
+Vexlan_NIC_Properties* Vexlan_NIC_Properties::singleton = nullptr;
+
+namespace {
+std::once_flag singletonOnce;
+}
+
+Vexlan_NIC_Properties* Vexlan_NIC_Properties::instance() {
+    // The first callers may be the polling thread and a request thread at
+    // once: the object is created exactly once.
+    std::call_once(singletonOnce, [] { singleton = new Vexlan_NIC_Properties(); });
+    return singleton;
+}
+
+Vexlan_NIC_Properties::Vexlan_NIC_Properties()
+    : debugLog(false), errorLog(false), linkStatusPollIntervalSeconds(180) {
+    setText(interopNamespace, kDefaultInteropNamespace);
+    setText(implementationNamespace, kDefaultImplementationNamespace);
+    reload();
+}
+
+Vexlan_NIC_Properties::~Vexlan_NIC_Properties() = default;
+
+namespace {
+
+enum class NicKey { ErrorLog, DebugLog, LinkStatusPollIntervalSeconds, InteropNamespace };
+
+struct NicKeyRow {
+    char const* name;
+    NicKey key;
+};
+
+NicKeyRow const kNicKeys[] = {
+    {"ErrorLog", NicKey::ErrorLog},
+    {"DebugLog", NicKey::DebugLog},
+    {"LinkStatusPollIntervalSeconds", NicKey::LinkStatusPollIntervalSeconds},
+    {"InteropNamespace", NicKey::InteropNamespace},
+};
+
+bool switchValue(char const* value) {
+    return strcasecmp(value, "true") == 0 || std::strtol(value, nullptr, 10) != 0;
+}
+
+}  // namespace
+
+void Vexlan_NIC_Properties::reload() {
+    char name[1024];
+    if (getPropertyFilePath(name, sizeof name) == 0) return;
+    std::cerr << "Vexlan_NIC_Properties::reload, properties file name: " << name << std::endl;
+
+    FILE* file = std::fopen(name, "r");
+    if (file == nullptr) return;
+
+    char word[256];
+    while (std::fscanf(file, "%255s", word) == 1) {
+        char const* start = word;
+        while (*start == ' ' || *start == '\t') ++start;
+        if (*start == '#') continue;  // only this word: the rest of a comment line is read on
+
+        for (NicKeyRow const& row : kNicKeys) {
+            std::size_t keyLength = std::strlen(row.name);
+            if (strncasecmp(start, row.name, keyLength) != 0) continue;
+
+            char const* value = start + keyLength;
+            while (*value == ' ' || *value == '\t' || *value == '=') ++value;
+            switch (row.key) {
+            case NicKey::ErrorLog: errorLog = switchValue(value); break;
+            case NicKey::DebugLog: debugLog = switchValue(value); break;
+            case NicKey::LinkStatusPollIntervalSeconds:
+                linkStatusPollIntervalSeconds = static_cast<int>(std::strtol(value, nullptr, 10));
+                break;
+            case NicKey::InteropNamespace:
+                std::strncpy(interopNamespace, value, 255);
+                interopNamespace[255] = '\0';
+                break;
+            }
+            break;
+        }
+    }
+    std::fclose(file);
+}

@@ -1,0 +1,241 @@
+#include "support/Vexlan_NIC_Utils.h"
+
+#include <sys/stat.h>
+
+#include <cctype>
+#include <cstdarg>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+
+namespace {
+
+bool isBlankOrTab(char c) { return c == ' ' || c == '\t'; }
+
+// Appends to a fixed buffer, cutting what does not fit.
+class TextWriter {
+public:
+    TextWriter(char* text, std::size_t size) : text_(text), size_(size) {
+        if (size_ > 0) text_[0] = '\0';
+    }
+    __attribute__((format(printf, 2, 3))) void add(char const* format, ...) {
+        if (used_ + 1 >= size_) return;
+        va_list args;
+        va_start(args, format);
+        int written = std::vsnprintf(text_ + used_, size_ - used_, format, args);
+        va_end(args);
+        if (written > 0) {
+            used_ += static_cast<std::size_t>(written);
+            if (used_ >= size_) used_ = size_ - 1;
+        }
+    }
+
+private:
+    char* text_;
+    std::size_t size_;
+    std::size_t used_ = 0;
+};
+
+}  // namespace
+
+void RTrim(char* text) {
+    if (text == nullptr) return;
+    std::size_t length = std::strlen(text);
+    while (length > 0 && isBlankOrTab(text[length - 1])) text[--length] = '\0';
+}
+
+void LTrim(char* text) {
+    if (text == nullptr) return;
+    std::size_t skip = 0;
+    while (isBlankOrTab(text[skip])) ++skip;
+    if (skip == 0) return;
+
+    // The rest is moved to the front through a local copy; a rest that does
+    // not fit the copy is moved in place instead.
+    std::size_t rest = std::strlen(text + skip);
+    char copy[256];
+    if (rest < sizeof copy) {
+        std::memcpy(copy, text + skip, rest + 1);
+        std::memcpy(text, copy, rest + 1);
+    } else {
+        std::memmove(text, text + skip, rest + 1);
+    }
+}
+
+void Trim(char* text) {
+    if (text == nullptr) return;
+    RTrim(text);
+    if (text[0] != '\0') LTrim(text);
+}
+
+void atollu(char const* text, unsigned long long* value) {
+    if (text == nullptr || value == nullptr) return;
+    unsigned long long scanned = 0;
+    if (std::sscanf(text, "%llu", &scanned) == 1) *value = scanned;
+}
+
+void atou(char const* text, unsigned int* value) {
+    if (text == nullptr || value == nullptr) return;
+    unsigned int scanned = 0;
+    if (std::sscanf(text, "%u", &scanned) == 1) *value = scanned;
+}
+
+void llutoa(unsigned long long value, char* text) {
+    if (text == nullptr) return;
+    std::snprintf(text, kLluTextSize, "%llu", value);
+}
+
+void utoa(unsigned int value, char* text) {
+    if (text == nullptr) return;
+    std::snprintf(text, kUTextSize, "%u", value);
+}
+
+char* macaddrToStr(void const* mac, char* text) {
+    // One buffer per thread: the text of a call with a null `text` lives until
+    // the next such call on the same thread.
+    static thread_local char buffer[kMacTextSize];
+    if (text == nullptr) text = buffer;
+    if (mac == nullptr) {
+        text[0] = '\0';
+        return text;
+    }
+    auto const* b = static_cast<unsigned char const*>(mac);
+    std::snprintf(text, kMacTextSize, "%02X%02X%02X%02X%02X%02X", b[0], b[1], b[2], b[3], b[4], b[5]);
+    return text;
+}
+
+void IPv4addToStr(void const* address, char* text) {
+    if (address == nullptr || text == nullptr) return;
+    auto const* b = static_cast<unsigned char const*>(address);
+    TextWriter out(text, kIPv4TextSize);
+    out.add("%d", b[0]);
+    for (int i = 1; i < 4; ++i) out.add(".%d", b[i]);
+}
+
+std::size_t safeStrCpy(char* target, char const* source, std::size_t size) {
+    if (target == nullptr || source == nullptr || size == 0) return 0;
+    std::size_t count = 0;
+    while (count + 1 < size && source[count] != '\0') {
+        target[count] = source[count];
+        ++count;
+    }
+    target[count] = '\0';
+    return count;
+}
+
+std::uint64_t GetFileSize(char const* path) {
+    if (path == nullptr) return 0;
+    struct stat info;
+    if (stat(path, &info) != 0) return 0;
+    return static_cast<std::uint64_t>(info.st_size);
+}
+
+long getVersion(char* text) {
+    if (text == nullptr) return 0;
+    char* copy = strdup(text);
+    if (copy == nullptr) return 0;
+
+    // Summed without overflow: only "zero or not" matters to callers.
+    unsigned long sum = 0;
+    char* position = nullptr;
+    for (char* token = strtok_r(copy, " .\t\n", &position); token != nullptr;
+         token = strtok_r(nullptr, " .\t\n", &position)) {
+        sum += static_cast<unsigned long>(std::strtol(token, nullptr, 10));
+    }
+    std::free(copy);
+
+    if (sum == 0) {
+        std::memcpy(text, "N/A", 4);
+        return 0;
+    }
+    return static_cast<long>(sum);
+}
+
+int CleanStr(char const* source, char* target, std::size_t targetSize) {
+    if (source == nullptr || source[0] == '\0' || target == nullptr || targetSize == 0) return -1;
+    char const* from = source;
+    if (std::isspace(static_cast<unsigned char>(*from))) ++from;
+    std::size_t used = 0;
+    for (; *from != '\0' && used + 1 < targetSize; ++from) {
+        unsigned char c = static_cast<unsigned char>(*from);
+        if (std::isalnum(c) || std::isspace(c) || std::ispunct(c) || c == '.') target[used++] = *from;
+    }
+    target[used] = '\0';
+    return 0;
+}
+
+void ipv6addr_build_ipv6_str_compact(unsigned char const* address, bool full, char* text) {
+    if (address == nullptr || text == nullptr) return;
+
+    // Map of the eight groups: '0' for an all-zero group.
+    char map[9];
+    for (int i = 0; i < 8; ++i) map[i] = (address[2 * i] == 0 && address[2 * i + 1] == 0) ? '0' : ' ';
+    map[8] = '\0';
+
+    // Longest run of zero groups, the first of equal runs; a single group too.
+    int runStart = -1;
+    int runLength = 0;
+    static char const zeros[] = "00000000";
+    for (int length = 8; length >= 1 && runStart < 0; --length) {
+        char const* found = std::strstr(map, zeros + (8 - length));
+        if (found != nullptr) {
+            runStart = static_cast<int>(found - map);
+            runLength = length;
+        }
+    }
+
+    TextWriter out(text, kIPv6TextSize);
+    for (int i = 0; i < 8; ++i) {
+        if (i == runStart) {
+            out.add("::");
+            continue;
+        }
+        if (runStart >= 0 && i > runStart && i < runStart + runLength) continue;
+
+        unsigned char high = address[2 * i];
+        unsigned char low = address[2 * i + 1];
+        if (full) {
+            out.add("%02x%02x", high, low);
+        } else if (high != 0) {
+            out.add("%x%02x", high, low);
+        } else {
+            out.add("%x", low);
+        }
+
+        int next = i + 1;
+        bool nextStartsRun = next == runStart;
+        bool nextEndsRun = runStart >= 0 && next == runStart + runLength;
+        if (!nextStartsRun && !nextEndsRun && i != 7) out.add(":");
+    }
+}
+
+void nicadapter_IPaddToStr(unsigned char const* address, char* text, int family) {
+    if (address == nullptr || text == nullptr) return;
+    if (family != 4 && family != 6) {
+        bool tailIsZero = true;
+        for (int i = 4; i < 16; ++i) tailIsZero = tailIsZero && address[i] == 0;
+        family = tailIsZero ? 4 : 6;
+    }
+    if (family == 4) {
+        std::memset(text, 0, kIPv4TextSize);
+        IPv4addToStr(address, text);
+    } else {
+        std::memset(text, 0, kIPv6TextSize);
+        ipv6addr_build_ipv6_str_compact(address, false, text);
+    }
+}
+
+char* nicadapter_IPToStr(void const* address) {
+    // One buffer per thread, valid until the next call on the same thread.
+    static thread_local char buffer[kIPTextSize];
+    std::memset(buffer, 0, sizeof buffer);
+    if (address == nullptr) return buffer;
+
+    auto const* record = static_cast<unsigned char const*>(address);
+    switch (record[16]) {
+    case 1: nicadapter_IPaddToStr(record, buffer, 4); break;
+    case 2: nicadapter_IPaddToStr(record, buffer, 6); break;
+    default: break;
+    }
+    return buffer;
+}

@@ -1,0 +1,249 @@
+// The two readers of vexlancna.properties and their differences.
+#include "support/Vexlan_FC_Utils_CMPI.h"
+#include "support/Vexlan_NIC_Properties.h"
+#include "test_files.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+using namespace support_test;
+
+namespace {
+
+std::string const kOptProperties = "/opt/Vexlan_Corporation/CNAProviders/vexlancna.properties";
+std::string const kCwdProperties = "vexlancna.properties";
+
+class SettingsTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        REQUIRE_ISOLATION();
+        makeDirs(kLogDir);
+        std::remove(kOptProperties.c_str());
+        std::remove(kCwdProperties.c_str());
+        std::remove(kLogPath);
+        g_EnableZORAPLog = false;
+        Vexlan_FC_Utils_CMPI::InitializeLogFile();
+    }
+
+    // The provider constructor's reading of a file with this content.
+    static void providerReads(std::string const& content) {
+        writeFile(kOptProperties, content);
+        LoadProviderProperties();
+    }
+
+    // A fresh object of the settings class reading a working-directory file.
+    static void nicReads(std::string const& content, Vexlan_NIC_Properties*& out) {
+        writeFile(kCwdProperties, content);
+        ::testing::internal::CaptureStderr();
+        out = new Vexlan_NIC_Properties();
+        ::testing::internal::GetCapturedStderr();
+    }
+};
+
+// ---- The provider constructor's reader --------------------------------------
+
+TEST_F(SettingsTest, ProviderWithoutFileKeepsDefaultsAndLogsNothing) {
+    g_EnableDebugPrint = true;
+    g_EnableLogError = true;
+    LoadProviderProperties();
+    EXPECT_FALSE(g_EnableDebugPrint);
+    EXPECT_FALSE(g_EnableLogError);
+    EXPECT_FALSE(g_EnableZORAPLog);
+    EXPECT_STREQ(g_InteropNamespace, "root/PG_InterOp");
+    EXPECT_STREQ(g_CIMOMNameVersion, "Pegasus CIM Server");
+    EXPECT_STREQ(g_CIMSchemaVersion, "Unknown Version");
+    EXPECT_FALSE(exists(kLogPath));
+}
+
+TEST_F(SettingsTest, ProviderSwitchesAreOnForValuesAboveZero) {
+    providerReads("DebugLog=0\nErrorLog=5\n");
+    EXPECT_FALSE(g_EnableDebugPrint);
+    EXPECT_TRUE(g_EnableLogError);
+
+    providerReads("DebugLog=true\nErrorLog=-1\nZORAPLog=2\n");
+    EXPECT_FALSE(g_EnableDebugPrint);  // strtol reads 0
+    EXPECT_FALSE(g_EnableLogError);
+    EXPECT_TRUE(g_EnableZORAPLog);
+
+    providerReads("ErrorLog=1\nErrorLog=0\n");  // the last line wins
+    EXPECT_FALSE(g_EnableLogError);
+}
+
+TEST_F(SettingsTest, ProviderLineForms) {
+    providerReads("#ErrorLog=1\n");
+    EXPECT_FALSE(g_EnableLogError);
+
+    providerReads("   ErrorLog=1  \t\n");
+    EXPECT_TRUE(g_EnableLogError);
+
+    providerReads("ErrorLog = 1\n");
+    EXPECT_TRUE(g_EnableLogError);
+
+    providerReads("MyDebugLogSetting=1\n");  // a key anywhere in the line
+    EXPECT_TRUE(g_EnableDebugPrint);
+
+    providerReads("errorlog=1\n");  // case matters
+    EXPECT_FALSE(g_EnableLogError);
+
+    providerReads("ErrorLog 1\n");  // no "=", no change from the default
+    EXPECT_FALSE(g_EnableLogError);
+
+    providerReads("DebugLog=0=1\n");  // the value follows the last "="
+    EXPECT_TRUE(g_EnableDebugPrint);
+
+    providerReads("ErrorLog=1");  // no end of line after the last line
+    EXPECT_TRUE(g_EnableLogError);
+}
+
+TEST_F(SettingsTest, ProviderTexts) {
+    providerReads("InteropNamespace =  root/interop \nCIMOMNameVersion= sfcb 1.4\nCIMSchemaVersion=2.44.1\n");
+    EXPECT_STREQ(g_InteropNamespace, "root/interop");  // trimmed
+    EXPECT_STREQ(g_CIMOMNameVersion, " sfcb 1.4");       // not trimmed
+    EXPECT_STREQ(g_CIMSchemaVersion, "2.44.1");
+
+    // The keys are tried in a fixed order: a line naming a log key is taken
+    // as that key whatever else it holds.
+    providerReads("InteropNamespace=root/ErrorLog\n");
+    EXPECT_STREQ(g_InteropNamespace, "root/PG_InterOp");
+    EXPECT_FALSE(g_EnableLogError);
+}
+
+TEST_F(SettingsTest, ProviderStopsAtAnOverlongLine) {
+    // The first 255 characters of the long line still count; nothing after it.
+    std::string longLine = "DebugLog=1" + std::string(400, ' ') + "x";
+    providerReads("ErrorLog=1\n" + longLine + "\nZORAPLog=1\n");
+    EXPECT_TRUE(g_EnableLogError);
+    EXPECT_TRUE(g_EnableDebugPrint);
+    EXPECT_FALSE(g_EnableZORAPLog);
+
+    providerReads(std::string(300, 'y') + "\nErrorLog=1\n");
+    EXPECT_FALSE(g_EnableLogError);
+}
+
+TEST_F(SettingsTest, ProviderLogsItsConfigurationWhenDebugIsOn) {
+    providerReads("DebugLog=1\nZORAPLog=1\nCIMSchemaVersion=2.44.1\n");
+    std::vector<std::string> expected = {
+        "***** Vexlan_CNA_Provider constructor was called *****",
+        "PropertiesFileName=/opt/Vexlan_Corporation/CNAProviders/vexlancna.properties",
+        "Config: DebugLog=1",
+        "Config: ErrorLog=0",
+        "Config: ZORAPLog=1",
+        "Config: InteropNamespace=root/PG_InterOp",
+        "Config: CIMOMNameVersion=Pegasus CIM Server",
+        "Config: CIMSchemaVersion=2.44.1",
+    };
+    EXPECT_EQ(logMessages(), expected);
+
+    std::remove(kLogPath);
+    providerReads("ErrorLog=1\n");
+    EXPECT_FALSE(exists(kLogPath));
+}
+
+TEST_F(SettingsTest, ProviderIgnoresTheWorkingDirectoryFile) {
+    writeFile(kCwdProperties, "ErrorLog=1\n");
+    LoadProviderProperties();
+    EXPECT_FALSE(g_EnableLogError);
+}
+
+// ---- The settings object's reader -------------------------------------------
+
+TEST_F(SettingsTest, NicWithoutFileKeepsDefaults) {
+    Vexlan_NIC_Properties properties;
+    EXPECT_FALSE(properties.debugLog);
+    EXPECT_FALSE(properties.errorLog);
+    EXPECT_EQ(properties.linkStatusPollIntervalSeconds, 180);
+    EXPECT_STREQ(properties.interopNamespace, "root/PG_InterOp");
+    EXPECT_STREQ(properties.implementationNamespace, "root/vexlan_cmpi");
+}
+
+TEST_F(SettingsTest, NicReadsOnlyTheWorkingDirectoryFile) {
+    writeFile(kOptProperties, "LinkStatusPollIntervalSeconds=30\n");
+    Vexlan_NIC_Properties fromOpt;
+    EXPECT_EQ(fromOpt.linkStatusPollIntervalSeconds, 180);
+
+    Vexlan_NIC_Properties* fromCwd = nullptr;
+    nicReads("LinkStatusPollIntervalSeconds=30\n", fromCwd);
+    EXPECT_EQ(fromCwd->linkStatusPollIntervalSeconds, 30);
+    delete fromCwd;
+}
+
+TEST_F(SettingsTest, NicSwitchesAndWords) {
+    struct Case {
+        char const* content;
+        bool errorLog;
+    } const cases[] = {
+        {"ErrorLog=true", true},        {"ErrorLog=TRUE", true},      {"ErrorLog=5", true},
+        {"ErrorLog=0", false},          {"ErrorLog=no", false},       {"errorlog=1", true},
+        {"#ErrorLog=1", false},         {"# ErrorLog=1", true},       // only the "#" word is skipped
+        {"ErrorLog = 1", false},        {"  \tErrorLog=1  ", true},   {"MyErrorLogSetting=1", false},
+        {"ErrorLog=1 ErrorLog=0", false}, {"ErrorLog==1", true},
+    };
+    for (Case const& c : cases) {
+        Vexlan_NIC_Properties* properties = nullptr;
+        nicReads(c.content, properties);
+        EXPECT_EQ(properties->errorLog, c.errorLog) << c.content;
+        EXPECT_FALSE(properties->debugLog) << c.content;
+        delete properties;
+    }
+}
+
+TEST_F(SettingsTest, NicValues) {
+    Vexlan_NIC_Properties* properties = nullptr;
+    nicReads("debuglog=1\nlinkstatuspollintervalseconds=0\nInteropNamespace=root/other\n"
+             "implementationNamespace=root/ignored\n",
+             properties);
+    EXPECT_TRUE(properties->debugLog);
+    EXPECT_EQ(properties->linkStatusPollIntervalSeconds, 0);
+    EXPECT_STREQ(properties->interopNamespace, "root/other");
+    EXPECT_STREQ(properties->implementationNamespace, "root/vexlan_cmpi");
+    delete properties;
+
+    nicReads("LinkStatusPollIntervalSeconds=soon\nInteropNamespace=" + std::string(300, 'n'), properties);
+    EXPECT_EQ(properties->linkStatusPollIntervalSeconds, 0);
+    EXPECT_EQ(std::string(properties->interopNamespace), std::string(255 - 17, 'n'));
+    delete properties;
+}
+
+TEST_F(SettingsTest, NicReloadReadsOverCurrentValuesAndNamesTheFile) {
+    Vexlan_NIC_Properties* properties = nullptr;
+    nicReads("LinkStatusPollIntervalSeconds=45\n", properties);
+    writeFile(kCwdProperties, "ErrorLog=1\n");
+
+    ::testing::internal::CaptureStderr();
+    properties->reload();
+    EXPECT_EQ(::testing::internal::GetCapturedStderr(),
+              "Vexlan_NIC_Properties::reload, properties file name: vexlancna.properties\n");
+    EXPECT_TRUE(properties->errorLog);
+    EXPECT_EQ(properties->linkStatusPollIntervalSeconds, 45);
+
+    std::remove(kCwdProperties.c_str());
+    ::testing::internal::CaptureStderr();
+    properties->reload();
+    ::testing::internal::GetCapturedStderr();
+    EXPECT_TRUE(properties->errorLog);
+    delete properties;
+}
+
+TEST_F(SettingsTest, InstanceIsCreatedOnceAndNeverReread) {
+    writeFile(kCwdProperties, "LinkStatusPollIntervalSeconds=12\n");
+    ::testing::internal::CaptureStderr();
+    Vexlan_NIC_Properties* first = Vexlan_NIC_Properties::instance();
+    ::testing::internal::GetCapturedStderr();
+    EXPECT_EQ(first, Vexlan_NIC_Properties::singleton);
+    EXPECT_EQ(first->linkStatusPollIntervalSeconds, 12);
+
+    writeFile(kCwdProperties, "LinkStatusPollIntervalSeconds=99\n");
+    EXPECT_EQ(Vexlan_NIC_Properties::instance(), first);
+    EXPECT_EQ(first->linkStatusPollIntervalSeconds, 12);
+}
+
+TEST_F(SettingsTest, PropertyFilePath) {
+    char buffer[64] = "unchanged";
+    EXPECT_EQ(getPropertyFilePath(buffer, 20), 0);
+    EXPECT_EQ(getPropertyFilePath(nullptr, 64), 0);
+    EXPECT_EQ(getPropertyFilePath(buffer, 21), 1);
+    EXPECT_STREQ(buffer, "vexlancna.properties");
+}
+
+}  // namespace
