@@ -1,0 +1,57 @@
+// CmpiProviderBase: the shared provider object, its use count, and the
+// process-wide broker.
+#include "CmpiProviderBase.h"
+
+#include <atomic>
+
+namespace {
+std::atomic<const CMPIBroker*> g_broker{nullptr};
+}
+
+CmpiProviderBase::CmpiProviderBase() : baseMI_(nullptr), useCount_(0) {}
+
+// The provider object is owned through the use count: only the last
+// cleanup deletes it.  A library unloaded without cleanups leaves it be.
+CmpiProviderBase::~CmpiProviderBase() = default;
+
+CmpiBaseMI* CmpiProviderBase::getBaseMI()
+{
+    std::lock_guard<std::mutex> lock(mutex_);
+    return baseMI_;
+}
+
+void CmpiProviderBase::setBaseMI(CmpiBaseMI* baseMI)
+{
+    std::lock_guard<std::mutex> lock(mutex_);
+    baseMI_ = baseMI;
+}
+
+void CmpiProviderBase::incUseCount()
+{
+    std::lock_guard<std::mutex> lock(mutex_);
+    ++useCount_;
+}
+
+int CmpiProviderBase::decUseCount()
+{
+    std::lock_guard<std::mutex> lock(mutex_);
+    if (useCount_ > 0)
+        --useCount_;
+    return useCount_;
+}
+
+int CmpiProviderBase::getUseCount() const
+{
+    std::lock_guard<std::mutex> lock(mutex_);
+    return useCount_;
+}
+
+const CMPIBroker* CmpiProviderBase::getBroker()
+{
+    return g_broker.load(std::memory_order_acquire);
+}
+
+void CmpiProviderBase::setBroker(const CMPIBroker* mb)
+{
+    g_broker.store(mb, std::memory_order_release);
+}
