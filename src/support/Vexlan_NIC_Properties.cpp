@@ -12,13 +12,18 @@
 #include <strings.h>
 
 bool g_EnableZORAPLog = false;
-char g_InteropNamespace[256];
-char g_CIMOMNameVersion[256];
-char g_CIMSchemaVersion[256];
+#define VEXLAN_DEFAULT_INTEROP_NAMESPACE "root/PG_InterOp"
+#define VEXLAN_DEFAULT_CIMOM_NAME_VERSION "Pegasus CIM Server"
+#define VEXLAN_DEFAULT_CIM_SCHEMA_VERSION "Unknown Version"
+
+// The defaults stand also before the provider's constructor has read the file.
+char g_InteropNamespace[256] = VEXLAN_DEFAULT_INTEROP_NAMESPACE;
+char g_CIMOMNameVersion[256] = VEXLAN_DEFAULT_CIMOM_NAME_VERSION;
+char g_CIMSchemaVersion[256] = VEXLAN_DEFAULT_CIM_SCHEMA_VERSION;
 
 namespace {
 
-char const kDefaultInteropNamespace[] = "root/PG_InterOp";
+char const kDefaultInteropNamespace[] = VEXLAN_DEFAULT_INTEROP_NAMESPACE;
 char const kDefaultImplementationNamespace[] = "root/vexlan_cmpi";
 
 // Copies a configured text, cut to the size of the global.
@@ -49,8 +54,8 @@ void LoadProviderProperties() {
     g_EnableLogError = false;
     g_EnableDebugPrint = false;
     setText(g_InteropNamespace, kDefaultInteropNamespace);
-    setText(g_CIMOMNameVersion, "Pegasus CIM Server");
-    setText(g_CIMSchemaVersion, "Unknown Version");
+    setText(g_CIMOMNameVersion, VEXLAN_DEFAULT_CIMOM_NAME_VERSION);
+    setText(g_CIMSchemaVersion, VEXLAN_DEFAULT_CIM_SCHEMA_VERSION);
 
     char path[256];
     std::snprintf(path, sizeof path, VEXLAN_PROPERTIES_DIRECTORY_FORMAT, VEXLAN_PROPERTIES_FILE_NAME);
