@@ -1,0 +1,142 @@
+#!/bin/sh
+# Generates, from the class table (classes.tsv), everything that lists the
+# provider's classes for a CIM server:
+#
+#   Vexlan_CNA_Provider.mof               class MOF for root/vexlan_cmpi
+#   Vexlan_CNA_Provider_Interop.mof       class MOF for the interop namespace
+#   Vexlan_CNA_Provider_Registration.mof  OpenPegasus registration (load into root/PG_InterOp)
+#   Vexlan_CNA_Provider.reg               sfcb registration (sfcbstage -r)
+#
+# Usage: gen-registration.sh [options] TABLE OUTDIR
+#   --version V           PG_ProviderModule.Version (default 1.5.6)
+#   --pegasus-interop NS  interop namespace of OpenPegasus (default root/PG_InterOp)
+#   --sfcb-interop NS     interop namespace of sfcb (default root/interop)
+#
+# Class files are read relative to the directory of TABLE. The class MOF
+# files keep the table's order, which is load order.
+set -eu
+
+version=1.5.6
+pg_interop=root/PG_InterOp
+sfcb_interop=root/interop
+main_ns=root/vexlan_cmpi
+
+usage() {
+    echo "usage: $0 [--version V] [--pegasus-interop NS] [--sfcb-interop NS] TABLE OUTDIR" >&2
+    exit 2
+}
+
+while [ $# -gt 0 ]; do
+    case "$1" in
+        --version) [ $# -ge 2 ] || usage; version=$2; shift 2 ;;
+        --pegasus-interop) [ $# -ge 2 ] || usage; pg_interop=$2; shift 2 ;;
+        --sfcb-interop) [ $# -ge 2 ] || usage; sfcb_interop=$2; shift 2 ;;
+        --) shift; break ;;
+        -*) usage ;;
+        *) break ;;
+    esac
+done
+[ $# -eq 2 ] || usage
+table=$1
+out=$2
+[ -r "$table" ] || { echo "$0: cannot read $table" >&2; exit 1; }
+mofdir=$(dirname "$table")
+mkdir -p "$out"
+
+# The rows without comments and blank lines; every row must have six fields.
+rows=$(mktemp)
+trap 'rm -f "$rows"' EXIT
+awk -F '\t' '
+    /^#/ || /^[ \t]*$/ { next }
+    NF != 6 { printf "%s:%d: expected 6 tab-separated fields, found %d\n", FILENAME, FNR, NF > "/dev/stderr"; bad = 1; next }
+    { print }
+    END { exit bad }
+' "$table" > "$rows"
+
+# Class MOF per namespace, in table order. $1: namespace token, $2: file.
+class_mof() {
+    {
+        echo "// Classes of the Vexlan CNA provider for the namespace \"$1\"."
+        echo "// Generated from classes.tsv by gen-registration.sh."
+        awk -F '\t' -v ns="$1" '{ n = split($2, a, " "); for (i = 1; i <= n; i++) if (a[i] == ns) { print $6; break } }' "$rows" |
+        while IFS= read -r file; do
+            [ -r "$mofdir/$file" ] || { echo "$0: missing class file $mofdir/$file" >&2; exit 1; }
+            echo
+            cat "$mofdir/$file"
+        done
+    } > "$2.tmp"
+    mv "$2.tmp" "$2"
+}
+class_mof "$main_ns" "$out/Vexlan_CNA_Provider.mof"
+class_mof interop "$out/Vexlan_CNA_Provider_Interop.mof"
+
+# OpenPegasus: one module, one provider, one capability per registered class.
+awk -F '\t' -v version="$version" -v interop="$pg_interop" '
+    BEGIN {
+        map["instance"] = 2; map["association"] = 3; map["indication"] = 4; map["method"] = 5
+        print "// OpenPegasus registration of the Vexlan CNA provider; load into root/PG_InterOp."
+        print "// Generated from classes.tsv by gen-registration.sh."
+        print ""
+        print "instance of PG_ProviderModule"
+        print "{"
+        print "    Name = \"Vexlan_CNA_ProviderModule\";"
+        print "    Location = \"Vexlan_CNA_Provider\";"
+        print "    Vendor = \"Vexlan Corporation\";"
+        printf "    Version = \"%s\";\n", version
+        print "    InterfaceType = \"CMPI\";"
+        print "    InterfaceVersion = \"2.0.0\";"
+        print "};"
+        print ""
+        print "instance of PG_Provider"
+        print "{"
+        print "    ProviderModuleName = \"Vexlan_CNA_ProviderModule\";"
+        print "    Name = \"Vexlan_CNA_Provider\";"
+        print "};"
+    }
+    $4 == "-" { next }
+    {
+        n = split($2, ns, " "); nslist = ""
+        for (i = 1; i <= n; i++) {
+            v = (ns[i] == "interop") ? interop : ns[i]
+            nslist = nslist (i > 1 ? ", " : "") "\"" v "\""
+        }
+        n = split($4, ty, " "); tylist = ""
+        for (i = 1; i <= n; i++) {
+            if (!(ty[i] in map)) { printf "unknown provider type %s of %s\n", ty[i], $1 > "/dev/stderr"; exit 1 }
+            tylist = tylist (i > 1 ? ", " : "") map[ty[i]]
+        }
+        print ""
+        print "instance of PG_ProviderCapabilities"
+        print "{"
+        print "    ProviderModuleName = \"Vexlan_CNA_ProviderModule\";"
+        print "    ProviderName = \"Vexlan_CNA_Provider\";"
+        printf "    CapabilityID = \"%s\";\n", $1
+        printf "    ClassName = \"%s\";\n", $1
+        printf "    Namespaces = {%s};\n", nslist
+        printf "    ProviderType = {%s};\n", tylist
+        print "    SupportedProperties = NULL;"
+        print "    SupportedMethods = NULL;"
+        print "};"
+    }
+' "$rows" > "$out/Vexlan_CNA_Provider_Registration.mof.tmp"
+mv "$out/Vexlan_CNA_Provider_Registration.mof.tmp" "$out/Vexlan_CNA_Provider_Registration.mof"
+
+# sfcb: one section per registered class.
+awk -F '\t' -v interop="$sfcb_interop" '
+    BEGIN {
+        print "# sfcb registration of the Vexlan CNA provider."
+        print "# Generated from classes.tsv by gen-registration.sh."
+    }
+    $4 == "-" { next }
+    {
+        n = split($2, ns, " "); nslist = ""
+        for (i = 1; i <= n; i++) nslist = nslist (i > 1 ? " " : "") ((ns[i] == "interop") ? interop : ns[i])
+        print ""
+        printf "[%s]\n", $1
+        print "   provider: Vexlan_CNA_Provider"
+        print "   location: Vexlan_CNA_Provider"
+        printf "   type: %s\n", $4
+        printf "   namespace: %s\n", nslist
+    }
+' "$rows" > "$out/Vexlan_CNA_Provider.reg.tmp"
+mv "$out/Vexlan_CNA_Provider.reg.tmp" "$out/Vexlan_CNA_Provider.reg"
