@@ -13,8 +13,37 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <memory>
-#include <vector>
+
+namespace {
+
+// Work area of the reentrant resolver and account calls: 1 KiB at first,
+// doubled on each grow() up to 1 MiB. grow() is false when out of room or
+// memory, so a look-up fails instead of throwing.
+class WorkBuffer {
+public:
+    WorkBuffer() = default;
+    ~WorkBuffer() { std::free(data_); }
+    WorkBuffer(WorkBuffer const&) = delete;
+    WorkBuffer& operator=(WorkBuffer const&) = delete;
+
+    bool grow() {
+        std::size_t next = size_ == 0 ? 1024 : size_ * 2;
+        if (next > (std::size_t{1} << 20)) return false;
+        char* bigger = static_cast<char*>(std::realloc(data_, next));
+        if (bigger == nullptr) return false;
+        data_ = bigger;
+        size_ = next;
+        return true;
+    }
+    char* data() { return data_; }
+    std::size_t size() const { return size_; }
+
+private:
+    char* data_ = nullptr;
+    std::size_t size_ = 0;
+};
+
+}  // namespace
 
 void GetHostName2(char* buffer) {
     if (buffer == nullptr) return;
@@ -36,10 +65,10 @@ void GetHostName(char* buffer, int* kind, std::size_t size) {
     struct hostent entry;
     struct hostent* found = nullptr;
     int resolverError = 0;
-    std::vector<char> work(1024);
-    while (gethostbyname_r(name, &entry, work.data(), work.size(), &found, &resolverError) == ERANGE &&
-           work.size() < 65536) {
-        work.resize(work.size() * 2);
+    WorkBuffer work;
+    while (work.grow() &&
+           gethostbyname_r(name, &entry, work.data(), work.size(), &found, &resolverError) == ERANGE) {
+        found = nullptr;
     }
 
     if (found == nullptr) {
@@ -65,17 +94,13 @@ namespace {
 
 // Reentrant look-ups with a work buffer that grows on ERANGE.
 template <typename Record, typename Lookup>
-bool lookUp(Record& record, std::vector<char>& work, Lookup lookup) {
-    work.resize(1024);
-    for (;;) {
+bool lookUp(Record& record, WorkBuffer& work, Lookup lookup) {
+    while (work.grow()) {
         Record* found = nullptr;
         int result = lookup(&record, work.data(), work.size(), &found);
-        if (result == ERANGE && work.size() < (1u << 20)) {
-            work.resize(work.size() * 2);
-            continue;
-        }
-        return result == 0 && found != nullptr;
+        if (result != ERANGE) return result == 0 && found != nullptr;
     }
+    return false;
 }
 
 }  // namespace
@@ -86,18 +111,19 @@ int ValidateSystemUserPassword(struct spwd const* entry, char const* password) {
 
     // crypt_r with a private work area: crypt's static result is shared by
     // all threads of the process.
-    auto data = std::make_unique<struct crypt_data>();
-    std::memset(data.get(), 0, sizeof(struct crypt_data));
-    char const* hashed = crypt_r(password, stored[0] != '\0' ? stored : "kq", data.get());
-    if (hashed == nullptr) return -1;
-    return std::strcmp(hashed, stored) == 0 ? 0 : -1;
+    auto* data = static_cast<struct crypt_data*>(std::calloc(1, sizeof(struct crypt_data)));
+    if (data == nullptr) return -1;
+    char const* hashed = crypt_r(password, stored[0] != '\0' ? stored : "kq", data);
+    int result = (hashed != nullptr && std::strcmp(hashed, stored) == 0) ? 0 : -1;
+    std::free(data);
+    return result;
 }
 
 int ValidateSystemUserGroupType(struct spwd const* entry, char const* group) {
     if (entry == nullptr || group == nullptr || entry->sp_namp == nullptr) return -1;
 
     struct group record;
-    std::vector<char> work;
+    WorkBuffer work;
     bool found = lookUp(record, work, [group](struct group* r, char* b, std::size_t n, struct group** out) {
         return getgrnam_r(group, r, b, n, out);
     });
@@ -124,7 +150,7 @@ int OSSValidateSystemUser(char const* name, char const* password) {
     setspent();
     int result = 0;
     struct spwd entry;
-    std::vector<char> work;
+    WorkBuffer work;
     bool found = lookUp(entry, work, [name](struct spwd* r, char* b, std::size_t n, struct spwd** out) {
         return getspnam_r(name, r, b, n, out);
     });
