@@ -11,6 +11,7 @@ import unittest
 
 HERE = os.path.dirname(os.path.abspath(__file__))
 MOFDIR = os.path.dirname(HERE)
+sys.dont_write_bytecode = True       # keep the source tree clean
 sys.path.insert(0, MOFDIR)
 import check_mof  # noqa: E402
 
