@@ -1,0 +1,1058 @@
+// libzorap_cna_provider: the ZORAP_* interface and the control functions,
+// delivered from an adapter description.
+//
+// State: one Library object holds the description in use (its source, the
+// parsed host model with its live state), the main and backup trees, the
+// blocks handed out to callers, the alarm thread and the flash steering.
+// Locks, never nested except where noted:
+//   mu       - source, model, trees, configuration flag, allocations
+//   faultMu  - injected failures
+//   alarmMu  - alarm queue, callback, alarm thread
+//   flashMu  - next-flash setting, flash epoch
+// No lock is held while a caller's callback runs or while a flash write waits.
+#include <dlfcn.h>
+#include <sys/stat.h>
+
+#include <algorithm>
+#include <atomic>
+#include <chrono>
+#include <condition_variable>
+#include <cstdio>
+#include <cstring>
+#include <fstream>
+#include <list>
+#include <mutex>
+#include <new>
+#include <sstream>
+#include <thread>
+#include <unordered_set>
+
+#include "encode.h"
+#include "model.h"
+#include "zorap_cna.h"
+#include "zorap_sim_control.h"
+
+#define ZORAP_EXPORT extern "C" __attribute__((visibility("default")))
+
+namespace zorap_sim {
+namespace {
+
+constexpr const char* kFunctionNames[ZORAP_FN_COUNT] = {
+    "ZORAP_Initialize",
+    "ZORAP_Uninitialize",
+    "ZORAP_GetAdapterList",
+    "ZORAP_DidConfigChange",
+    "ZORAP_ResetConfigChange",
+    "ZORAP_UpdateBackupAdapterList",
+    "ZORAP_SwapBackupToMainAdapterList",
+    "ZORAP_RegisterAlarmNotificationCallback",
+    "ZORAP_UnRegisterAlarmNotificationCallback",
+    "ZORAP_GetHbaDevicePortProperty",
+    "ZORAP_RefreshDeviceStats",
+    "ZORAP_GetVpd",
+    "ZORAP_GetUUIDFromI2CVPD",
+    "ZORAP_GetMBIVersionString",
+    "ZORAP_GetSFPData",
+    "ZORAP_GetOSName",
+    "ZORAP_GetFCoELinkage",
+    "ZORAP_GetLinkProperties",
+    "ZORAP_GetTransceiverDMIData",
+    "ZORAP_GetIPProperties",
+    "ZORAP_UpdateFlash",
+    "ZORAP_doOptionROMUpdate",
+    "ZORAP_FreeMem",
+};
+
+// How many replaced main trees are kept alive after a swap, for a reader
+// that still walks one (the alarm thread of a caller may, without a lock).
+constexpr size_t kRetiredTrees = 2;
+
+void complain(const std::string& message) {
+    std::fprintf(stderr, "libzorap_cna_provider: %s\n", message.c_str());
+}
+
+// Identity of a description file's content, to notice a change.
+struct FileStamp {
+    bool exists = false;
+    dev_t dev = 0;
+    ino_t ino = 0;
+    off_t size = 0;
+    long long mtimeNs = 0;
+    bool operator==(const FileStamp& o) const {
+        return exists == o.exists && dev == o.dev && ino == o.ino && size == o.size &&
+               mtimeNs == o.mtimeNs;
+    }
+    bool operator!=(const FileStamp& o) const { return !(*this == o); }
+};
+
+FileStamp stampOf(const std::string& path) {
+    FileStamp s;
+    struct stat st {};
+    if (path.empty() || ::stat(path.c_str(), &st) != 0) return s;
+    s.exists = true;
+    s.dev = st.st_dev;
+    s.ino = st.st_ino;
+    s.size = st.st_size;
+    s.mtimeNs = static_cast<long long>(st.st_mtim.tv_sec) * 1000000000LL + st.st_mtim.tv_nsec;
+    return s;
+}
+
+struct Source {
+    enum Kind { Default, File, Text } kind = Default;
+    std::string path;  // File
+    std::string text;  // Text
+};
+
+// The default description: the environment variable, or the file beside
+// this library.
+std::string defaultPath() {
+    const char* env = std::getenv(ZORAP_SIM_ENV);
+    if (env && *env) return env;
+    Dl_info info{};
+    if (dladdr(reinterpret_cast<void*>(&stampOf), &info) != 0 && info.dli_fname) {
+        std::string lib = info.dli_fname;
+        auto slash = lib.rfind('/');
+        return (slash == std::string::npos ? std::string(".") : lib.substr(0, slash)) + "/" +
+               ZORAP_SIM_DEFAULT_FILE;
+    }
+    return ZORAP_SIM_DEFAULT_FILE;
+}
+
+struct Loaded {
+    Host host;
+    std::string path;  // "" for text
+    FileStamp stamp;
+    bool ok = false;
+};
+
+// Reads a source; a bad description gives a message and an empty host.
+Loaded readSource(const Source& src) {
+    Loaded out;
+    std::string text, what;
+    if (src.kind == Source::Text) {
+        text = src.text;
+        what = "adapter description (JSON text)";
+    } else {
+        out.path = src.kind == Source::File ? src.path : defaultPath();
+        out.stamp = stampOf(out.path);
+        what = "adapter description " + out.path;
+        std::ifstream in(out.path, std::ios::binary);
+        if (!in) {
+            complain(what + ": cannot be read (" + std::strerror(errno) + "); no adapters");
+            out.host.osName = defaultOsName();
+            return out;
+        }
+        std::ostringstream ss;
+        ss << in.rdbuf();
+        text = ss.str();
+    }
+    try {
+        out.host = parseDescription(text);
+        out.ok = true;
+    } catch (const DescriptionError& e) {
+        complain(what + ": " + e.what() + "; no adapters");
+        out.host = Host{};
+        out.host.osName = defaultOsName();
+    }
+    return out;
+}
+
+struct Alarm {
+    unsigned int device;
+    int type;
+    std::string text;
+};
+
+struct Fault {
+    uint32_t code = 0;
+    int remaining = 0;
+};
+
+class Library {
+public:
+    // --- description, model and trees (mu) ---
+    std::mutex mu;
+    bool initialized = false;
+    uint32_t traceMask = 0;
+    Source source;
+    bool modelLoaded = false;  // a model stands that Initialize may use
+    uint64_t generation = 0;   // bumped at every model replacement
+    Host model;
+    std::string modelPath;
+    FileStamp loadedStamp, notedStamp;
+    bool configChanged = false;
+    std::unique_ptr<Tree> main, backup;
+    std::vector<std::unique_ptr<Tree>> retired;
+    std::unordered_set<void*> allocations;
+    char pathText[4096] = {0};
+
+    // --- failures and counters ---
+    std::atomic<unsigned long> calls[ZORAP_FN_COUNT] = {};
+    std::mutex faultMu;
+    Fault faults[ZORAP_FN_COUNT];
+
+    // --- alarms (alarmMu) ---
+    std::mutex alarmMu;
+    std::condition_variable alarmCv, alarmIdleCv;
+    std::list<Alarm> alarmQueue;
+    ZORAP_ALARM_CALLBACK callback = nullptr;
+    bool inCallback = false;
+    bool alarmStop = false;
+    std::thread alarmThread;
+    std::thread::id alarmThreadId;
+    unsigned long alarmsDelivered = 0;
+
+    // --- flash (flashMu) ---
+    std::mutex flashMu;
+    std::condition_variable flashCv;
+    uint64_t flashEpoch = 0;
+    bool nextFlashSet = false;
+    uint32_t nextFlashResult = 0, nextFlashDurationMs = 0;
+    std::atomic<unsigned long> flashRunning{0};
+
+    // Counts the call and tells whether an injected failure answers it.
+    bool injected(zorap_sim_function fn, uint32_t* code) {
+        calls[fn].fetch_add(1, std::memory_order_relaxed);
+        std::lock_guard<std::mutex> l(faultMu);
+        Fault& f = faults[fn];
+        if (f.code == 0 || f.remaining == 0) return false;
+        *code = f.code;
+        if (f.remaining > 0) --f.remaining;
+        return true;
+    }
+
+    void trace(const std::string& text) {
+        if (traceMask) std::fprintf(stderr, "zorap: %s\n", text.c_str());
+    }
+
+    // Install a freshly read description (mu held).
+    void install(Loaded&& l, bool markChanged) {
+        model = std::move(l.host);
+        modelPath = l.path;
+        loadedStamp = notedStamp = l.stamp;
+        modelLoaded = true;
+        ++generation;
+        if (markChanged) configChanged = true;
+        copyText(pathText, modelPath);
+    }
+
+    int load(const Source& src) {
+        Loaded l = readSource(src);
+        bool ok = l.ok;
+        std::lock_guard<std::mutex> g(mu);
+        source = src;
+        install(std::move(l), true);
+        trace("description loaded from " + (modelPath.empty() ? std::string("JSON text") : modelPath));
+        return ok ? 0 : -1;
+    }
+
+    // Lookups in the model (mu held).
+    struct FcRef {
+        Adapter* adapter = nullptr;
+        PhysPort* port = nullptr;
+        FcFunction* fc = nullptr;
+    };
+    struct NicRef {
+        Adapter* adapter = nullptr;
+        PhysPort* port = nullptr;
+        NicFunction* nic = nullptr;
+    };
+    FcRef findFc(uint32_t handle) {
+        for (auto& a : model.adapters)
+            for (auto& p : a.ports)
+                for (auto& q : p.protocols)
+                    if (q.isFc() && q.fc.handle == handle) return {&a, &p, &q.fc};
+        return {};
+    }
+    FcRef findFcByWwn(const Wwn& wwn) {
+        for (auto& a : model.adapters)
+            for (auto& p : a.ports)
+                for (auto& q : p.protocols)
+                    if (q.isFc() && q.fc.portWwn == wwn) return {&a, &p, &q.fc};
+        return {};
+    }
+    NicRef findNic(const char* interfaceName) {
+        for (auto& a : model.adapters)
+            for (auto& p : a.ports)
+                for (auto& q : p.protocols)
+                    if (q.isNic() && q.nic.interfaceName == interfaceName) return {&a, &p, &q.nic};
+        return {};
+    }
+    Adapter* findAdapterByInstance(uint32_t instance) {
+        for (auto& a : model.adapters)
+            if (static_cast<uint32_t>(a.instance) == instance) return &a;
+        return nullptr;
+    }
+
+    // A zeroed block for an out-parameter (mu held).
+    void* handOut(size_t size) {
+        void* p = std::calloc(1, size);
+        if (!p) throw std::bad_alloc();
+        try {
+            allocations.insert(p);
+        } catch (...) {
+            std::free(p);
+            throw;
+        }
+        return p;
+    }
+
+    // --- alarm thread ---
+    void alarmLoop() {
+        std::unique_lock<std::mutex> l(alarmMu);
+        for (;;) {
+            alarmCv.wait(l, [this] { return alarmStop || !alarmQueue.empty(); });
+            if (alarmStop) break;
+            Alarm a = std::move(alarmQueue.front());
+            alarmQueue.pop_front();
+            ZORAP_ALARM_CALLBACK cb = callback;
+            if (cb) {
+                inCallback = true;
+                l.unlock();
+                std::vector<unsigned char> text(a.text.begin(), a.text.end());
+                text.push_back('\0');
+                cb(a.device, a.type, static_cast<int>(a.text.size()), text.data());
+                l.lock();
+                inCallback = false;
+                ++alarmsDelivered;
+            }
+            alarmIdleCv.notify_all();
+        }
+    }
+
+    void startAlarmThread() {  // alarmMu held
+        if (alarmThread.joinable()) return;
+        alarmStop = false;
+        alarmThread = std::thread([this] { alarmLoop(); });
+        alarmThreadId = alarmThread.get_id();
+    }
+
+    void stopAlarmThread() {
+        std::thread t;
+        {
+            std::lock_guard<std::mutex> l(alarmMu);
+            callback = nullptr;
+            alarmStop = true;
+            alarmQueue.clear();
+            t = std::move(alarmThread);
+        }
+        alarmCv.notify_all();
+        if (t.joinable()) {
+            if (t.get_id() == std::this_thread::get_id())
+                t.detach();  // called from inside the callback
+            else
+                t.join();
+        }
+        std::lock_guard<std::mutex> l(alarmMu);
+        alarmStop = false;
+        inCallback = false;
+        alarmIdleCv.notify_all();
+    }
+
+    // Ends every flash wait at once (shutdown).
+    void abortFlashWrites() {
+        {
+            std::lock_guard<std::mutex> l(flashMu);
+            ++flashEpoch;
+        }
+        flashCv.notify_all();
+    }
+
+    void releaseTrees() {  // mu held
+        main.reset();
+        backup.reset();
+        std::vector<std::unique_ptr<Tree>>().swap(retired);
+    }
+
+    ZORAP_STATUS flashWrite(bool nic, uint32_t adapterInstance, uint32_t deviceHandle) {
+        uint32_t result, durationMs;
+        uint64_t gen, epoch;
+        int32_t instance;
+        {
+            std::lock_guard<std::mutex> g(mu);
+            if (!initialized) return ZORAP_ERR_NOT_INITIALIZED;
+            Adapter* a = nic ? findAdapterByInstance(adapterInstance) : findFc(deviceHandle).adapter;
+            if (!a) return ZORAP_ERR_NOT_FOUND;
+            instance = a->instance;
+            result = model.flashResult;
+            durationMs = model.flashDurationMs;
+            gen = generation;
+            trace("flash write on adapter " + a->serialNumber);
+        }
+        {
+            std::unique_lock<std::mutex> l(flashMu);
+            if (nextFlashSet) {
+                result = nextFlashResult;
+                durationMs = nextFlashDurationMs;
+                nextFlashSet = false;
+            }
+            epoch = flashEpoch;
+            flashRunning.fetch_add(1);
+            bool aborted = flashCv.wait_for(l, std::chrono::milliseconds(durationMs),
+                                            [&] { return flashEpoch != epoch; });
+            flashRunning.fetch_sub(1);
+            if (aborted) return ZORAP_ERR_FAILED;
+        }
+        if (result == ZORAP_OK) {
+            std::lock_guard<std::mutex> g(mu);
+            Adapter* a = generation == gen ? findAdapterByInstance(static_cast<uint32_t>(instance)) : nullptr;
+            if (a) {
+                if (a->afterFlashVersions) a->versions = *a->afterFlashVersions;
+                for (const auto& kv : a->afterFlashVpd) {
+                    auto it = std::find_if(a->vpd.begin(), a->vpd.end(),
+                                           [&](const auto& e) { return e.first == kv.first; });
+                    if (it != a->vpd.end())
+                        it->second = kv.second;
+                    else
+                        a->vpd.push_back(kv);
+                }
+            }
+            configChanged = true;
+        }
+        return result;
+    }
+};
+
+Library& lib() {
+    // Static storage, never destroyed: calls that come late during process
+    // exit still find a valid (emptied) object.
+    alignas(Library) static unsigned char storage[sizeof(Library)];
+    static Library* instance = new (storage) Library();
+    return *instance;
+}
+
+// Runs a contract function: counts it, applies an injected failure, and keeps
+// every exception inside the library.
+template <typename Body>
+ZORAP_STATUS run(zorap_sim_function fn, Body&& body) {
+    uint32_t code = 0;
+    if (lib().injected(fn, &code)) return code;
+    try {
+        return body(lib());
+    } catch (const std::bad_alloc&) {
+        return ZORAP_ERR_NO_MEMORY;
+    } catch (const std::exception& e) {
+        complain(std::string(kFunctionNames[fn]) + ": " + e.what());
+        return ZORAP_ERR_FAILED;
+    } catch (...) {
+        return ZORAP_ERR_FAILED;
+    }
+}
+
+bool parseWwnText(const char* text, Wwn& out) {
+    if (!text) return false;
+    std::string digits;
+    for (const char* p = text; *p; ++p) {
+        if (*p == ':' || *p == '-' || *p == ' ') continue;
+        if (!std::isxdigit(static_cast<unsigned char>(*p))) return false;
+        digits += *p;
+    }
+    if (digits.size() != 16) return false;
+    for (size_t i = 0; i < 8; ++i)
+        out[i] = static_cast<uint8_t>(std::stoul(digits.substr(2 * i, 2), nullptr, 16));
+    return true;
+}
+
+template <typename Body>
+int control(const char* what, Body&& body) {
+    try {
+        return body(lib());
+    } catch (const std::exception& e) {
+        complain(std::string(what) + ": " + e.what());
+        return -1;
+    } catch (...) {
+        return -1;
+    }
+}
+
+}  // namespace
+}  // namespace zorap_sim
+
+using zorap_sim::Library;
+
+// ===========================================================================
+// The ZORAP_* interface
+// ===========================================================================
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_Initialize(int logMask, int reserved) {
+    (void)reserved;
+    return zorap_sim::run(ZORAP_FN_Initialize, [&](Library& L) -> ZORAP_STATUS {
+        zorap_sim::Source src;
+        {
+            std::lock_guard<std::mutex> g(L.mu);
+            L.traceMask = static_cast<uint32_t>(logMask);
+            if (L.initialized) return ZORAP_OK;
+            src = L.source;
+            if (L.modelLoaded) {
+                L.main = zorap_sim::buildTree(L.model);
+                L.initialized = true;
+                L.configChanged = false;
+                L.trace("initialized with " + std::to_string(L.model.adapters.size()) + " adapters");
+                return ZORAP_OK;
+            }
+        }
+        zorap_sim::Loaded loaded = zorap_sim::readSource(src);
+        std::lock_guard<std::mutex> g(L.mu);
+        if (L.initialized) return ZORAP_OK;
+        L.install(std::move(loaded), false);
+        L.main = zorap_sim::buildTree(L.model);
+        L.initialized = true;
+        L.configChanged = false;
+        L.trace("initialized with " + std::to_string(L.model.adapters.size()) + " adapters");
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_Uninitialize(void) {
+    return zorap_sim::run(ZORAP_FN_Uninitialize, [](Library& L) -> ZORAP_STATUS {
+        L.stopAlarmThread();
+        L.abortFlashWrites();
+        std::lock_guard<std::mutex> g(L.mu);
+        L.releaseTrees();
+        L.initialized = false;
+        L.modelLoaded = false;
+        L.configChanged = false;
+        L.trace("uninitialized");
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT _zorap_adapter_list_t* ZORAP_GetAdapterList(void) {
+    _zorap_adapter_list_t* result = nullptr;
+    zorap_sim::run(ZORAP_FN_GetAdapterList, [&](Library& L) -> ZORAP_STATUS {
+        std::lock_guard<std::mutex> g(L.mu);
+        if (L.initialized && L.main) result = &L.main->header;
+        return ZORAP_OK;
+    });
+    return result;
+}
+
+ZORAP_EXPORT int ZORAP_DidConfigChange(void) {
+    uint32_t code = 0;
+    Library& L = zorap_sim::lib();
+    if (L.injected(ZORAP_FN_DidConfigChange, &code)) return static_cast<int>(code);
+    try {
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return 0;
+        if (L.source.kind != zorap_sim::Source::Text) {
+            std::string path =
+                L.source.kind == zorap_sim::Source::File ? L.source.path : zorap_sim::defaultPath();
+            zorap_sim::FileStamp now = zorap_sim::stampOf(path);
+            if (path != L.modelPath || now != L.notedStamp) {
+                L.notedStamp = now;
+                L.configChanged = true;
+            }
+        }
+        return L.configChanged ? 1 : 0;
+    } catch (...) {
+        return 0;
+    }
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_ResetConfigChange(void) {
+    return zorap_sim::run(ZORAP_FN_ResetConfigChange, [](Library& L) -> ZORAP_STATUS {
+        std::lock_guard<std::mutex> g(L.mu);
+        L.configChanged = false;
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_UpdateBackupAdapterList(void) {
+    return zorap_sim::run(ZORAP_FN_UpdateBackupAdapterList, [](Library& L) -> ZORAP_STATUS {
+        zorap_sim::Source src;
+        uint64_t gen;
+        bool reload = false;
+        {
+            std::lock_guard<std::mutex> g(L.mu);
+            if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+            src = L.source;
+            gen = L.generation;
+            if (src.kind != zorap_sim::Source::Text) {
+                std::string path =
+                    src.kind == zorap_sim::Source::File ? src.path : zorap_sim::defaultPath();
+                reload = path != L.modelPath || zorap_sim::stampOf(path) != L.loadedStamp;
+            }
+        }
+        // The file is read without the lock: the main tree stays usable.
+        zorap_sim::Loaded loaded;
+        if (reload) loaded = zorap_sim::readSource(src);
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        if (reload && L.generation == gen) {
+            zorap_sim::FileStamp keepNoted = L.notedStamp;
+            L.install(std::move(loaded), false);
+            L.notedStamp = keepNoted;  // a change not yet reported stays reportable
+            L.trace("description re-read from " + L.modelPath);
+        }
+        L.backup = zorap_sim::buildTree(L.model);
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_SwapBackupToMainAdapterList(void) {
+    return zorap_sim::run(ZORAP_FN_SwapBackupToMainAdapterList, [](Library& L) -> ZORAP_STATUS {
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        if (!L.backup) return ZORAP_ERR_NOT_PRESENT;
+        if (L.main) L.retired.push_back(std::move(L.main));
+        L.main = std::move(L.backup);
+        while (L.retired.size() > zorap_sim::kRetiredTrees) L.retired.erase(L.retired.begin());
+        L.trace("backup tree swapped to main");
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_RegisterAlarmNotificationCallback(ZORAP_ALARM_CALLBACK callback) {
+    return zorap_sim::run(ZORAP_FN_RegisterAlarmNotificationCallback, [&](Library& L) -> ZORAP_STATUS {
+        if (!callback) return ZORAP_ERR_INVALID_PARAMETER;
+        {
+            std::lock_guard<std::mutex> g(L.mu);
+            if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        }
+        std::lock_guard<std::mutex> l(L.alarmMu);
+        L.callback = callback;
+        L.startAlarmThread();
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_UnRegisterAlarmNotificationCallback(ZORAP_ALARM_CALLBACK callback) {
+    return zorap_sim::run(ZORAP_FN_UnRegisterAlarmNotificationCallback, [&](Library& L) -> ZORAP_STATUS {
+        std::unique_lock<std::mutex> l(L.alarmMu);
+        if (!callback || L.callback != callback) return ZORAP_ERR_NOT_FOUND;
+        L.callback = nullptr;
+        // After this returns the callback is not running, unless the caller
+        // is the callback itself.
+        if (std::this_thread::get_id() != L.alarmThreadId)
+            L.alarmIdleCv.wait(l, [&] { return !L.inCallback; });
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_GetHbaDevicePortProperty(uint32_t deviceHandle, uint32_t index,
+                                                         void* portRecord) {
+    (void)index;
+    return zorap_sim::run(ZORAP_FN_GetHbaDevicePortProperty, [&](Library& L) -> ZORAP_STATUS {
+        if (!portRecord) return ZORAP_ERR_INVALID_PARAMETER;
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        auto ref = L.findFc(deviceHandle);
+        if (!ref.fc) return ZORAP_ERR_NOT_FOUND;
+        _zorap_port_property_t prop{};
+        zorap_sim::encodePortProperty(*ref.fc, &prop);
+        std::memcpy(portRecord, &prop, sizeof prop);
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_RefreshDeviceStats(_tagZORAPSDMDevice* device) {
+    return zorap_sim::run(ZORAP_FN_RefreshDeviceStats, [&](Library& L) -> ZORAP_STATUS {
+        if (!device) return ZORAP_ERR_INVALID_PARAMETER;
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        auto ref = L.findFc(device->deviceHandle);
+        if (!ref.fc) return ZORAP_ERR_NOT_FOUND;
+        zorap_sim::encodeFcStats(*ref.fc, device);
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_GetVpd(uint32_t deviceHandle, uint32_t index, uint8_t* buffer,
+                                       uint32_t* size) {
+    (void)index;
+    return zorap_sim::run(ZORAP_FN_GetVpd, [&](Library& L) -> ZORAP_STATUS {
+        if (!buffer || !size) return ZORAP_ERR_INVALID_PARAMETER;
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        auto ref = L.findFc(deviceHandle);
+        if (!ref.fc) return ZORAP_ERR_NOT_FOUND;
+        if (!ref.adapter->hasVpd) return ZORAP_ERR_NOT_PRESENT;
+        std::vector<uint8_t> vpd = zorap_sim::encodeVpd(*ref.adapter);
+        if (vpd.size() > *size) {
+            *size = static_cast<uint32_t>(vpd.size());
+            return ZORAP_ERR_BUFFER_TOO_SMALL;
+        }
+        std::memcpy(buffer, vpd.data(), vpd.size());
+        *size = static_cast<uint32_t>(vpd.size());
+        return ZORAP_OK;
+    });
+}
+
+namespace {
+// A newly allocated text for an out-parameter.
+ZORAP_STATUS handOutText(Library& L, const std::string& s, char** text, uint32_t* length) {
+    char* p = static_cast<char*>(L.handOut(s.size() + 1));
+    std::memcpy(p, s.c_str(), s.size() + 1);
+    *text = p;
+    if (length) *length = static_cast<uint32_t>(s.size());
+    return ZORAP_OK;
+}
+}  // namespace
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_GetUUIDFromI2CVPD(_tagZORAPSDMDevice* device, char** text,
+                                                  uint32_t* length) {
+    return zorap_sim::run(ZORAP_FN_GetUUIDFromI2CVPD, [&](Library& L) -> ZORAP_STATUS {
+        if (!device || !text) return ZORAP_ERR_INVALID_PARAMETER;
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        auto ref = L.findFc(device->deviceHandle);
+        if (!ref.fc) return ZORAP_ERR_NOT_FOUND;
+        if (!ref.adapter->i2cUuid) return ZORAP_ERR_NOT_PRESENT;
+        return handOutText(L, *ref.adapter->i2cUuid, text, length);
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_GetMBIVersionString(_tagZORAPSDMDevice* device, char** text,
+                                                    uint32_t* length) {
+    return zorap_sim::run(ZORAP_FN_GetMBIVersionString, [&](Library& L) -> ZORAP_STATUS {
+        if (!device || !text) return ZORAP_ERR_INVALID_PARAMETER;
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        auto ref = L.findFc(device->deviceHandle);
+        if (!ref.fc) return ZORAP_ERR_NOT_FOUND;
+        if (!ref.adapter->versions.mbi) return ZORAP_ERR_NOT_PRESENT;
+        return handOutText(L, zorap_sim::mbiVersionString(*ref.adapter->versions.mbi), text, length);
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_GetSFPData(_tagZORAPSDMDevice* device, uint8_t* buffer) {
+    return zorap_sim::run(ZORAP_FN_GetSFPData, [&](Library& L) -> ZORAP_STATUS {
+        if (!device || !buffer) return ZORAP_ERR_INVALID_PARAMETER;
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        auto ref = L.findFc(device->deviceHandle);
+        if (!ref.fc) return ZORAP_ERR_NOT_FOUND;
+        if (!ref.port->transceiver) return ZORAP_ERR_NOT_PRESENT;
+        zorap_sim::encodeTransceiverPages(*ref.port->transceiver, buffer);
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_GetOSName(char* buffer, uint32_t* size) {
+    return zorap_sim::run(ZORAP_FN_GetOSName, [&](Library& L) -> ZORAP_STATUS {
+        if (!buffer || !size) return ZORAP_ERR_INVALID_PARAMETER;
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        const std::string& os = L.model.osName;
+        if (os.size() + 1 > *size) {
+            *size = static_cast<uint32_t>(os.size() + 1);
+            return ZORAP_ERR_BUFFER_TOO_SMALL;
+        }
+        std::memcpy(buffer, os.c_str(), os.size() + 1);
+        *size = static_cast<uint32_t>(os.size());
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_GetFCoELinkage(const char* interfaceName, void** array,
+                                               uint32_t* count) {
+    return zorap_sim::run(ZORAP_FN_GetFCoELinkage, [&](Library& L) -> ZORAP_STATUS {
+        if (!interfaceName || !array || !count) return ZORAP_ERR_INVALID_PARAMETER;
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        auto ref = L.findNic(interfaceName);
+        if (!ref.nic) return ZORAP_ERR_NOT_FOUND;
+        *array = nullptr;
+        *count = 0;
+        const auto& links = ref.nic->fcoe;
+        if (links.empty()) return ZORAP_OK;
+        auto* out = static_cast<_zorap_fcoe_linkage_t*>(L.handOut(links.size() * sizeof(_zorap_fcoe_linkage_t)));
+        for (size_t i = 0; i < links.size(); ++i) zorap_sim::encodeFcoeLinkage(links[i], &out[i]);
+        *array = out;
+        *count = static_cast<uint32_t>(links.size());
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_GetLinkProperties(const char* interfaceName,
+                                                  _zorap_link_properties_t* properties) {
+    return zorap_sim::run(ZORAP_FN_GetLinkProperties, [&](Library& L) -> ZORAP_STATUS {
+        if (!interfaceName || !properties) return ZORAP_ERR_INVALID_PARAMETER;
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        auto ref = L.findNic(interfaceName);
+        if (!ref.nic) return ZORAP_ERR_NOT_FOUND;
+        zorap_sim::encodeLinkProperties(*ref.nic, properties);
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_GetTransceiverDMIData(const char* interfaceName, uint32_t* length,
+                                                      uint8_t* buffer) {
+    return zorap_sim::run(ZORAP_FN_GetTransceiverDMIData, [&](Library& L) -> ZORAP_STATUS {
+        if (!interfaceName || !length || !buffer) return ZORAP_ERR_INVALID_PARAMETER;
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        auto ref = L.findNic(interfaceName);
+        if (!ref.nic) return ZORAP_ERR_NOT_FOUND;
+        if (!ref.port->transceiver) return ZORAP_ERR_NOT_PRESENT;
+        if (*length < zorap_sim::kTransceiverPagesSize) {
+            *length = zorap_sim::kTransceiverPagesSize;
+            return ZORAP_ERR_BUFFER_TOO_SMALL;
+        }
+        zorap_sim::encodeTransceiverPages(*ref.port->transceiver, buffer);
+        *length = zorap_sim::kTransceiverPagesSize;
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_GetIPProperties(const char* interfaceName, void** record) {
+    return zorap_sim::run(ZORAP_FN_GetIPProperties, [&](Library& L) -> ZORAP_STATUS {
+        if (!interfaceName || !record) return ZORAP_ERR_INVALID_PARAMETER;
+        std::lock_guard<std::mutex> g(L.mu);
+        if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
+        auto ref = L.findNic(interfaceName);
+        if (!ref.nic) return ZORAP_ERR_NOT_FOUND;
+        void* block = L.handOut(zorap_sim::ipPropertiesBlockSize(*ref.nic));
+        zorap_sim::encodeIpProperties(*ref.nic, block);
+        *record = block;
+        return ZORAP_OK;
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_UpdateFlash(uint32_t adapterInstance, const unsigned char* image,
+                                            uint32_t flags) {
+    (void)flags;
+    return zorap_sim::run(ZORAP_FN_UpdateFlash, [&](Library& L) -> ZORAP_STATUS {
+        if (!image) return ZORAP_ERR_INVALID_PARAMETER;
+        return L.flashWrite(true, adapterInstance, 0);
+    });
+}
+
+ZORAP_EXPORT ZORAP_STATUS ZORAP_doOptionROMUpdate(_tagZORAPSDMDevice* device,
+                                                  const unsigned char* image, uint32_t flags) {
+    (void)flags;
+    return zorap_sim::run(ZORAP_FN_doOptionROMUpdate, [&](Library& L) -> ZORAP_STATUS {
+        if (!device || !image) return ZORAP_ERR_INVALID_PARAMETER;
+        return L.flashWrite(false, 0, device->deviceHandle);
+    });
+}
+
+ZORAP_EXPORT void ZORAP_FreeMem(void* memory) {
+    Library& L = zorap_sim::lib();
+    uint32_t ignored = 0;
+    (void)L.injected(ZORAP_FN_FreeMem, &ignored);  // counted; a failure cannot be shown
+    if (!memory) return;
+    bool known;
+    {
+        std::lock_guard<std::mutex> g(L.mu);
+        known = L.allocations.erase(memory) != 0;
+    }
+    if (known) {
+        std::free(memory);
+    } else {
+        char text[128];
+        std::snprintf(text, sizeof text, "ZORAP_FreeMem: %p was not handed out by this library; ignored",
+                      memory);
+        zorap_sim::complain(text);
+    }
+}
+
+// ===========================================================================
+// Controls
+// ===========================================================================
+
+ZORAP_EXPORT const char* zorap_sim_function_name(int function) {
+    if (function < 0 || function >= ZORAP_FN_COUNT) return nullptr;
+    return zorap_sim::kFunctionNames[function];
+}
+
+ZORAP_EXPORT int zorap_sim_function_from_name(const char* name) {
+    if (!name) return -1;
+    for (int i = 0; i < ZORAP_FN_COUNT; ++i) {
+        const char* full = zorap_sim::kFunctionNames[i];
+        if (std::strcmp(full, name) == 0 || std::strcmp(full + 6, name) == 0) return i;
+    }
+    return -1;
+}
+
+ZORAP_EXPORT int zorap_sim_load_file(const char* path) {
+    return zorap_sim::control("zorap_sim_load_file", [&](Library& L) {
+        if (!path || !*path) {
+            zorap_sim::complain("zorap_sim_load_file: no path given");
+            return -1;
+        }
+        zorap_sim::Source s;
+        s.kind = zorap_sim::Source::File;
+        s.path = path;
+        return L.load(s);
+    });
+}
+
+ZORAP_EXPORT int zorap_sim_load_json(const char* jsonText) {
+    return zorap_sim::control("zorap_sim_load_json", [&](Library& L) {
+        zorap_sim::Source s;
+        s.kind = zorap_sim::Source::Text;
+        s.text = jsonText ? jsonText : "";
+        return L.load(s);
+    });
+}
+
+ZORAP_EXPORT int zorap_sim_load_default(void) {
+    return zorap_sim::control("zorap_sim_load_default", [](Library& L) { return L.load(zorap_sim::Source{}); });
+}
+
+ZORAP_EXPORT const char* zorap_sim_description_path(void) {
+    Library& L = zorap_sim::lib();
+    std::lock_guard<std::mutex> g(L.mu);
+    return L.pathText;
+}
+
+ZORAP_EXPORT int zorap_sim_set_link_state(const char* interfaceName, uint32_t linkState) {
+    return zorap_sim::control("zorap_sim_set_link_state", [&](Library& L) {
+        std::lock_guard<std::mutex> g(L.mu);
+        auto ref = L.findNic(interfaceName ? interfaceName : "");
+        if (!ref.nic) {
+            zorap_sim::complain(std::string("zorap_sim_set_link_state: no interface ") +
+                                (interfaceName ? interfaceName : "(null)"));
+            return -1;
+        }
+        ref.nic->linkState = linkState;
+        return 0;
+    });
+}
+
+ZORAP_EXPORT int zorap_sim_set_link_speed(const char* interfaceName, uint64_t speedMbps) {
+    return zorap_sim::control("zorap_sim_set_link_speed", [&](Library& L) {
+        std::lock_guard<std::mutex> g(L.mu);
+        auto ref = L.findNic(interfaceName ? interfaceName : "");
+        if (!ref.nic) {
+            zorap_sim::complain(std::string("zorap_sim_set_link_speed: no interface ") +
+                                (interfaceName ? interfaceName : "(null)"));
+            return -1;
+        }
+        ref.nic->linkSpeed = speedMbps;
+        return 0;
+    });
+}
+
+namespace {
+template <typename Change>
+int changeFc(const char* what, const char* portWWN, Change&& change) {
+    return zorap_sim::control(what, [&](Library& L) {
+        zorap_sim::Wwn wwn{};
+        if (!zorap_sim::parseWwnText(portWWN, wwn)) {
+            zorap_sim::complain(std::string(what) + ": not a WWN: " + (portWWN ? portWWN : "(null)"));
+            return -1;
+        }
+        std::lock_guard<std::mutex> g(L.mu);
+        auto ref = L.findFcByWwn(wwn);
+        if (!ref.fc) {
+            zorap_sim::complain(std::string(what) + ": no FC port with WWN " + portWWN);
+            return -1;
+        }
+        change(*ref.fc);
+        return 0;
+    });
+}
+}  // namespace
+
+ZORAP_EXPORT int zorap_sim_set_fc_port_state(const char* portWWN, uint8_t stateCode) {
+    return changeFc("zorap_sim_set_fc_port_state", portWWN,
+                    [&](zorap_sim::FcFunction& fc) { fc.stateCode = stateCode; });
+}
+
+ZORAP_EXPORT int zorap_sim_set_fc_port_stats(const char* portWWN, const uint32_t counters[9]) {
+    if (!counters) return -1;
+    return changeFc("zorap_sim_set_fc_port_stats", portWWN, [&](zorap_sim::FcFunction& fc) {
+        std::copy(counters, counters + 9, fc.stats.begin());
+    });
+}
+
+ZORAP_EXPORT int zorap_sim_raise_alarm(unsigned int deviceNumber, int coreAlarmType, const char* text) {
+    return zorap_sim::control("zorap_sim_raise_alarm", [&](Library& L) {
+        {
+            std::lock_guard<std::mutex> l(L.alarmMu);
+            if (!L.callback || !L.alarmThread.joinable()) return -1;
+            L.alarmQueue.push_back({deviceNumber, coreAlarmType, text ? text : ""});
+        }
+        L.alarmCv.notify_all();
+        return 0;
+    });
+}
+
+ZORAP_EXPORT int zorap_sim_wait_alarms_idle(uint32_t timeoutMs) {
+    return zorap_sim::control("zorap_sim_wait_alarms_idle", [&](Library& L) {
+        std::unique_lock<std::mutex> l(L.alarmMu);
+        bool idle = L.alarmIdleCv.wait_for(l, std::chrono::milliseconds(timeoutMs), [&] {
+            return L.alarmQueue.empty() && !L.inCallback;
+        });
+        return idle ? 0 : -1;
+    });
+}
+
+ZORAP_EXPORT unsigned long zorap_sim_alarms_delivered(void) {
+    Library& L = zorap_sim::lib();
+    std::lock_guard<std::mutex> l(L.alarmMu);
+    return L.alarmsDelivered;
+}
+
+ZORAP_EXPORT void zorap_sim_set_next_flash(uint32_t result, uint32_t durationMs) {
+    Library& L = zorap_sim::lib();
+    std::lock_guard<std::mutex> l(L.flashMu);
+    L.nextFlashSet = true;
+    L.nextFlashResult = result;
+    L.nextFlashDurationMs = durationMs;
+}
+
+ZORAP_EXPORT unsigned long zorap_sim_flash_writes_running(void) {
+    return zorap_sim::lib().flashRunning.load();
+}
+
+ZORAP_EXPORT int zorap_sim_fail(int function, uint32_t code, int times) {
+    if (function < 0 || function >= ZORAP_FN_COUNT) {
+        zorap_sim::complain("zorap_sim_fail: no such function " + std::to_string(function));
+        return -1;
+    }
+    Library& L = zorap_sim::lib();
+    std::lock_guard<std::mutex> l(L.faultMu);
+    L.faults[function] = (code == 0 || times == 0) ? zorap_sim::Fault{} : zorap_sim::Fault{code, times};
+    return 0;
+}
+
+ZORAP_EXPORT unsigned long zorap_sim_call_count(int function) {
+    if (function < 0 || function >= ZORAP_FN_COUNT) return 0;
+    return zorap_sim::lib().calls[function].load();
+}
+
+ZORAP_EXPORT unsigned long zorap_sim_outstanding_allocations(void) {
+    Library& L = zorap_sim::lib();
+    std::lock_guard<std::mutex> g(L.mu);
+    return static_cast<unsigned long>(L.allocations.size());
+}
+
+ZORAP_EXPORT void zorap_sim_reset(void) {
+    Library& L = zorap_sim::lib();
+    {
+        std::lock_guard<std::mutex> l(L.faultMu);
+        for (auto& f : L.faults) f = zorap_sim::Fault{};
+        for (auto& c : L.calls) c.store(0);
+    }
+    {
+        std::lock_guard<std::mutex> l(L.flashMu);
+        L.nextFlashSet = false;
+    }
+    {
+        std::lock_guard<std::mutex> l(L.alarmMu);
+        L.alarmQueue.clear();
+        L.alarmsDelivered = 0;
+    }
+    L.alarmIdleCv.notify_all();
+}
+
+// On unload (dlclose or process exit): end the alarm thread and the flash
+// waits, and release the trees, so nothing runs in unmapped code.
+__attribute__((destructor)) static void zorap_sim_unload() {
+    try {
+        Library& L = zorap_sim::lib();
+        L.stopAlarmThread();
+        L.abortFlashWrites();
+        std::lock_guard<std::mutex> g(L.mu);
+        L.releaseTrees();
+        L.initialized = false;
+        L.model = zorap_sim::Host{};
+        L.source = zorap_sim::Source{};
+        std::string().swap(L.modelPath);
+    } catch (...) {
+    }
+}
