@@ -1,0 +1,1964 @@
+// The broker side of CMPI: the encapsulated types (strings, datetimes,
+// object paths, arrays, instances, arguments, contexts, enumerations,
+// results, select expressions) and the four broker tables.
+//
+// Every function here is called from C code of a provider: none lets an
+// exception out; failures become CMPI status codes.
+#include <pthread.h>
+#include <strings.h>
+
+#include <algorithm>
+#include <cctype>
+#include <cerrno>
+#include <cstdlib>
+#include <cstring>
+#include <ctime>
+
+#include "cimhost/text.h"
+#include "internal.h"
+
+namespace cimhost {
+namespace detail {
+
+namespace {
+
+thread_local std::vector<unsigned long long> tlsArenas;
+std::atomic<unsigned long long> gNextArenaId{1};
+
+CMPIStatus mkStatus(CMPIrc rc) {
+    CMPIStatus s;
+    s.rc = rc;
+    s.msg = nullptr;
+    return s;
+}
+
+void setRc(CMPIStatus* rc, CMPIrc code) {
+    if (rc) {
+        rc->rc = code;
+        rc->msg = nullptr;
+    }
+}
+
+CMPIData nullData(CMPIValueState state = CMPI_nullValue) {
+    CMPIData d;
+    std::memset(&d, 0, sizeof d);
+    d.type = CMPI_null;
+    d.state = state;
+    return d;
+}
+
+void setFt(EncString* o) { o->enc.ft = &tables().stringFT; }
+void setFt(EncDateTime* o) { o->enc.ft = &tables().dateTimeFT; }
+void setFt(EncPath* o) { o->enc.ft = &tables().pathFT; }
+void setFt(EncArray* o) { o->enc.ft = &tables().arrayFT; }
+void setFt(EncInstance* o) { o->enc.ft = &tables().instanceFT; }
+void setFt(EncArgs* o) { o->enc.ft = &tables().argsFT; }
+void setFt(EncContext* o) { o->enc.ft = &tables().contextFT; }
+void setFt(EncEnum* o) { o->enc.ft = &tables().enumFT; }
+void setFt(EncResult* o) { o->enc.ft = &tables().resultFT; }
+void setFt(EncSelectExp* o) { o->enc.ft = &tables().selectFT; }
+
+template <class T>
+T* adoptNew(Host::Impl* core, Arena* arena) {
+    T* o = new T();
+    o->core = core;
+    o->enc.hdl = o;
+    setFt(o);
+    arena->adopt(o);
+    return o;
+}
+
+template <class T>
+T* make(Host::Impl* core) {
+    return adoptNew<T>(core, core->currentArena());
+}
+
+// Objects that outlive the request: clones and prepared contexts. They go
+// when the provider is unloaded.
+template <class T>
+T* makeLife(Host::Impl* core) {
+    std::lock_guard<std::mutex> g(core->arenaLock);
+    return adoptNew<T>(core, core->lifeArena.get());
+}
+
+void releaseObj(Obj* o) {
+    if (!o) return;
+    if (o->arena) o->arena->forget(o);
+    delete o;
+}
+
+// Handle checks: an object is ours when its table is ours.
+template <class Enc, class C>
+Enc* as(const C* c, const void* ft) {
+    if (!c || c->ft != ft || !c->hdl) return nullptr;
+    return static_cast<Enc*>(const_cast<void*>(static_cast<const void*>(c->hdl)));
+}
+
+EncString* asString(const CMPIString* s) { return as<EncString>(s, &tables().stringFT); }
+EncDateTime* asDateTime(const CMPIDateTime* d) { return as<EncDateTime>(d, &tables().dateTimeFT); }
+EncPath* asPath(const CMPIObjectPath* p) { return as<EncPath>(p, &tables().pathFT); }
+EncArray* asArray(const CMPIArray* a) { return as<EncArray>(a, &tables().arrayFT); }
+EncInstance* asInstance(const CMPIInstance* i) { return as<EncInstance>(i, &tables().instanceFT); }
+EncArgs* asArgs(const CMPIArgs* a) { return as<EncArgs>(a, &tables().argsFT); }
+EncContext* asContext(const CMPIContext* c) { return as<EncContext>(c, &tables().contextFT); }
+EncEnum* asEnum(const CMPIEnumeration* e) { return as<EncEnum>(e, &tables().enumFT); }
+EncResult* asResult(const CMPIResult* r) { return as<EncResult>(r, &tables().resultFT); }
+EncSelectExp* asSelect(const CMPISelectExp* s) { return as<EncSelectExp>(s, &tables().selectFT); }
+
+Host::Impl* coreOf(const CMPIBroker* mb) { return mb ? static_cast<Host::Impl*>(mb->hdl) : nullptr; }
+
+bool scalarType(CMPIType t, Type& out) {
+    switch (t) {
+        case CMPI_boolean: out = Type::Boolean; return true;
+        case CMPI_char16: out = Type::Char16; return true;
+        case CMPI_real32: out = Type::Real32; return true;
+        case CMPI_real64: out = Type::Real64; return true;
+        case CMPI_uint8: out = Type::UInt8; return true;
+        case CMPI_uint16: out = Type::UInt16; return true;
+        case CMPI_uint32: out = Type::UInt32; return true;
+        case CMPI_uint64: out = Type::UInt64; return true;
+        case CMPI_sint8: out = Type::SInt8; return true;
+        case CMPI_sint16: out = Type::SInt16; return true;
+        case CMPI_sint32: out = Type::SInt32; return true;
+        case CMPI_sint64: out = Type::SInt64; return true;
+        case CMPI_instance: out = Type::Instance; return true;
+        case CMPI_ref: out = Type::Reference; return true;
+        case CMPI_string:
+        case CMPI_chars:
+        case CMPI_charsptr: out = Type::String; return true;
+        case CMPI_dateTime: out = Type::DateTime; return true;
+        case CMPI_null: out = Type::Null; return true;
+        default: return false;
+    }
+}
+
+CMPIrc scalarToValue(const CMPIValue& v, CMPIType t, Value& out) {
+    switch (t) {
+        case CMPI_boolean: out = Value::fromBool(v.boolean != 0); return CMPI_RC_OK;
+        case CMPI_char16: out = Value::fromUnsigned(Type::Char16, v.char16); return CMPI_RC_OK;
+        case CMPI_uint8: out = Value::fromUnsigned(Type::UInt8, v.uint8); return CMPI_RC_OK;
+        case CMPI_uint16: out = Value::fromUnsigned(Type::UInt16, v.uint16); return CMPI_RC_OK;
+        case CMPI_uint32: out = Value::fromUnsigned(Type::UInt32, v.uint32); return CMPI_RC_OK;
+        case CMPI_uint64: out = Value::fromUnsigned(Type::UInt64, v.uint64); return CMPI_RC_OK;
+        case CMPI_sint8: out = Value::fromSigned(Type::SInt8, v.sint8); return CMPI_RC_OK;
+        case CMPI_sint16: out = Value::fromSigned(Type::SInt16, v.sint16); return CMPI_RC_OK;
+        case CMPI_sint32: out = Value::fromSigned(Type::SInt32, v.sint32); return CMPI_RC_OK;
+        case CMPI_sint64: out = Value::fromSigned(Type::SInt64, v.sint64); return CMPI_RC_OK;
+        case CMPI_real32: out = Value::fromReal(Type::Real32, v.real32); return CMPI_RC_OK;
+        case CMPI_real64: out = Value::fromReal(Type::Real64, v.real64); return CMPI_RC_OK;
+        case CMPI_string: {
+            EncString* s = asString(v.string);
+            if (!v.string) out = Value::nullOf(Type::String);
+            else if (!s) return CMPI_RC_ERR_INVALID_HANDLE;
+            else out = s->null ? Value::nullOf(Type::String) : Value::fromString(s->s);
+            return CMPI_RC_OK;
+        }
+        case CMPI_chars:
+            out = v.chars ? Value::fromString(v.chars) : Value::nullOf(Type::String);
+            return CMPI_RC_OK;
+        case CMPI_charsptr:
+            out = v.dataPtr.ptr ? Value::fromString(static_cast<const char*>(v.dataPtr.ptr))
+                                : Value::nullOf(Type::String);
+            return CMPI_RC_OK;
+        case CMPI_dateTime: {
+            if (!v.dateTime) {
+                out = Value::nullOf(Type::DateTime);
+                return CMPI_RC_OK;
+            }
+            EncDateTime* d = asDateTime(v.dateTime);
+            if (!d) return CMPI_RC_ERR_INVALID_HANDLE;
+            out = Value::fromDateTime(d->dt);
+            return CMPI_RC_OK;
+        }
+        case CMPI_ref: {
+            if (!v.ref) {
+                out = Value::nullOf(Type::Reference);
+                return CMPI_RC_OK;
+            }
+            EncPath* p = asPath(v.ref);
+            if (!p) return CMPI_RC_ERR_INVALID_HANDLE;
+            out = Value::fromRef(p->p);
+            return CMPI_RC_OK;
+        }
+        case CMPI_instance: {
+            if (!v.inst) {
+                out = Value::nullOf(Type::Instance);
+                return CMPI_RC_OK;
+            }
+            EncInstance* i = asInstance(v.inst);
+            if (!i) return CMPI_RC_ERR_INVALID_HANDLE;
+            out = Value::fromInstance(i->inst);
+            return CMPI_RC_OK;
+        }
+        default: return CMPI_RC_ERR_INVALID_DATA_TYPE;
+    }
+}
+
+// CMPIString** out-parameter helpers.
+void putName(Host::Impl* core, CMPIString** name, const std::string& s) {
+    if (name) *name = &newString(core, s)->enc;
+}
+
+}  // namespace
+
+// ---------------------------------------------------------------- arenas
+
+Arena::~Arena() {
+    for (Obj* o : objs) {
+        o->arena = nullptr;
+        delete o;
+    }
+}
+
+void Arena::adopt(Obj* o) {
+    std::lock_guard<std::mutex> g(m);
+    o->arena = this;
+    objs.insert(o);
+}
+
+void Arena::forget(Obj* o) {
+    std::lock_guard<std::mutex> g(m);
+    objs.erase(o);
+    o->arena = nullptr;
+}
+
+RequestScope::RequestScope(Host::Impl* core) : core_(core), id_(core->pushArena()) {}
+RequestScope::~RequestScope() { core_->popArena(id_); }
+
+bool EncInstance::wanted(const std::string& name) const {
+    if (!filtered) return true;
+    for (const auto& f : filter)
+        if (namesEqual(f, name)) return true;
+    for (const auto& k : filterKeys)
+        if (namesEqual(k, name)) return true;
+    return false;
+}
+
+// ---------------------------------------------------------------- conversions
+
+CMPIrc toValue(const CMPIValue* v, CMPIType type, Value& out) {
+    if (type & CMPI_ARRAY) {
+        Type et;
+        if (!scalarType(static_cast<CMPIType>(type & ~CMPI_ARRAY), et)) return CMPI_RC_ERR_INVALID_DATA_TYPE;
+        if (!v || !v->array) {
+            out = Value::nullOf(et, true);
+            return CMPI_RC_OK;
+        }
+        EncArray* a = asArray(v->array);
+        if (!a) return CMPI_RC_ERR_INVALID_HANDLE;
+        out = Value::arrayOf(a->elemType, a->elems);
+        return CMPI_RC_OK;
+    }
+    Type st;
+    if (!scalarType(type, st)) return CMPI_RC_ERR_INVALID_DATA_TYPE;
+    if (!v || type == CMPI_null) {
+        out = Value::nullOf(st);
+        return CMPI_RC_OK;
+    }
+    return scalarToValue(*v, type, out);
+}
+
+CMPIData toData(Host::Impl* core, const Value& v) {
+    CMPIData d = nullData(CMPI_goodValue);
+    d.type = v.typeCode();
+    if (v.null) {
+        d.state = CMPI_nullValue;
+        return d;
+    }
+    if (v.array) {
+        d.value.array = &newArray(core, v.type, v.elems)->enc;
+        return d;
+    }
+    switch (v.type) {
+        case Type::Boolean: d.value.boolean = v.b ? 1 : 0; break;
+        case Type::Char16: d.value.char16 = static_cast<CMPIChar16>(v.u); break;
+        case Type::UInt8: d.value.uint8 = static_cast<CMPIUint8>(v.u); break;
+        case Type::UInt16: d.value.uint16 = static_cast<CMPIUint16>(v.u); break;
+        case Type::UInt32: d.value.uint32 = static_cast<CMPIUint32>(v.u); break;
+        case Type::UInt64: d.value.uint64 = v.u; break;
+        case Type::SInt8: d.value.sint8 = static_cast<CMPISint8>(v.i); break;
+        case Type::SInt16: d.value.sint16 = static_cast<CMPISint16>(v.i); break;
+        case Type::SInt32: d.value.sint32 = static_cast<CMPISint32>(v.i); break;
+        case Type::SInt64: d.value.sint64 = v.i; break;
+        case Type::Real32: d.value.real32 = static_cast<CMPIReal32>(v.d); break;
+        case Type::Real64: d.value.real64 = v.d; break;
+        case Type::String: d.value.string = &newString(core, v.s)->enc; break;
+        case Type::DateTime: d.value.dateTime = &newDateTime(core, v.dt)->enc; break;
+        case Type::Reference: d.value.ref = &newPath(core, v.ref ? *v.ref : ObjectPath())->enc; break;
+        case Type::Instance: d.value.inst = &newInstance(core, v.inst ? *v.inst : Instance())->enc; break;
+        case Type::Null: d.state = CMPI_nullValue; break;
+    }
+    return d;
+}
+
+std::string stringOf(const CMPIString* s) {
+    EncString* e = asString(s);
+    return e ? e->s : std::string();
+}
+
+ObjectPath instancePath(const Host::Impl* core, const Instance& inst) {
+    ObjectPath p = inst.path;
+    for (const auto& k : core->repo.keyNames(inst.className())) {
+        if (const Value* v = inst.property(k)) {
+            if (!v->null) p.setKey(k, *v);
+        }
+    }
+    return p;
+}
+
+// ---------------------------------------------------------------- factories
+
+EncString* newString(Host::Impl* core, std::string s) {
+    auto* o = make<EncString>(core);
+    o->s = std::move(s);
+    return o;
+}
+
+EncPath* newPath(Host::Impl* core, ObjectPath p) {
+    auto* o = make<EncPath>(core);
+    o->p = std::move(p);
+    return o;
+}
+
+EncInstance* newInstance(Host::Impl* core, Instance i) {
+    auto* o = make<EncInstance>(core);
+    o->inst = std::move(i);
+    return o;
+}
+
+EncArgs* newArgs(Host::Impl* core, std::vector<NamedValue> a) {
+    auto* o = make<EncArgs>(core);
+    o->args = std::move(a);
+    return o;
+}
+
+EncContext* newContext(Host::Impl* core, const std::string& ns) {
+    auto* o = make<EncContext>(core);
+    o->entries.emplace_back(CMPIInitNameSpace, Value::fromString(ns));
+    o->entries.emplace_back(CMPIPrincipal, Value::fromString("cimhost"));
+    o->entries.emplace_back(CMPIInvocationFlags, Value::fromUnsigned(Type::UInt32, 0));
+    return o;
+}
+
+EncResult* newResult(Host::Impl* core, ResultKind kind, OpResult* sink) {
+    auto* o = make<EncResult>(core);
+    o->kind = kind;
+    o->sink = sink;
+    return o;
+}
+
+// "SELECT ... FROM Class [WHERE ...]": the class after FROM.
+bool queryClass(const std::string& q, std::string& cls) {
+    std::string up;
+    for (char c : q) up += static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
+    const size_t start = up.find_first_not_of(" \t\r\n");
+    if (start == std::string::npos || up.compare(start, 6, "SELECT") != 0) return false;
+    size_t pos = up.find("FROM", start + 6);
+    while (pos != std::string::npos &&
+           !(std::isspace(static_cast<unsigned char>(up[pos - 1])) && pos + 4 < up.size() &&
+             std::isspace(static_cast<unsigned char>(up[pos + 4]))))
+        pos = up.find("FROM", pos + 1);
+    if (pos == std::string::npos) return false;
+    pos += 4;
+    while (pos < q.size() && std::isspace(static_cast<unsigned char>(q[pos]))) ++pos;
+    const size_t s = pos;
+    while (pos < q.size() && (std::isalnum(static_cast<unsigned char>(q[pos])) || q[pos] == '_')) ++pos;
+    cls = q.substr(s, pos - s);
+    return !cls.empty();
+}
+
+EncSelectExp* newSelectExp(Host::Impl* core, const std::string& query, const std::string& lang) {
+    std::string cls;
+    if (!queryClass(query, cls)) return nullptr;
+    auto* o = make<EncSelectExp>(core);
+    o->query = query;
+    o->lang = lang;
+    o->fromClass = cls;
+    return o;
+}
+
+EncDateTime* newDateTime(Host::Impl* core, const DateTime& dt) {
+    auto* o = make<EncDateTime>(core);
+    o->dt = dt;
+    return o;
+}
+
+EncArray* newArray(Host::Impl* core, Type elemType, std::vector<Value> elems) {
+    auto* o = make<EncArray>(core);
+    o->elemType = elemType;
+    o->elems = std::move(elems);
+    return o;
+}
+
+namespace {
+
+// ---------------------------------------------------------------- CMPIString
+
+CMPIStatus strRelease(CMPIString* s) {
+    releaseObj(asString(s));
+    return mkStatus(CMPI_RC_OK);
+}
+
+CMPIString* strClone(const CMPIString* s, CMPIStatus* rc) {
+    try {
+        EncString* e = asString(s);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        auto* o = makeLife<EncString>(e->core);
+        o->s = e->s;
+        o->null = e->null;
+        setRc(rc, CMPI_RC_OK);
+        return &o->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+const char* strChars(const CMPIString* s, CMPIStatus* rc) {
+    EncString* e = asString(s);
+    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+    setRc(rc, CMPI_RC_OK);
+    return e->null ? nullptr : e->s.c_str();
+}
+
+// ---------------------------------------------------------------- CMPIDateTime
+
+CMPIStatus dtRelease(CMPIDateTime* d) {
+    releaseObj(asDateTime(d));
+    return mkStatus(CMPI_RC_OK);
+}
+
+CMPIDateTime* dtClone(const CMPIDateTime* d, CMPIStatus* rc) {
+    try {
+        EncDateTime* e = asDateTime(d);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        auto* o = makeLife<EncDateTime>(e->core);
+        o->dt = e->dt;
+        setRc(rc, CMPI_RC_OK);
+        return &o->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIUint64 dtBinary(const CMPIDateTime* d, CMPIStatus* rc) {
+    EncDateTime* e = asDateTime(d);
+    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
+    setRc(rc, CMPI_RC_OK);
+    return e->dt.usec;
+}
+
+CMPIString* dtText(const CMPIDateTime* d, CMPIStatus* rc) {
+    try {
+        EncDateTime* e = asDateTime(d);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &newString(e->core, e->dt.toText())->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIBoolean dtIsInterval(const CMPIDateTime* d, CMPIStatus* rc) {
+    EncDateTime* e = asDateTime(d);
+    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
+    setRc(rc, CMPI_RC_OK);
+    return e->dt.interval ? 1 : 0;
+}
+
+// ---------------------------------------------------------------- CMPIObjectPath
+
+CMPIStatus opRelease(CMPIObjectPath* op) {
+    releaseObj(asPath(op));
+    return mkStatus(CMPI_RC_OK);
+}
+
+CMPIObjectPath* opClone(const CMPIObjectPath* op, CMPIStatus* rc) {
+    try {
+        EncPath* e = asPath(op);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        auto* o = makeLife<EncPath>(e->core);
+        o->p = e->p;
+        setRc(rc, CMPI_RC_OK);
+        return &o->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+template <std::string ObjectPath::*Field>
+CMPIStatus opSetText(CMPIObjectPath* op, const char* text) {
+    try {
+        EncPath* e = asPath(op);
+        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        e->p.*Field = text ? text : "";
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+template <std::string ObjectPath::*Field>
+CMPIString* opGetText(const CMPIObjectPath* op, CMPIStatus* rc) {
+    try {
+        EncPath* e = asPath(op);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &newString(e->core, e->p.*Field)->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIStatus opAddKey(CMPIObjectPath* op, const char* name, const CMPIValue* value, CMPIType type) {
+    try {
+        EncPath* e = asPath(op);
+        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        if (!name || !*name) return mkStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+        Value v;
+        const CMPIrc r = toValue(value, type, v);
+        if (r != CMPI_RC_OK) return mkStatus(r);
+        e->p.setKey(name, std::move(v));
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIData opGetKey(const CMPIObjectPath* op, const char* name, CMPIStatus* rc) {
+    try {
+        EncPath* e = asPath(op);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+        const Value* v = name ? e->p.key(name) : nullptr;
+        if (!v) return setRc(rc, CMPI_RC_ERR_NOT_FOUND), nullData(CMPI_notFound);
+        CMPIData d = toData(e->core, *v);
+        d.state = static_cast<CMPIValueState>(d.state | CMPI_keyValue);
+        setRc(rc, CMPI_RC_OK);
+        return d;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullData();
+    }
+}
+
+CMPIData opGetKeyAt(const CMPIObjectPath* op, CMPICount index, CMPIString** name, CMPIStatus* rc) {
+    try {
+        EncPath* e = asPath(op);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+        if (index >= e->p.keys.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
+        putName(e->core, name, e->p.keys[index].first);
+        CMPIData d = toData(e->core, e->p.keys[index].second);
+        d.state = static_cast<CMPIValueState>(d.state | CMPI_keyValue);
+        setRc(rc, CMPI_RC_OK);
+        return d;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullData();
+    }
+}
+
+CMPICount opKeyCount(const CMPIObjectPath* op, CMPIStatus* rc) {
+    EncPath* e = asPath(op);
+    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
+    setRc(rc, CMPI_RC_OK);
+    return static_cast<CMPICount>(e->p.keys.size());
+}
+
+CMPIStatus opSetNsFrom(CMPIObjectPath* op, const CMPIObjectPath* src) {
+    try {
+        EncPath* e = asPath(op);
+        EncPath* s = asPath(src);
+        if (!e || !s) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        e->p.nameSpace = s->p.nameSpace;
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIStatus opSetHostNsFrom(CMPIObjectPath* op, const CMPIObjectPath* src) {
+    try {
+        EncPath* e = asPath(op);
+        EncPath* s = asPath(src);
+        if (!e || !s) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        e->p.nameSpace = s->p.nameSpace;
+        e->p.host = s->p.host;
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIData opClassQual(const CMPIObjectPath*, const char*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullData();
+}
+CMPIData opPropQual(const CMPIObjectPath*, const char*, const char*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullData();
+}
+CMPIData opMethQual(const CMPIObjectPath*, const char*, const char*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullData();
+}
+CMPIData opParamQual(const CMPIObjectPath*, const char*, const char*, const char*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullData();
+}
+
+CMPIString* opToString(const CMPIObjectPath* op, CMPIStatus* rc) {
+    try {
+        EncPath* e = asPath(op);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &newString(e->core, formatPath(e->p))->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+// ---------------------------------------------------------------- CMPIArray
+
+CMPIStatus arRelease(CMPIArray* a) {
+    releaseObj(asArray(a));
+    return mkStatus(CMPI_RC_OK);
+}
+
+CMPIArray* arClone(const CMPIArray* a, CMPIStatus* rc) {
+    try {
+        EncArray* e = asArray(a);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        auto* o = makeLife<EncArray>(e->core);
+        o->elemType = e->elemType;
+        o->elems = e->elems;
+        setRc(rc, CMPI_RC_OK);
+        return &o->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPICount arSize(const CMPIArray* a, CMPIStatus* rc) {
+    EncArray* e = asArray(a);
+    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
+    setRc(rc, CMPI_RC_OK);
+    return static_cast<CMPICount>(e->elems.size());
+}
+
+CMPIType arType(const CMPIArray* a, CMPIStatus* rc) {
+    EncArray* e = asArray(a);
+    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), CMPI_null;
+    setRc(rc, CMPI_RC_OK);
+    return static_cast<CMPIType>(e->elemType);
+}
+
+CMPIData arGet(const CMPIArray* a, CMPICount index, CMPIStatus* rc) {
+    try {
+        EncArray* e = asArray(a);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+        if (index >= e->elems.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_badValue);
+        setRc(rc, CMPI_RC_OK);
+        CMPIData d = toData(e->core, e->elems[index]);
+        d.type = static_cast<CMPIType>(e->elemType);
+        return d;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullData();
+    }
+}
+
+CMPIStatus arSet(CMPIArray* a, CMPICount index, const CMPIValue* value, CMPIType type) {
+    try {
+        EncArray* e = asArray(a);
+        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        if (index >= e->elems.size()) return mkStatus(CMPI_RC_ERR_NO_SUCH_PROPERTY);
+        if (type & CMPI_ARRAY) return mkStatus(CMPI_RC_ERR_TYPE_MISMATCH);
+        Value v;
+        const CMPIrc r = toValue(value, type, v);
+        if (r != CMPI_RC_OK) return mkStatus(r);
+        if (type != CMPI_null && v.type != e->elemType) return mkStatus(CMPI_RC_ERR_TYPE_MISMATCH);
+        v.type = e->elemType;
+        e->elems[index] = std::move(v);
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+// ---------------------------------------------------------------- CMPIInstance
+
+CMPIStatus inRelease(CMPIInstance* i) {
+    releaseObj(asInstance(i));
+    return mkStatus(CMPI_RC_OK);
+}
+
+CMPIInstance* inClone(const CMPIInstance* i, CMPIStatus* rc) {
+    try {
+        EncInstance* e = asInstance(i);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        auto* o = makeLife<EncInstance>(e->core);
+        o->inst = e->inst;
+        o->filtered = e->filtered;
+        o->filter = e->filter;
+        o->filterKeys = e->filterKeys;
+        setRc(rc, CMPI_RC_OK);
+        return &o->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIData inGet(const CMPIInstance* i, const char* name, CMPIStatus* rc) {
+    try {
+        EncInstance* e = asInstance(i);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+        const Value* v = name ? e->inst.property(name) : nullptr;
+        if (!v) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
+        setRc(rc, CMPI_RC_OK);
+        return toData(e->core, *v);
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullData();
+    }
+}
+
+CMPIData inGetAt(const CMPIInstance* i, CMPICount index, CMPIString** name, CMPIStatus* rc) {
+    try {
+        EncInstance* e = asInstance(i);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+        if (index >= e->inst.properties.size())
+            return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
+        putName(e->core, name, e->inst.properties[index].first);
+        setRc(rc, CMPI_RC_OK);
+        return toData(e->core, e->inst.properties[index].second);
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullData();
+    }
+}
+
+CMPICount inCount(const CMPIInstance* i, CMPIStatus* rc) {
+    EncInstance* e = asInstance(i);
+    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
+    setRc(rc, CMPI_RC_OK);
+    return static_cast<CMPICount>(e->inst.properties.size());
+}
+
+CMPIStatus inSet(const CMPIInstance* i, const char* name, const CMPIValue* value, CMPIType type) {
+    try {
+        EncInstance* e = asInstance(i);
+        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        if (!name || !*name) return mkStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+        Value v;
+        const CMPIrc r = toValue(value, type, v);
+        if (r != CMPI_RC_OK) return mkStatus(r);
+        if (!e->wanted(name)) return mkStatus(CMPI_RC_OK);   // filtered out
+        e->inst.setProperty(name, std::move(v));
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIStatus inSetWithOrigin(const CMPIInstance* i, const char* name, const CMPIValue* value, CMPIType type,
+                           const char*) {
+    return inSet(i, name, value, type);
+}
+
+CMPIObjectPath* inPath(const CMPIInstance* i, CMPIStatus* rc) {
+    try {
+        EncInstance* e = asInstance(i);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &newPath(e->core, instancePath(e->core, e->inst))->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+std::vector<std::string> nameList(const char** list) {
+    std::vector<std::string> out;
+    for (size_t k = 0; list && list[k]; ++k) out.emplace_back(list[k]);
+    return out;
+}
+
+CMPIStatus inSetFilter(CMPIInstance* i, const char** props, const char** keys) {
+    try {
+        EncInstance* e = asInstance(i);
+        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        if (!props) {
+            e->filtered = false;
+            e->filter.clear();
+            e->filterKeys.clear();
+            return mkStatus(CMPI_RC_OK);
+        }
+        e->filtered = true;
+        e->filter = nameList(props);
+        e->filterKeys = nameList(keys);
+        auto& ps = e->inst.properties;
+        ps.erase(std::remove_if(ps.begin(), ps.end(), [&](const NamedValue& p) { return !e->wanted(p.first); }),
+                 ps.end());
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIStatus inSetPath(CMPIInstance* i, const CMPIObjectPath* op) {
+    try {
+        EncInstance* e = asInstance(i);
+        EncPath* p = asPath(op);
+        if (!e || !p) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        e->inst.path = p->p;
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+// ---------------------------------------------------------------- CMPIArgs and CMPIContext
+
+// Both hold a list of named values; one set of functions serves both.
+template <class Enc, class C>
+struct NamedList {
+    static std::vector<NamedValue>* list(Enc* e);
+};
+template <>
+std::vector<NamedValue>* NamedList<EncArgs, CMPIArgs>::list(EncArgs* e) { return &e->args; }
+template <>
+std::vector<NamedValue>* NamedList<EncContext, CMPIContext>::list(EncContext* e) { return &e->entries; }
+
+template <class Enc, class C>
+Enc* asNamed(const C* c);
+template <>
+EncArgs* asNamed<EncArgs, CMPIArgs>(const CMPIArgs* c) { return asArgs(c); }
+template <>
+EncContext* asNamed<EncContext, CMPIContext>(const CMPIContext* c) { return asContext(c); }
+
+template <class Enc, class C>
+CMPIStatus nlRelease(C* c) {
+    releaseObj(asNamed<Enc, C>(c));
+    return mkStatus(CMPI_RC_OK);
+}
+
+template <class Enc, class C>
+C* nlClone(const C* c, CMPIStatus* rc) {
+    try {
+        Enc* e = asNamed<Enc, C>(c);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        auto* o = makeLife<Enc>(e->core);
+        *NamedList<Enc, C>::list(o) = *NamedList<Enc, C>::list(e);
+        setRc(rc, CMPI_RC_OK);
+        return &o->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+template <class Enc, class C>
+CMPIStatus nlAdd(const C* c, const char* name, const CMPIValue* value, CMPIType type) {
+    try {
+        Enc* e = asNamed<Enc, C>(c);
+        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        if (!name || !*name) return mkStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+        Value v;
+        const CMPIrc r = toValue(value, type, v);
+        if (r != CMPI_RC_OK) return mkStatus(r);
+        auto& l = *NamedList<Enc, C>::list(e);
+        for (auto& nv : l) {
+            if (namesEqual(nv.first, name)) {
+                nv.second = std::move(v);
+                return mkStatus(CMPI_RC_OK);
+            }
+        }
+        l.emplace_back(name, std::move(v));
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+template <class Enc, class C>
+CMPIData nlGet(const C* c, const char* name, CMPIStatus* rc) {
+    try {
+        Enc* e = asNamed<Enc, C>(c);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+        for (const auto& nv : *NamedList<Enc, C>::list(e)) {
+            if (name && namesEqual(nv.first, name)) {
+                setRc(rc, CMPI_RC_OK);
+                return toData(e->core, nv.second);
+            }
+        }
+        setRc(rc, CMPI_RC_ERR_NOT_FOUND);
+        return nullData(CMPI_notFound);
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullData();
+    }
+}
+
+template <class Enc, class C>
+CMPIData nlGetAt(const C* c, CMPICount index, CMPIString** name, CMPIStatus* rc) {
+    try {
+        Enc* e = asNamed<Enc, C>(c);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+        const auto& l = *NamedList<Enc, C>::list(e);
+        if (index >= l.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
+        putName(e->core, name, l[index].first);
+        setRc(rc, CMPI_RC_OK);
+        return toData(e->core, l[index].second);
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullData();
+    }
+}
+
+template <class Enc, class C>
+CMPICount nlCount(const C* c, CMPIStatus* rc) {
+    Enc* e = asNamed<Enc, C>(c);
+    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
+    setRc(rc, CMPI_RC_OK);
+    return static_cast<CMPICount>(NamedList<Enc, C>::list(e)->size());
+}
+
+// ---------------------------------------------------------------- CMPIEnumeration
+
+CMPIStatus enRelease(CMPIEnumeration* en) {
+    releaseObj(asEnum(en));
+    return mkStatus(CMPI_RC_OK);
+}
+
+CMPIEnumeration* enClone(const CMPIEnumeration* en, CMPIStatus* rc) {
+    try {
+        EncEnum* e = asEnum(en);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        auto* o = makeLife<EncEnum>(e->core);
+        o->items = e->items;
+        o->next = e->next;
+        setRc(rc, CMPI_RC_OK);
+        return &o->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIData enNext(const CMPIEnumeration* en, CMPIStatus* rc) {
+    try {
+        EncEnum* e = asEnum(en);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+        if (e->next >= e->items.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
+        setRc(rc, CMPI_RC_OK);
+        return toData(e->core, e->items[e->next++]);
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullData();
+    }
+}
+
+CMPIBoolean enHasNext(const CMPIEnumeration* en, CMPIStatus* rc) {
+    EncEnum* e = asEnum(en);
+    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
+    setRc(rc, CMPI_RC_OK);
+    return e->next < e->items.size() ? 1 : 0;
+}
+
+CMPIArray* enToArray(const CMPIEnumeration* en, CMPIStatus* rc) {
+    try {
+        EncEnum* e = asEnum(en);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        const Type t = e->items.empty() ? Type::Null : e->items.front().type;
+        setRc(rc, CMPI_RC_OK);
+        return &newArray(e->core, t, e->items)->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+// ---------------------------------------------------------------- CMPIResult
+
+CMPIStatus rsRelease(CMPIResult* r) {
+    releaseObj(asResult(r));
+    return mkStatus(CMPI_RC_OK);
+}
+
+CMPIResult* rsClone(const CMPIResult*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+void noteStrict(EncResult* e, const std::string& what) {
+    if (e->core->strict) e->sink->strictErrors.push_back(what);
+}
+
+CMPIStatus rsData(const CMPIResult* r, const CMPIValue* value, CMPIType type) {
+    try {
+        EncResult* e = asResult(r);
+        if (!e || !e->sink) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        Value v;
+        const CMPIrc rc = toValue(value, type, v);
+        if (rc != CMPI_RC_OK) return mkStatus(rc);
+        std::lock_guard<std::mutex> g(e->m);
+        if (e->kind == ResultKind::Instances && v.type == Type::Instance && !v.array && v.inst) {
+            e->sink->instances.push_back(*v.inst);   // returnData of an instance
+        } else if (e->kind == ResultKind::Paths && v.type == Type::Reference && !v.array && v.ref) {
+            e->sink->paths.push_back(*v.ref);
+        } else {
+            if (e->kind != ResultKind::Method && e->kind != ResultKind::Data)
+                noteStrict(e, std::string("returnData of a ") + typeName(v.type) + " in an operation that returns " +
+                                  (e->kind == ResultKind::Paths ? "object paths" : "instances"));
+            e->sink->data.push_back(std::move(v));
+        }
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIStatus rsInstance(const CMPIResult* r, const CMPIInstance* inst) {
+    try {
+        EncResult* e = asResult(r);
+        EncInstance* i = asInstance(inst);
+        if (!e || !e->sink || !i) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        Instance copy = i->inst;
+        copy.path = instancePath(e->core, i->inst);
+        std::lock_guard<std::mutex> g(e->m);
+        if (e->kind != ResultKind::Instances) noteStrict(e, "returnInstance in an operation that returns no instances");
+        if (e->core->strict) {
+            const std::string err = checkInstance(e->core->repo, copy);
+            if (!err.empty()) e->sink->strictErrors.push_back(err);
+        }
+        e->sink->instances.push_back(std::move(copy));
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIStatus rsPath(const CMPIResult* r, const CMPIObjectPath* op) {
+    try {
+        EncResult* e = asResult(r);
+        EncPath* p = asPath(op);
+        if (!e || !e->sink || !p) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        std::lock_guard<std::mutex> g(e->m);
+        if (e->kind != ResultKind::Paths && e->kind != ResultKind::Data)
+            noteStrict(e, "returnObjectPath in an operation that returns no object paths");
+        if (e->core->strict) {
+            const std::string err = checkPath(e->core->repo, p->p);
+            if (!err.empty()) e->sink->strictErrors.push_back(err);
+        }
+        e->sink->paths.push_back(p->p);
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIStatus rsDone(const CMPIResult* r) {
+    EncResult* e = asResult(r);
+    if (!e || !e->sink) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    std::lock_guard<std::mutex> g(e->m);
+    e->sink->done = true;
+    return mkStatus(CMPI_RC_OK);
+}
+
+CMPIStatus rsError(const CMPIResult*, const CMPIError*) { return mkStatus(CMPI_RC_ERR_NOT_SUPPORTED); }
+
+// ---------------------------------------------------------------- CMPISelectExp
+
+CMPIStatus seRelease(CMPISelectExp* s) {
+    releaseObj(asSelect(s));
+    return mkStatus(CMPI_RC_OK);
+}
+
+CMPISelectExp* seClone(const CMPISelectExp* s, CMPIStatus* rc) {
+    try {
+        EncSelectExp* e = asSelect(s);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        auto* o = makeLife<EncSelectExp>(e->core);
+        o->query = e->query;
+        o->lang = e->lang;
+        o->fromClass = e->fromClass;
+        setRc(rc, CMPI_RC_OK);
+        return &o->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+// Matches by class only: the WHERE clause is not evaluated.
+CMPIBoolean seEvaluate(const CMPISelectExp* s, const CMPIInstance* inst, CMPIStatus* rc) {
+    EncSelectExp* e = asSelect(s);
+    EncInstance* i = asInstance(inst);
+    if (!e || !i) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
+    setRc(rc, CMPI_RC_OK);
+    return e->core->repo.isA(i->inst.className(), e->fromClass) ? 1 : 0;
+}
+
+CMPIString* seString(const CMPISelectExp* s, CMPIStatus* rc) {
+    try {
+        EncSelectExp* e = asSelect(s);
+        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &newString(e->core, e->query)->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPISelectCond* seCond(const CMPISelectExp*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+CMPIBoolean seEvalAccessor(const CMPISelectExp*, CMPIAccessor*, void*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return 0;
+}
+
+// ---------------------------------------------------------------- CMPIBrokerFT
+
+CMPIContext* bPrepareAttach(const CMPIBroker* mb, const CMPIContext* ctx) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        EncContext* e = asContext(ctx);
+        if (!core) return nullptr;
+        auto* o = makeLife<EncContext>(core);
+        if (e) o->entries = e->entries;
+        return &o->enc;
+    } catch (...) {
+        return nullptr;
+    }
+}
+
+CMPIStatus bAttach(const CMPIBroker* mb, const CMPIContext* ctx) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core || !asContext(ctx)) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        core->pushArena();
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIStatus bDetach(const CMPIBroker* mb, const CMPIContext* ctx) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core || !asContext(ctx)) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        // The newest arena of this host on this thread is the attached one.
+        unsigned long long id = 0;
+        {
+            std::lock_guard<std::mutex> g(core->arenaLock);
+            for (auto it = tlsArenas.rbegin(); it != tlsArenas.rend(); ++it) {
+                if (core->arenas.count(*it)) {
+                    id = *it;
+                    break;
+                }
+            }
+        }
+        if (id == 0) return mkStatus(CMPI_RC_ERR_FAILED);
+        core->popArena(id);
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIStatus bDeliver(const CMPIBroker* mb, const CMPIContext*, const char* ns, const CMPIInstance* ind) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        EncInstance* i = asInstance(ind);
+        if (!core || !i) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        core->deliver(ns ? ns : "", i->inst);
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+// Up-calls to other providers: the host serves one provider only.
+CMPIEnumeration* bEnumNames(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+CMPIInstance* bGetInstance(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char**,
+                           CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+CMPIObjectPath* bCreate(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const CMPIInstance*,
+                        CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+CMPIStatus bModify(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const CMPIInstance*,
+                   const char**) {
+    return mkStatus(CMPI_RC_ERR_NOT_SUPPORTED);
+}
+CMPIStatus bDelete(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*) {
+    return mkStatus(CMPI_RC_ERR_NOT_SUPPORTED);
+}
+CMPIEnumeration* bExecQuery(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*,
+                            const char*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+CMPIEnumeration* bEnum(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char**,
+                       CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+CMPIEnumeration* bAssoc(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*, const char*,
+                        const char*, const char*, const char**, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+CMPIEnumeration* bAssocNames(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*,
+                             const char*, const char*, const char*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+CMPIEnumeration* bRefs(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*, const char*,
+                       const char**, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+CMPIEnumeration* bRefNames(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*,
+                           const char*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+CMPIData bInvoke(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*, const CMPIArgs*,
+                 CMPIArgs*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullData();
+}
+CMPIStatus bSetProp(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*, const CMPIValue*,
+                    CMPIType) {
+    return mkStatus(CMPI_RC_ERR_NOT_SUPPORTED);
+}
+CMPIData bGetProp(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullData();
+}
+
+// ---------------------------------------------------------------- CMPIBrokerEncFT
+
+CMPIInstance* eNewInstance(const CMPIBroker* mb, const CMPIObjectPath* op, CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        EncPath* p = asPath(op);
+        if (!core || !p) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        Instance inst;
+        inst.path = p->p;
+        // sfcb makes the keys of the path properties of the new instance.
+        if (core->flavour == Flavour::Sfcb)
+            for (const auto& k : p->p.keys) inst.setProperty(k.first, k.second);
+        setRc(rc, CMPI_RC_OK);
+        return &newInstance(core, std::move(inst))->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIObjectPath* eNewPath(const CMPIBroker* mb, const char* ns, const char* cn, CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        ObjectPath p;
+        p.nameSpace = ns ? ns : "";
+        p.className = cn ? cn : "";
+        setRc(rc, CMPI_RC_OK);
+        return &newPath(core, std::move(p))->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIArgs* eNewArgs(const CMPIBroker* mb, CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &newArgs(core, {})->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIString* eNewString(const CMPIBroker* mb, const char* data, CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        EncString* s = newString(core, data ? data : "");
+        s->null = data == nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &s->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIArray* eNewArray(const CMPIBroker* mb, CMPICount max, CMPIType type, CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        Type et;
+        if (!scalarType(static_cast<CMPIType>(type & ~CMPI_ARRAY), et) || et == Type::Null)
+            return setRc(rc, CMPI_RC_ERR_INVALID_DATA_TYPE), nullptr;
+        if (max > (1u << 24)) return setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &newArray(core, et, std::vector<Value>(max, Value::nullOf(et)))->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIDateTime* eNewDateTime(const CMPIBroker* mb, CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &newDateTime(core, DateTime::now())->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIDateTime* eNewDateTimeBin(const CMPIBroker* mb, CMPIUint64 bin, CMPIBoolean interval, CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        DateTime dt;
+        dt.usec = bin;
+        dt.interval = interval != 0;
+        setRc(rc, CMPI_RC_OK);
+        return &newDateTime(core, dt)->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIDateTime* eNewDateTimeChars(const CMPIBroker* mb, const char* text, CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        auto dt = text ? DateTime::fromText(text) : std::nullopt;
+        if (!dt) return setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &newDateTime(core, *dt)->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPISelectExp* eNewSelectExp(const CMPIBroker* mb, const char* query, const char* lang, CMPIArray** projection,
+                             CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (projection) *projection = nullptr;
+        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        if (!lang || (strcasecmp(lang, "WQL") != 0 && strcasecmp(lang, "CQL") != 0 &&
+                      strcasecmp(lang, "DMTF:CQL") != 0))
+            return setRc(rc, CMPI_RC_ERR_QUERY_LANGUAGE_NOT_SUPPORTED), nullptr;
+        EncSelectExp* s = newSelectExp(core, query ? query : "", lang);
+        if (!s) return setRc(rc, CMPI_RC_ERR_INVALID_QUERY), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &s->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIBoolean eClassPathIsA(const CMPIBroker* mb, const CMPIObjectPath* op, const char* type, CMPIStatus* rc) {
+    Host::Impl* core = coreOf(mb);
+    EncPath* p = asPath(op);
+    if (!core || !p) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
+    if (!type) return setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER), 0;
+    setRc(rc, CMPI_RC_OK);
+    return core->repo.isA(p->p.className, type) ? 1 : 0;
+}
+
+// Which encapsulated type an object is, by its function table.
+const char* typeOfObject(const void* object) {
+    struct Head {
+        void* hdl;
+        const void* ft;
+    };
+    if (!object) return nullptr;
+    const void* ft = static_cast<const Head*>(object)->ft;
+    const Tables& t = tables();
+    if (ft == &t.instanceFT) return "CMPIInstance";
+    if (ft == &t.pathFT) return "CMPIObjectPath";
+    if (ft == &t.stringFT) return "CMPIString";
+    if (ft == &t.dateTimeFT) return "CMPIDateTime";
+    if (ft == &t.arrayFT) return "CMPIArray";
+    if (ft == &t.argsFT) return "CMPIArgs";
+    if (ft == &t.contextFT) return "CMPIContext";
+    if (ft == &t.enumFT) return "CMPIEnumeration";
+    if (ft == &t.resultFT) return "CMPIResult";
+    if (ft == &t.selectFT) return "CMPISelectExp";
+    return nullptr;
+}
+
+CMPIString* eToString(const CMPIBroker* mb, const void* object, CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        const char* t = typeOfObject(object);
+        if (!core || !t) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        std::string text;
+        const std::string type = t;
+        if (type == "CMPIInstance") text = formatInstanceMof(asInstance(static_cast<const CMPIInstance*>(object))->inst);
+        else if (type == "CMPIObjectPath") text = formatPath(asPath(static_cast<const CMPIObjectPath*>(object))->p);
+        else if (type == "CMPIString") text = asString(static_cast<const CMPIString*>(object))->s;
+        else if (type == "CMPIDateTime") text = asDateTime(static_cast<const CMPIDateTime*>(object))->dt.toText();
+        else text = type;
+        setRc(rc, CMPI_RC_OK);
+        return &newString(core, text)->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIBoolean eIsOfType(const CMPIBroker*, const void* object, const char* type, CMPIStatus* rc) {
+    const char* t = typeOfObject(object);
+    if (!t) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
+    setRc(rc, CMPI_RC_OK);
+    return type && std::strcmp(t, type) == 0 ? 1 : 0;
+}
+
+CMPIString* eGetType(const CMPIBroker* mb, const void* object, CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        const char* t = typeOfObject(object);
+        if (!core || !t) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &newString(core, t)->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+// Message lookup: there are no message files, so the default text is
+// returned as it stands (insert arguments are not read).
+CMPIString* eGetMessage(const CMPIBroker* mb, const char*, const char* defMsg, CMPIStatus* rc, CMPICount, ...) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        setRc(rc, CMPI_RC_OK);
+        return &newString(core, defMsg ? defMsg : "")->enc;
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIStatus eLog(const CMPIBroker* mb, int severity, const char* id, const char* text, const CMPIString* string) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        std::string line = "log[" + std::to_string(severity) + "] " + (id ? id : "") + ": ";
+        line += text ? text : stringOf(string);
+        core->log(line);
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIStatus eTrace(const CMPIBroker* mb, int level, const char* component, const char* text,
+                  const CMPIString* string) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        std::string line = "trace[" + std::to_string(level) + "] " + (component ? component : "") + ": ";
+        line += text ? text : stringOf(string);
+        core->log(line);
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+CMPIError* eNewError(const CMPIBroker*, const char*, const char*, const char*, const CMPIErrorSeverity,
+                     const CMPIErrorProbableCause, const CMPIrc, CMPIStatus* rc) {
+    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+CMPIStatus eOpenMsgFile(const CMPIBroker*, const char*, CMPIMsgFileHandle* handle) {
+    if (handle) *handle = nullptr;
+    return mkStatus(CMPI_RC_OK);
+}
+
+CMPIStatus eCloseMsgFile(const CMPIBroker*, const CMPIMsgFileHandle) { return mkStatus(CMPI_RC_OK); }
+
+CMPIString* eGetMessage2(const CMPIBroker* mb, const char*, const CMPIMsgFileHandle, const char* defMsg,
+                         CMPIStatus* rc, CMPICount, ...) {
+    return eGetMessage(mb, nullptr, defMsg, rc, 0);
+}
+
+// ---------------------------------------------------------------- CMPIBrokerExtFT
+
+char* xResolveFileName(const char* filename) {
+    if (!filename) return nullptr;
+    const std::string name = std::string("lib") + filename + ".so";
+    return strdup(name.c_str());
+}
+
+CMPI_THREAD_TYPE xNewThread(CMPI_THREAD_RETURN(CMPI_THREAD_CDECL* start)(void*), void* parm, int detached) {
+    pthread_t t;
+    pthread_attr_t attr;
+    pthread_attr_init(&attr);
+    if (detached) pthread_attr_setdetachstate(&attr, PTHREAD_CREATE_DETACHED);
+    const int rc = pthread_create(&t, &attr, start, parm);
+    pthread_attr_destroy(&attr);
+    if (rc != 0) return nullptr;
+    static_assert(sizeof(pthread_t) <= sizeof(void*), "pthread_t fits a pointer");
+    return reinterpret_cast<CMPI_THREAD_TYPE>(t);
+}
+
+int xJoinThread(CMPI_THREAD_TYPE thread, CMPI_THREAD_RETURN* retval) {
+    return pthread_join(reinterpret_cast<pthread_t>(thread), retval);
+}
+
+int xExitThread(CMPI_THREAD_RETURN rc) { pthread_exit(rc); }
+
+int xCancelThread(CMPI_THREAD_TYPE thread) { return pthread_cancel(reinterpret_cast<pthread_t>(thread)); }
+
+int xSleep(CMPIUint32 msec) {
+    timespec ts;
+    ts.tv_sec = msec / 1000;
+    ts.tv_nsec = static_cast<long>(msec % 1000) * 1000000L;
+    while (nanosleep(&ts, &ts) != 0 && errno == EINTR) {
+    }
+    return 0;
+}
+
+std::mutex gOnceLock;
+
+int xOnce(int* once, void (*init)(void)) {
+    if (!once || !init) return EINVAL;
+    std::lock_guard<std::mutex> g(gOnceLock);
+    if (*once == 0) {
+        *once = 1;
+        init();
+    }
+    return 0;
+}
+
+int xCreateKey(CMPI_THREAD_KEY_TYPE* key, void (*cleanup)(void*)) {
+    if (!key) return EINVAL;
+    pthread_key_t k;
+    const int rc = pthread_key_create(&k, cleanup);
+    if (rc == 0) *key = static_cast<CMPI_THREAD_KEY_TYPE>(k);
+    return rc;
+}
+
+int xDestroyKey(CMPI_THREAD_KEY_TYPE key) { return pthread_key_delete(static_cast<pthread_key_t>(key)); }
+void* xGetSpecific(CMPI_THREAD_KEY_TYPE key) { return pthread_getspecific(static_cast<pthread_key_t>(key)); }
+int xSetSpecific(CMPI_THREAD_KEY_TYPE key, void* value) {
+    return pthread_setspecific(static_cast<pthread_key_t>(key), value);
+}
+
+CMPI_MUTEX_TYPE xNewMutex(int) {
+    auto* m = new (std::nothrow) pthread_mutex_t;
+    if (m) pthread_mutex_init(m, nullptr);
+    return m;
+}
+void xDestroyMutex(CMPI_MUTEX_TYPE m) {
+    if (!m) return;
+    pthread_mutex_destroy(static_cast<pthread_mutex_t*>(m));
+    delete static_cast<pthread_mutex_t*>(m);
+}
+void xLock(CMPI_MUTEX_TYPE m) {
+    if (m) pthread_mutex_lock(static_cast<pthread_mutex_t*>(m));
+}
+void xUnlock(CMPI_MUTEX_TYPE m) {
+    if (m) pthread_mutex_unlock(static_cast<pthread_mutex_t*>(m));
+}
+CMPI_COND_TYPE xNewCond(int) {
+    auto* c = new (std::nothrow) pthread_cond_t;
+    if (c) pthread_cond_init(c, nullptr);
+    return c;
+}
+void xDestroyCond(CMPI_COND_TYPE c) {
+    if (!c) return;
+    pthread_cond_destroy(static_cast<pthread_cond_t*>(c));
+    delete static_cast<pthread_cond_t*>(c);
+}
+int xCondWait(CMPI_COND_TYPE c, CMPI_MUTEX_TYPE m) {
+    if (!c || !m) return EINVAL;
+    return pthread_cond_wait(static_cast<pthread_cond_t*>(c), static_cast<pthread_mutex_t*>(m));
+}
+int xTimedCondWait(CMPI_COND_TYPE c, CMPI_MUTEX_TYPE m, struct timespec* wait) {
+    if (!c || !m || !wait) return EINVAL;
+    return pthread_cond_timedwait(static_cast<pthread_cond_t*>(c), static_cast<pthread_mutex_t*>(m), wait);
+}
+int xSignalCond(CMPI_COND_TYPE c) {
+    if (!c) return EINVAL;
+    return pthread_cond_signal(static_cast<pthread_cond_t*>(c));
+}
+
+// ---------------------------------------------------------------- CMPIBrokerMemFT
+
+CMPIGcStat* mMark(const CMPIBroker* mb, CMPIStatus* rc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+        const unsigned long long id = core->pushArena();
+        setRc(rc, CMPI_RC_OK);
+        return reinterpret_cast<CMPIGcStat*>(static_cast<uintptr_t>(id));
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+}
+
+CMPIStatus mRelease(const CMPIBroker* mb, const CMPIGcStat* gc) {
+    try {
+        Host::Impl* core = coreOf(mb);
+        if (!core || !gc) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        const auto id = static_cast<unsigned long long>(reinterpret_cast<uintptr_t>(gc));
+        {
+            std::lock_guard<std::mutex> g(core->arenaLock);
+            if (!core->arenas.count(id)) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        }
+        core->popArena(id);
+        return mkStatus(CMPI_RC_OK);
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+void* track(Host::Impl* core, void* p) {
+    if (!core || !p) return p;
+    try {
+        std::lock_guard<std::mutex> g(core->mallocLock);
+        core->mallocs.insert(p);
+    } catch (...) {
+        std::free(p);
+        return nullptr;
+    }
+    return p;
+}
+
+void* mMalloc(const CMPIBroker* mb, size_t size) { return track(coreOf(mb), std::malloc(size)); }
+void* mCalloc(const CMPIBroker* mb, size_t n, size_t size) { return track(coreOf(mb), std::calloc(n, size)); }
+
+void* mRealloc(const CMPIBroker* mb, void* ptr, size_t size) {
+    Host::Impl* core = coreOf(mb);
+    if (!core) return nullptr;
+    if (!ptr) return mMalloc(mb, size);
+    std::lock_guard<std::mutex> g(core->mallocLock);
+    auto it = core->mallocs.find(ptr);
+    if (it == core->mallocs.end()) return nullptr;   // not from cmpiMalloc
+    void* np = std::realloc(ptr, size);
+    if (!np) return nullptr;
+    core->mallocs.erase(it);
+    try {
+        core->mallocs.insert(np);
+    } catch (...) {
+    }
+    return np;
+}
+
+char* mStrDup(const CMPIBroker* mb, const char* s) {
+    if (!s) return nullptr;
+    return static_cast<char*>(track(coreOf(mb), strdup(s)));
+}
+
+void mFree(const CMPIBroker* mb, void* ptr) {
+    Host::Impl* core = coreOf(mb);
+    if (!core || !ptr) return;
+    std::lock_guard<std::mutex> g(core->mallocLock);
+    auto it = core->mallocs.find(ptr);
+    if (it == core->mallocs.end()) return;   // not ours: leave it alone
+    core->mallocs.erase(it);
+    std::free(ptr);
+}
+
+void mFreeInstance(const CMPIBroker*, CMPIInstance* i) { releaseObj(asInstance(i)); }
+void mFreePath(const CMPIBroker*, CMPIObjectPath* p) { releaseObj(asPath(p)); }
+void mFreeArgs(const CMPIBroker*, CMPIArgs* a) { releaseObj(asArgs(a)); }
+void mFreeString(const CMPIBroker*, CMPIString* s) { releaseObj(asString(s)); }
+void mFreeArray(const CMPIBroker*, CMPIArray* a) { releaseObj(asArray(a)); }
+void mFreeDateTime(const CMPIBroker*, CMPIDateTime* d) { releaseObj(asDateTime(d)); }
+void mFreeSelectExp(const CMPIBroker*, CMPISelectExp* s) { releaseObj(asSelect(s)); }
+
+Tables buildTables() {
+    Tables t;
+    std::memset(&t, 0, sizeof t);
+
+    t.bft.brokerCapabilities = CMPI_MB_Class_0 | CMPI_MB_Supports_IndicationMI;
+    t.bft.brokerVersion = 200;
+    t.bft.brokerName = "cimhost";
+    t.bft.prepareAttachThread = bPrepareAttach;
+    t.bft.attachThread = bAttach;
+    t.bft.detachThread = bDetach;
+    t.bft.deliverIndication = bDeliver;
+    t.bft.enumerateInstanceNames = bEnumNames;
+    t.bft.getInstance = bGetInstance;
+    t.bft.createInstance = bCreate;
+    t.bft.modifyInstance = bModify;
+    t.bft.deleteInstance = bDelete;
+    t.bft.execQuery = bExecQuery;
+    t.bft.enumerateInstances = bEnum;
+    t.bft.associators = bAssoc;
+    t.bft.associatorNames = bAssocNames;
+    t.bft.references = bRefs;
+    t.bft.referenceNames = bRefNames;
+    t.bft.invokeMethod = bInvoke;
+    t.bft.setProperty = bSetProp;
+    t.bft.getProperty = bGetProp;
+
+    t.eft.ftVersion = 200;
+    t.eft.newInstance = eNewInstance;
+    t.eft.newObjectPath = eNewPath;
+    t.eft.newArgs = eNewArgs;
+    t.eft.newString = eNewString;
+    t.eft.newArray = eNewArray;
+    t.eft.newDateTime = eNewDateTime;
+    t.eft.newDateTimeFromBinary = eNewDateTimeBin;
+    t.eft.newDateTimeFromChars = eNewDateTimeChars;
+    t.eft.newSelectExp = eNewSelectExp;
+    t.eft.classPathIsA = eClassPathIsA;
+    t.eft.toString = eToString;
+    t.eft.isOfType = eIsOfType;
+    t.eft.getType = eGetType;
+    t.eft.getMessage = eGetMessage;
+    t.eft.logMessage = eLog;
+    t.eft.trace = eTrace;
+    t.eft.newCMPIError = eNewError;
+    t.eft.openMessageFile = eOpenMsgFile;
+    t.eft.closeMessageFile = eCloseMsgFile;
+    t.eft.getMessage2 = eGetMessage2;
+
+    t.xft.ftVersion = 200;
+    t.xft.resolveFileName = xResolveFileName;
+    t.xft.newThread = xNewThread;
+    t.xft.joinThread = xJoinThread;
+    t.xft.exitThread = xExitThread;
+    t.xft.cancelThread = xCancelThread;
+    t.xft.threadSleep = xSleep;
+    t.xft.threadOnce = xOnce;
+    t.xft.createThreadKey = xCreateKey;
+    t.xft.destroyThreadKey = xDestroyKey;
+    t.xft.getThreadSpecific = xGetSpecific;
+    t.xft.setThreadSpecific = xSetSpecific;
+    t.xft.newMutex = xNewMutex;
+    t.xft.destroyMutex = xDestroyMutex;
+    t.xft.lockMutex = xLock;
+    t.xft.unlockMutex = xUnlock;
+    t.xft.newCondition = xNewCond;
+    t.xft.destroyCondition = xDestroyCond;
+    t.xft.condWait = xCondWait;
+    t.xft.timedCondWait = xTimedCondWait;
+    t.xft.signalCondition = xSignalCond;
+
+    t.mft.ftVersion = 200;
+    t.mft.mark = mMark;
+    t.mft.release = mRelease;
+    t.mft.cmpiMalloc = mMalloc;
+    t.mft.cmpiCalloc = mCalloc;
+    t.mft.cmpiRealloc = mRealloc;
+    t.mft.cmpiStrDup = mStrDup;
+    t.mft.cmpiFree = mFree;
+    t.mft.freeInstance = mFreeInstance;
+    t.mft.freeObjectPath = mFreePath;
+    t.mft.freeArgs = mFreeArgs;
+    t.mft.freeString = mFreeString;
+    t.mft.freeArray = mFreeArray;
+    t.mft.freeDateTime = mFreeDateTime;
+    t.mft.freeSelectExp = mFreeSelectExp;
+
+    t.stringFT.ftVersion = 200;
+    t.stringFT.release = strRelease;
+    t.stringFT.clone = strClone;
+    t.stringFT.getCharPtr = strChars;
+
+    t.dateTimeFT.ftVersion = 200;
+    t.dateTimeFT.release = dtRelease;
+    t.dateTimeFT.clone = dtClone;
+    t.dateTimeFT.getBinaryFormat = dtBinary;
+    t.dateTimeFT.getStringFormat = dtText;
+    t.dateTimeFT.isInterval = dtIsInterval;
+
+    t.pathFT.ftVersion = 200;
+    t.pathFT.release = opRelease;
+    t.pathFT.clone = opClone;
+    t.pathFT.setNameSpace = opSetText<&ObjectPath::nameSpace>;
+    t.pathFT.getNameSpace = opGetText<&ObjectPath::nameSpace>;
+    t.pathFT.setHostname = opSetText<&ObjectPath::host>;
+    t.pathFT.getHostname = opGetText<&ObjectPath::host>;
+    t.pathFT.setClassName = opSetText<&ObjectPath::className>;
+    t.pathFT.getClassName = opGetText<&ObjectPath::className>;
+    t.pathFT.addKey = opAddKey;
+    t.pathFT.getKey = opGetKey;
+    t.pathFT.getKeyAt = opGetKeyAt;
+    t.pathFT.getKeyCount = opKeyCount;
+    t.pathFT.setNameSpaceFromObjectPath = opSetNsFrom;
+    t.pathFT.setHostAndNameSpaceFromObjectPath = opSetHostNsFrom;
+    t.pathFT.getClassQualifier = opClassQual;
+    t.pathFT.getPropertyQualifier = opPropQual;
+    t.pathFT.getMethodQualifier = opMethQual;
+    t.pathFT.getParameterQualifier = opParamQual;
+    t.pathFT.toString = opToString;
+
+    t.arrayFT.ftVersion = 200;
+    t.arrayFT.release = arRelease;
+    t.arrayFT.clone = arClone;
+    t.arrayFT.getSize = arSize;
+    t.arrayFT.getSimpleType = arType;
+    t.arrayFT.getElementAt = arGet;
+    t.arrayFT.setElementAt = arSet;
+
+    t.instanceFT.ftVersion = 200;
+    t.instanceFT.release = inRelease;
+    t.instanceFT.clone = inClone;
+    t.instanceFT.getProperty = inGet;
+    t.instanceFT.getPropertyAt = inGetAt;
+    t.instanceFT.getPropertyCount = inCount;
+    t.instanceFT.setProperty = inSet;
+    t.instanceFT.getObjectPath = inPath;
+    t.instanceFT.setPropertyFilter = inSetFilter;
+    t.instanceFT.setObjectPath = inSetPath;
+    t.instanceFT.setPropertyWithOrigin = inSetWithOrigin;
+
+    t.argsFT.ftVersion = 200;
+    t.argsFT.release = nlRelease<EncArgs, CMPIArgs>;
+    t.argsFT.clone = nlClone<EncArgs, CMPIArgs>;
+    t.argsFT.addArg = nlAdd<EncArgs, CMPIArgs>;
+    t.argsFT.getArg = nlGet<EncArgs, CMPIArgs>;
+    t.argsFT.getArgAt = nlGetAt<EncArgs, CMPIArgs>;
+    t.argsFT.getArgCount = nlCount<EncArgs, CMPIArgs>;
+
+    t.contextFT.ftVersion = 200;
+    t.contextFT.release = nlRelease<EncContext, CMPIContext>;
+    t.contextFT.clone = nlClone<EncContext, CMPIContext>;
+    t.contextFT.getEntry = nlGet<EncContext, CMPIContext>;
+    t.contextFT.getEntryAt = nlGetAt<EncContext, CMPIContext>;
+    t.contextFT.getEntryCount = nlCount<EncContext, CMPIContext>;
+    t.contextFT.addEntry = nlAdd<EncContext, CMPIContext>;
+
+    t.enumFT.ftVersion = 200;
+    t.enumFT.release = enRelease;
+    t.enumFT.clone = enClone;
+    t.enumFT.getNext = enNext;
+    t.enumFT.hasNext = enHasNext;
+    t.enumFT.toArray = enToArray;
+
+    t.resultFT.ftVersion = 200;
+    t.resultFT.release = rsRelease;
+    t.resultFT.clone = rsClone;
+    t.resultFT.returnData = rsData;
+    t.resultFT.returnInstance = rsInstance;
+    t.resultFT.returnObjectPath = rsPath;
+    t.resultFT.returnDone = rsDone;
+    t.resultFT.returnError = rsError;
+
+    t.selectFT.ftVersion = 200;
+    t.selectFT.release = seRelease;
+    t.selectFT.clone = seClone;
+    t.selectFT.evaluate = seEvaluate;
+    t.selectFT.getString = seString;
+    t.selectFT.getDOC = seCond;
+    t.selectFT.getCOD = seCond;
+    t.selectFT.evaluateUsingAccessor = seEvalAccessor;
+    return t;
+}
+
+}  // namespace
+
+Tables& tables() {
+    static Tables t = buildTables();
+    return t;
+}
+
+}  // namespace detail
+
+// ---------------------------------------------------------------- arena bookkeeping of the host
+
+Arena* Host::Impl::currentArena() {
+    std::lock_guard<std::mutex> g(arenaLock);
+    for (auto it = detail::tlsArenas.rbegin(); it != detail::tlsArenas.rend(); ++it) {
+        auto found = arenas.find(*it);
+        if (found != arenas.end()) return found->second;
+    }
+    return lifeArena.get();
+}
+
+unsigned long long Host::Impl::pushArena() {
+    const unsigned long long id = detail::gNextArenaId.fetch_add(1);
+    auto arena = std::make_unique<Arena>(id);
+    {
+        std::lock_guard<std::mutex> g(arenaLock);
+        arenas[id] = arena.get();
+    }
+    detail::tlsArenas.push_back(id);
+    arena.release();
+    return id;
+}
+
+void Host::Impl::popArena(unsigned long long id) {
+    auto& stack = detail::tlsArenas;
+    for (auto it = stack.rbegin(); it != stack.rend(); ++it) {
+        if (*it == id) {
+            stack.erase(std::next(it).base());
+            break;
+        }
+    }
+    // Ids of arenas that are gone (another host, a freed one) go too.
+    Arena* arena = nullptr;
+    {
+        std::lock_guard<std::mutex> g(arenaLock);
+        auto found = arenas.find(id);
+        if (found != arenas.end()) {
+            arena = found->second;
+            arenas.erase(found);
+        }
+    }
+    delete arena;
+}
+
+void Host::Impl::freeAllArenas() {
+    std::unordered_map<unsigned long long, Arena*> all;
+    std::unique_ptr<Arena> life;
+    {
+        std::lock_guard<std::mutex> g(arenaLock);
+        all.swap(arenas);
+        life = std::move(lifeArena);
+        lifeArena = std::make_unique<Arena>(0);
+    }
+    for (auto& kv : all) delete kv.second;
+    life.reset();
+    std::lock_guard<std::mutex> g(mallocLock);
+    for (void* p : mallocs) std::free(p);
+    mallocs.clear();
+}
+
+}  // namespace cimhost
