@@ -14,7 +14,8 @@
 // type.
 //
 // CmpiData(const char*) copies the text at once, so the caller's buffer may
-// be reused right after; the value travels as CMPI_chars.
+// be reused right after; its type is CMPI_chars until it reaches the
+// broker, which receives it as a CMPI_string.
 #ifndef CMPI_CPP_CMPIDATA_H
 #define CMPI_CPP_CMPIDATA_H
 
@@ -87,11 +88,10 @@ public:
     bool isKey() const { return (data_.state & CMPI_keyValue) != 0; }
     bool isArray() const { return (data_.type & CMPI_ARRAY) != 0; }
 
-    // The raw value as the broker sees it.
+    // The raw value.  (A CMPI_chars value is handed to the broker as a
+    // CMPIString made by the broker's string factory, so that no broker
+    // has to agree on how a CMPI_chars CMPIValue is laid out.)
     const CMPIData& getEnc() const { return data_; }
-    // What to pass as the CMPIValue* of a C call: NULL for a null value,
-    // the text itself for CMPI_chars, else the address of the value.
-    const CMPIValue* valuePtr() const;
 
 private:
     friend class CmpiCharData;

@@ -112,15 +112,6 @@ CmpiData::CmpiData(const CmpiArray& d)
     set(static_cast<CMPIType>(d.getType() | CMPI_ARRAY));
 }
 
-const CMPIValue* CmpiData::valuePtr() const
-{
-    if (isNullValue())
-        return nullptr;
-    if (data_.type == CMPI_chars)
-        return reinterpret_cast<const CMPIValue*>(data_.value.chars);
-    return &data_.value;
-}
-
 // ---- conversion -----------------------------------------------------------
 
 void CmpiData::typeMismatch() const
@@ -271,7 +262,8 @@ CmpiArrayIdx& CmpiArrayIdx::operator=(const CmpiData& value)
     bool fits = given == element || (element == CMPI_string && given == CMPI_chars);
     if (!fits)
         throw CmpiStatus(CMPI_RC_ERR_TYPE_MISMATCH);
-    check(arr_->ft->setElementAt(arr_, static_cast<CMPICount>(idx_), value.valuePtr(), given));
+    cmpi_impl::CValue c(value);
+    check(arr_->ft->setElementAt(arr_, static_cast<CMPICount>(idx_), c.ptr, c.type));
     return *this;
 }
 

@@ -163,7 +163,8 @@ CmpiData CmpiObjectPath::getKey(int index, CmpiString* name) const
 void CmpiObjectPath::setKey(const char* name, const CmpiData& data)
 {
     CMPIObjectPath* op = static_cast<CMPIObjectPath*>(requireEnc());
-    check(op->ft->addKey(op, name, data.valuePtr(), data.getType()), name);
+    cmpi_impl::CValue c(data);
+    check(op->ft->addKey(op, name, c.ptr, c.type), name);
 }
 
 CmpiString CmpiObjectPath::toString() const
@@ -200,7 +201,8 @@ CmpiData CmpiInstance::getProperty(int index, CmpiString* name) const
 void CmpiInstance::setProperty(const char* name, const CmpiData& data)
 {
     CMPIInstance* inst = static_cast<CMPIInstance*>(requireEnc());
-    check(inst->ft->setProperty(inst, name, data.valuePtr(), data.getType()), name);
+    cmpi_impl::CValue c(data);
+    check(inst->ft->setProperty(inst, name, c.ptr, c.type), name);
 }
 
 void CmpiInstance::setPropertyFilter(const char** properties, const char** keys)
@@ -253,7 +255,8 @@ CmpiData CmpiArgs::getArg(int index, CmpiString* name) const
 void CmpiArgs::setArg(const char* name, const CmpiData& data)
 {
     CMPIArgs* args = static_cast<CMPIArgs*>(requireEnc());
-    check(args->ft->addArg(args, name, data.valuePtr(), data.getType()), name);
+    cmpi_impl::CValue c(data);
+    check(args->ft->addArg(args, name, c.ptr, c.type), name);
 }
 
 // ---- CmpiResult -----------------------------------------------------------
@@ -261,7 +264,8 @@ void CmpiArgs::setArg(const char* name, const CmpiData& data)
 void CmpiResult::returnData(const CmpiData& d)
 {
     CMPIResult* r = static_cast<CMPIResult*>(requireEnc());
-    check(r->ft->returnData(r, d.valuePtr(), d.getType()));
+    cmpi_impl::CValue c(d);
+    check(r->ft->returnData(r, c.ptr, c.type));
 }
 
 void CmpiResult::returnData(const CmpiInstance& inst)

@@ -2,6 +2,7 @@
 #ifndef CMPI_CPP_INTERNAL_H
 #define CMPI_CPP_INTERNAL_H
 
+#include "CmpiData.h"
 #include "CmpiStatus.h"
 #include "cmpift.h"
 
@@ -22,6 +23,16 @@ inline bool isAbsent(CMPIrc rc)
 {
     return rc == CMPI_RC_ERR_NOT_FOUND || rc == CMPI_RC_ERR_NO_SUCH_PROPERTY;
 }
+
+// A CmpiData as the arguments (value pointer, type) of a broker call:
+// NULL for a null value; CMPI_chars text turned into a CMPIString by the
+// process's broker, so the call sees CMPI_string.
+struct CValue {
+    explicit CValue(const CmpiData& d);
+    CMPIValue value;
+    const CMPIValue* ptr;
+    CMPIType type;
+};
 
 } // namespace cmpi_impl
 

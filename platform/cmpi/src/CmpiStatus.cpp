@@ -36,6 +36,26 @@ CMPIData notFoundData()
     return d;
 }
 
+CValue::CValue(const CmpiData& d) : ptr(nullptr), type(d.getType())
+{
+    value = d.getEnc().value;
+    if (type == CMPI_chars) {
+        type = CMPI_string;
+        if (d.isNullValue())
+            return;
+        const CMPIBroker* mb = requireBroker();
+        CMPIStatus rc = {CMPI_RC_OK, nullptr};
+        value.string = mb->eft->newString(mb, d.getEnc().value.chars, &rc);
+        check(rc);
+        if (value.string == nullptr)
+            throw CmpiStatus(CMPI_RC_ERR_FAILED, "newString returned no string");
+        ptr = &value;
+        return;
+    }
+    if (!d.isNullValue())
+        ptr = &value;
+}
+
 } // namespace cmpi_impl
 
 // ---- CmpiStatus -----------------------------------------------------------

@@ -81,26 +81,24 @@ CMPIString* makeString(const char* text)
     return &s->enc;
 }
 
-// Stores a value the way a broker does: CMPI_chars becomes a CMPIString.
+// Stores a value.  CMPI_chars is refused: brokers disagree on how its
+// CMPIValue is laid out, so the wrapper must never send it.
 CMPIData store(const CMPIValue* value, CMPIType type)
 {
     CMPIData d;
     d.type = type;
     d.state = CMPI_goodValue;
     d.value.uint64 = 0;
-    if (value == nullptr) {
+    if (value == nullptr)
         d.state = CMPI_nullValue;
-        if (type == CMPI_chars)
-            d.type = CMPI_string;
-        return d;
-    }
-    if (type == CMPI_chars) {
-        d.type = CMPI_string;
-        d.value.string = makeString(reinterpret_cast<const char*>(value));
-        return d;
-    }
-    d.value = *value;
+    else
+        d.value = *value;
     return d;
+}
+
+bool isChars(CMPIType t)
+{
+    return (t & ~CMPI_ARRAY) == CMPI_chars;
 }
 
 CMPIData absent()
@@ -178,6 +176,8 @@ CMPIData arrGet(const CMPIArray* a, CMPICount i, CMPIStatus* rc)
 }
 CMPIStatus arrSet(CMPIArray* a, CMPICount i, const CMPIValue* v, CMPIType t)
 {
+    if (isChars(t))
+        return fail(CMPI_RC_ERR_INVALID_DATA_TYPE);
     if (i >= arr(a)->items.size())
         return fail(CMPI_RC_ERR_NO_SUCH_PROPERTY);
     arr(a)->items[i] = store(v, t);
@@ -214,6 +214,8 @@ CMPIStatus opAddKey(CMPIObjectPath* op, const char* name, const CMPIValue* v, co
 {
     if (name == nullptr || *name == '\0')
         return fail(CMPI_RC_ERR_INVALID_PARAMETER);
+    if (isChars(t))
+        return fail(CMPI_RC_ERR_INVALID_DATA_TYPE);
     CMPIData d = store(v, t);
     d.state = static_cast<CMPIValueState>(d.state | CMPI_keyValue);
     putNamed(path(op)->keys, name, d);
@@ -274,6 +276,8 @@ CMPIStatus instSet(const CMPIInstance* i, const char* name, const CMPIValue* v, 
 {
     if (name == nullptr || *name == '\0')
         return fail(CMPI_RC_ERR_INVALID_PARAMETER);
+    if (isChars(t))
+        return fail(CMPI_RC_ERR_INVALID_DATA_TYPE);
     Instance* in = inst(i);
     if (in->filtered) {
         bool allowed = false;
@@ -321,6 +325,8 @@ CMPIStatus argsRelease(CMPIArgs*) { return ok(); }
 CMPIArgs* argsClone(const CMPIArgs*, CMPIStatus* rc) { setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED); return nullptr; }
 CMPIStatus argsAdd(const CMPIArgs* a, const char* name, const CMPIValue* v, const CMPIType t)
 {
+    if (isChars(t))
+        return fail(CMPI_RC_ERR_INVALID_DATA_TYPE);
     putNamed(args(a)->args, name, store(v, t));
     return ok();
 }
@@ -381,6 +387,8 @@ CMPIStatus resRelease(CMPIResult*) { return ok(); }
 CMPIResult* resClone(const CMPIResult*, CMPIStatus* rc) { setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED); return nullptr; }
 CMPIStatus resData(const CMPIResult* r, const CMPIValue* v, const CMPIType t)
 {
+    if (isChars(t))
+        return fail(CMPI_RC_ERR_INVALID_DATA_TYPE);
     res(r)->items.push_back(ResultItem{store(v, t)});
     return ok();
 }
