@@ -104,6 +104,9 @@ unsigned long zorap_sim_alarms_delivered(void);
 void zorap_sim_set_next_flash(uint32_t result, uint32_t durationMs);
 /* Number of flash writes that have started but not yet returned. */
 unsigned long zorap_sim_flash_writes_running(void);
+/* Wait until exactly `count` flash writes are running; 0 when that happened
+ * within timeoutMs, -1 otherwise. */
+int zorap_sim_wait_flash_writes(unsigned long count, uint32_t timeoutMs);
 
 /* --- Failures and counters ----------------------------------------------- */
 

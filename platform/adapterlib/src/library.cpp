@@ -388,9 +388,11 @@ public:
             }
             epoch = flashEpoch;
             flashRunning.fetch_add(1);
+            flashCv.notify_all();
             bool aborted = flashCv.wait_for(l, std::chrono::milliseconds(durationMs),
                                             [&] { return flashEpoch != epoch; });
             flashRunning.fetch_sub(1);
+            flashCv.notify_all();
             if (aborted) return ZORAP_ERR_FAILED;
         }
         if (result == ZORAP_OK) {
@@ -997,6 +999,15 @@ ZORAP_EXPORT void zorap_sim_set_next_flash(uint32_t result, uint32_t durationMs)
 
 ZORAP_EXPORT unsigned long zorap_sim_flash_writes_running(void) {
     return zorap_sim::lib().flashRunning.load();
+}
+
+ZORAP_EXPORT int zorap_sim_wait_flash_writes(unsigned long count, uint32_t timeoutMs) {
+    return zorap_sim::control("zorap_sim_wait_flash_writes", [&](Library& L) {
+        std::unique_lock<std::mutex> l(L.flashMu);
+        bool reached = L.flashCv.wait_for(l, std::chrono::milliseconds(timeoutMs),
+                                          [&] { return L.flashRunning.load() == count; });
+        return reached ? 0 : -1;
+    });
 }
 
 ZORAP_EXPORT int zorap_sim_fail(int function, uint32_t code, int times) {

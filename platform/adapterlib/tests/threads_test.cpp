@@ -1,0 +1,131 @@
+// Work on the library's own threads and beside callers' threads: alarm
+// delivery, backup builds beside a reader, flash writes ended by shutdown.
+#include <atomic>
+#include <chrono>
+#include <condition_variable>
+#include <mutex>
+#include <thread>
+
+#include "sim_fixture.h"
+
+using namespace zorap_test;
+
+namespace {
+
+// What the alarm callback saw.
+struct AlarmLog {
+    std::mutex mu;
+    std::condition_variable cv;
+    std::vector<std::thread::id> threads;
+    std::vector<unsigned> devices;
+    std::vector<int> types;
+    std::vector<std::string> texts;
+    std::vector<int> lengths;
+    bool listSeen = true;
+};
+AlarmLog* gLog = nullptr;
+
+int recordAlarm(unsigned int device, int type, int length, unsigned char* text) {
+    std::lock_guard<std::mutex> l(gLog->mu);
+    gLog->threads.push_back(std::this_thread::get_id());
+    gLog->devices.push_back(device);
+    gLog->types.push_back(type);
+    gLog->lengths.push_back(length);
+    gLog->texts.push_back(reinterpret_cast<char*>(text));
+    // The callback may call back into the library, as the provider's does.
+    gLog->listSeen = gLog->listSeen && ZORAP_GetAdapterList() != nullptr;
+    gLog->cv.notify_all();
+    return 0;
+}
+
+class AlarmTest : public SimTest {
+protected:
+    void SetUp() override {
+        SimTest::SetUp();
+        gLog = &log;
+    }
+    void TearDown() override {
+        SimTest::TearDown();  // ends the alarm thread before the log goes
+        gLog = nullptr;
+    }
+    AlarmLog log;
+};
+
+}  // namespace
+
+TEST_F(AlarmTest, CallbackRunsOnTheLibrarysOwnThreadWithTheGivenArguments) {
+    EXPECT_EQ(-1, zorap_sim_raise_alarm(1, 0, "dropped"));  // nobody registered
+    ASSERT_EQ(ZORAP_OK, ZORAP_RegisterAlarmNotificationCallback(recordAlarm));
+    ASSERT_EQ(0, zorap_sim_raise_alarm(7, 0, "port 7 changed"));
+    ASSERT_EQ(0, zorap_sim_raise_alarm(8, 3, nullptr));
+    ASSERT_EQ(0, zorap_sim_wait_alarms_idle(5000));
+    std::lock_guard<std::mutex> l(log.mu);
+    ASSERT_EQ(2u, log.devices.size());
+    EXPECT_NE(std::this_thread::get_id(), log.threads[0]);
+    EXPECT_EQ(log.threads[0], log.threads[1]);
+    EXPECT_EQ((std::vector<unsigned>{7, 8}), log.devices);
+    EXPECT_EQ((std::vector<int>{0, 3}), log.types);
+    EXPECT_EQ("port 7 changed", log.texts[0]);
+    EXPECT_EQ(14, log.lengths[0]);
+    EXPECT_EQ("", log.texts[1]);
+    EXPECT_TRUE(log.listSeen);
+    EXPECT_EQ(2u, zorap_sim_alarms_delivered());
+}
+
+TEST_F(AlarmTest, UnregisterAndUninitializeStopDelivery) {
+    ASSERT_EQ(ZORAP_OK, ZORAP_RegisterAlarmNotificationCallback(recordAlarm));
+    EXPECT_EQ(ZORAP_ERR_NOT_FOUND, ZORAP_UnRegisterAlarmNotificationCallback(nullptr));
+    ASSERT_EQ(ZORAP_OK, ZORAP_UnRegisterAlarmNotificationCallback(recordAlarm));
+    EXPECT_EQ(-1, zorap_sim_raise_alarm(1, 0, "late"));
+    ASSERT_EQ(ZORAP_OK, ZORAP_RegisterAlarmNotificationCallback(recordAlarm));
+    ASSERT_EQ(ZORAP_OK, ZORAP_Uninitialize());
+    EXPECT_EQ(-1, zorap_sim_raise_alarm(1, 0, "after uninitialize"));
+    std::lock_guard<std::mutex> l(log.mu);
+    EXPECT_TRUE(log.devices.empty());
+    EXPECT_EQ(ZORAP_ERR_NOT_INITIALIZED, ZORAP_RegisterAlarmNotificationCallback(recordAlarm));
+}
+
+// A reader walks the main tree under its own lock, as the provider does,
+// while another thread builds backups without that lock and swaps under it.
+TEST_F(SimTest, BackupBuildsRunBesideAReaderOfTheMainTree) {
+    std::mutex providerLock;
+    std::atomic<bool> stop{false};
+    std::atomic<unsigned long> walks{0};
+    std::atomic<bool> consistent{true};
+    std::thread reader([&] {
+        do {
+            std::lock_guard<std::mutex> l(providerLock);
+            unsigned n = 0;
+            for (auto* a : adapters()) {
+                for (auto* q : protocols(a))
+                    if (q->protocolType < 2 && q->fcDevice.deviceHandle == 0) consistent = false;
+                ++n;
+            }
+            if (n != 4) consistent = false;
+            ++walks;
+        } while (!stop.load());
+    });
+    for (int i = 0; i < 200; ++i) {
+        ASSERT_EQ(ZORAP_OK, ZORAP_UpdateBackupAdapterList());
+        std::lock_guard<std::mutex> l(providerLock);
+        ASSERT_EQ(ZORAP_OK, ZORAP_SwapBackupToMainAdapterList());
+    }
+    stop = true;
+    reader.join();
+    EXPECT_GT(walks.load(), 0u);
+    EXPECT_TRUE(consistent.load());
+}
+
+TEST_F(SimTest, UninitializeEndsAFlashWriteInProgress) {
+    zorap_sim_set_next_flash(ZORAP_OK, 60000);
+    const unsigned char image[] = "x";
+    ZORAP_STATUS result = ZORAP_OK;
+    std::thread writer([&] { result = ZORAP_UpdateFlash(1, image, 0); });
+    ASSERT_EQ(0, zorap_sim_wait_flash_writes(1, 5000));
+    auto t0 = std::chrono::steady_clock::now();
+    ZORAP_Uninitialize();
+    writer.join();
+    EXPECT_LT(std::chrono::steady_clock::now() - t0, std::chrono::seconds(5));
+    EXPECT_EQ(ZORAP_ERR_FAILED, result);
+}
+

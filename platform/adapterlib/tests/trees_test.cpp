@@ -1,0 +1,166 @@
+// Main and backup trees, configuration changes, and where the description
+// comes from.
+#include <dlfcn.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <fstream>
+
+#include "sim_fixture.h"
+
+using namespace zorap_test;
+
+namespace {
+
+std::string tempFile(const std::string& content) {
+    char name[] = "/tmp/zorap_sim_test_XXXXXX";
+    int fd = mkstemp(name);
+    EXPECT_GE(fd, 0);
+    close(fd);
+    std::ofstream(name) << content;
+    return name;
+}
+
+std::string oneAdapter(const std::string& serial) {
+    return R"({"adapters":[{"model":"M","serialNumber":")" + serial +
+           R"(","chip":"RSX-1610","ports":[{"protocols":[{"type":"fc","nodeWWN":"3000000000000001","portWWN":"3100000000000001"}]}]}]})";
+}
+
+std::string firstSerial() {
+    auto list = adapters();
+    return list.empty() ? std::string("<none>") : std::string(list[0]->serialNumber);
+}
+
+}  // namespace
+
+TEST_F(SimTest, BackupIsBuiltAsideAndSwapMakesItMain) {
+    _zorap_adapter_list_t* before = ZORAP_GetAdapterList();
+    _zorap_adapter_t* oldFirst = before->firstAdapter;
+    EXPECT_EQ(0, ZORAP_DidConfigChange());
+
+    ASSERT_EQ(0, zorap_sim_load_json(oneAdapter("NEW-1").c_str()));
+    EXPECT_EQ(1, ZORAP_DidConfigChange());
+    ASSERT_EQ(ZORAP_OK, ZORAP_UpdateBackupAdapterList());
+    // The main tree is untouched by the backup build.
+    EXPECT_EQ(before, ZORAP_GetAdapterList());
+    EXPECT_EQ("SERIAL-A", firstSerial());
+    ASSERT_EQ(ZORAP_OK, ZORAP_SwapBackupToMainAdapterList());
+    EXPECT_NE(before, ZORAP_GetAdapterList());
+    EXPECT_EQ("NEW-1", firstSerial());
+    // The replaced tree stays readable for a straggling reader.
+    EXPECT_STREQ("SERIAL-A", oldFirst->serialNumber);
+
+    EXPECT_EQ(ZORAP_OK, ZORAP_ResetConfigChange());
+    EXPECT_EQ(0, ZORAP_DidConfigChange());
+    // No second backup: nothing to swap.
+    EXPECT_EQ(ZORAP_ERR_NOT_PRESENT, ZORAP_SwapBackupToMainAdapterList());
+    EXPECT_EQ("NEW-1", firstSerial());
+}
+
+TEST_F(SimTest, ChangedFileIsSeenAndReadByTheNextBackup) {
+    std::string path = tempFile(oneAdapter("FILE-1"));
+    ASSERT_EQ(0, zorap_sim_load_file(path.c_str()));
+    EXPECT_EQ(path, zorap_sim_description_path());
+    ASSERT_EQ(ZORAP_OK, ZORAP_UpdateBackupAdapterList());
+    ASSERT_EQ(ZORAP_OK, ZORAP_SwapBackupToMainAdapterList());
+    ZORAP_ResetConfigChange();
+    EXPECT_EQ(0, ZORAP_DidConfigChange());
+    EXPECT_EQ("FILE-1", firstSerial());
+
+    // Rewrite with another length so the change shows whatever the clock.
+    std::ofstream(path) << oneAdapter("FILE-22");
+    EXPECT_EQ(1, ZORAP_DidConfigChange());
+    ZORAP_ResetConfigChange();
+    EXPECT_EQ(0, ZORAP_DidConfigChange());
+    EXPECT_EQ("FILE-1", firstSerial());
+    ASSERT_EQ(ZORAP_OK, ZORAP_UpdateBackupAdapterList());
+    ASSERT_EQ(ZORAP_OK, ZORAP_SwapBackupToMainAdapterList());
+    EXPECT_EQ("FILE-22", firstSerial());
+    EXPECT_EQ(0, ZORAP_DidConfigChange());
+
+    // A file that turns bad leaves no adapters after the next swap.
+    std::ofstream(path) << "{ not json";
+    testing::internal::CaptureStderr();
+    ASSERT_EQ(ZORAP_OK, ZORAP_UpdateBackupAdapterList());
+    std::string err = testing::internal::GetCapturedStderr();
+    EXPECT_NE(std::string::npos, err.find(path)) << err;
+    ASSERT_EQ(ZORAP_OK, ZORAP_SwapBackupToMainAdapterList());
+    ASSERT_NE(nullptr, ZORAP_GetAdapterList());
+    EXPECT_EQ(nullptr, ZORAP_GetAdapterList()->firstAdapter);
+    std::remove(path.c_str());
+}
+
+TEST(SimSource, EnvironmentVariableOverridesTheFileBesideTheLibrary) {
+    ZORAP_Uninitialize();
+    std::string path = tempFile(oneAdapter("FROM-ENV"));
+    setenv(ZORAP_SIM_ENV, path.c_str(), 1);
+    ASSERT_EQ(0, zorap_sim_load_default());
+    ASSERT_EQ(ZORAP_OK, ZORAP_Initialize(0, 0));
+    EXPECT_EQ("FROM-ENV", firstSerial());
+    ZORAP_Uninitialize();
+
+    // Without the variable: the default description installed beside the
+    // library, a host of three adapters.
+    unsetenv(ZORAP_SIM_ENV);
+    ASSERT_EQ(0, zorap_sim_load_default());
+    std::string used = zorap_sim_description_path();
+    EXPECT_NE(std::string::npos, used.find(std::string("/") + ZORAP_SIM_DEFAULT_FILE)) << used;
+    Dl_info info{};
+    ASSERT_NE(0, dladdr(reinterpret_cast<void*>(&ZORAP_Initialize), &info));
+    std::string libDir(info.dli_fname);
+    EXPECT_EQ(libDir.substr(0, libDir.rfind('/')), used.substr(0, used.rfind('/')));
+    ASSERT_EQ(ZORAP_OK, ZORAP_Initialize(0, 0));
+    EXPECT_EQ(3u, adapters().size());
+    ZORAP_Uninitialize();
+    std::remove(path.c_str());
+}
+
+TEST(SimSource, DefaultDescriptionIsTheRealisticHost) {
+    ZORAP_Uninitialize();
+    unsetenv(ZORAP_SIM_ENV);
+    ASSERT_EQ(0, zorap_sim_load_default());
+    ASSERT_EQ(ZORAP_OK, ZORAP_Initialize(0, 0));
+    auto list = adapters();
+    ASSERT_EQ(3u, list.size());
+    // A dual-port FC HBA: two FC functions, two targets, five LUNs.
+    auto fc = protocols(list[0]);
+    ASSERT_EQ(2u, fc.size());
+    unsigned targets = 0, luns = 0;
+    for (auto* q : fc) {
+        EXPECT_LT(q->protocolType, 2u);
+        targets += q->fcDevice.targetCount;
+        for (auto* t = q->fcDevice.targetList; t; t = t->next) luns += t->lunCount;
+    }
+    EXPECT_EQ(2u, targets);
+    EXPECT_GE(luns, 3u);
+    // A dual-port CNA: each physical port has an FCoE and a NIC function with
+    // addresses and FCoE linkage.
+    ASSERT_NE(nullptr, list[1]->phyPortList);
+    unsigned ports = 0;
+    for (auto* p = list[1]->phyPortList->firstPhyPort; p; p = p->next, ++ports) {
+        auto* q = p->protocolList->firstProtocol;
+        ASSERT_NE(nullptr, q);
+        ASSERT_NE(nullptr, q->next);
+        EXPECT_EQ(ZORAP_PROTOCOL_FCOE, q->protocolType);
+        EXPECT_EQ(ZORAP_PROTOCOL_NIC, q->next->protocolType);
+        void* ip = nullptr;
+        ASSERT_EQ(ZORAP_OK, ZORAP_GetIPProperties(q->next->nicPortInfo.interfaceName, &ip));
+        EXPECT_EQ(ZORAP_IP_FAMILY_IPV4, static_cast<_zorap_ip_properties_t*>(ip)->ipv4Address.family);
+        EXPECT_GT(static_cast<_zorap_ip_properties_t*>(ip)->ipv6AddressCount, 0u);
+        ZORAP_FreeMem(ip);
+        void* links = nullptr;
+        uint32_t count = 0;
+        ASSERT_EQ(ZORAP_OK, ZORAP_GetFCoELinkage(q->next->nicPortInfo.interfaceName, &links, &count));
+        EXPECT_EQ(1u, count);
+        ZORAP_FreeMem(links);
+    }
+    EXPECT_EQ(2u, ports);
+    // A single-port older HBA with a branded model and a 22-character 11S serial.
+    EXPECT_EQ(1u, protocols(list[2]).size());
+    EXPECT_STREQ("KMX3102", protocols(list[2])[0]->fcDevice.modelName);
+    EXPECT_EQ(22u, std::strlen(list[2]->serialNumber));
+    EXPECT_EQ(0, std::strncmp("11S", list[2]->serialNumber, 3));
+    ZORAP_Uninitialize();
+}
+
