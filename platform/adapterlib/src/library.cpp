@@ -67,6 +67,9 @@ constexpr const char* kFunctionNames[ZORAP_FN_COUNT] = {
 // that still walks one (the alarm thread of a caller may, without a lock).
 constexpr size_t kRetiredTrees = 2;
 
+// How long shutdown waits for a running alarm callback.
+constexpr int kCallbackGraceMs = 2000;
+
 void complain(const std::string& message) {
     std::fprintf(stderr, "libzorap_cna_provider: %s\n", message.c_str());
 }
@@ -196,8 +199,8 @@ public:
     std::condition_variable alarmCv, alarmIdleCv;
     std::list<Alarm> alarmQueue;
     ZORAP_ALARM_CALLBACK callback = nullptr;
-    bool inCallback = false;
-    bool alarmStop = false;
+    unsigned callbacksRunning = 0;
+    uint64_t alarmEpoch = 0;
     std::thread alarmThread;
     std::thread::id alarmThreadId;
     unsigned long alarmsDelivered = 0;
@@ -298,22 +301,24 @@ public:
     }
 
     // --- alarm thread ---
-    void alarmLoop() {
+    // Each alarm thread serves one epoch; stopping bumps the epoch, so a
+    // thread that had to be let go ends by itself when its callback returns.
+    void alarmLoop(uint64_t epoch) {
         std::unique_lock<std::mutex> l(alarmMu);
         for (;;) {
-            alarmCv.wait(l, [this] { return alarmStop || !alarmQueue.empty(); });
-            if (alarmStop) break;
+            alarmCv.wait(l, [&] { return alarmEpoch != epoch || !alarmQueue.empty(); });
+            if (alarmEpoch != epoch) break;
             Alarm a = std::move(alarmQueue.front());
             alarmQueue.pop_front();
             ZORAP_ALARM_CALLBACK cb = callback;
             if (cb) {
-                inCallback = true;
+                ++callbacksRunning;
                 l.unlock();
                 std::vector<unsigned char> text(a.text.begin(), a.text.end());
                 text.push_back('\0');
                 cb(a.device, a.type, static_cast<int>(a.text.size()), text.data());
                 l.lock();
-                inCallback = false;
+                --callbacksRunning;
                 ++alarmsDelivered;
             }
             alarmIdleCv.notify_all();
@@ -322,31 +327,43 @@ public:
 
     void startAlarmThread() {  // alarmMu held
         if (alarmThread.joinable()) return;
-        alarmStop = false;
-        alarmThread = std::thread([this] { alarmLoop(); });
+        uint64_t epoch = alarmEpoch;
+        alarmThread = std::thread([this, epoch] { alarmLoop(epoch); });
         alarmThreadId = alarmThread.get_id();
     }
 
+    // Ends the alarm thread.  A callback that is running gets a bounded time
+    // to return: a caller may hold its own lock here that the callback waits
+    // for, and must not be blocked for ever.
     void stopAlarmThread() {
         std::thread t;
         {
             std::lock_guard<std::mutex> l(alarmMu);
             callback = nullptr;
-            alarmStop = true;
+            ++alarmEpoch;
             alarmQueue.clear();
             t = std::move(alarmThread);
+            alarmThreadId = std::thread::id();
         }
         alarmCv.notify_all();
-        if (t.joinable()) {
-            if (t.get_id() == std::this_thread::get_id())
-                t.detach();  // called from inside the callback
-            else
-                t.join();
-        }
-        std::lock_guard<std::mutex> l(alarmMu);
-        alarmStop = false;
-        inCallback = false;
         alarmIdleCv.notify_all();
+        if (!t.joinable()) return;
+        if (t.get_id() == std::this_thread::get_id()) {
+            t.detach();  // called from inside the callback
+            return;
+        }
+        bool idle;
+        {
+            std::unique_lock<std::mutex> l(alarmMu);
+            idle = alarmIdleCv.wait_for(l, std::chrono::milliseconds(kCallbackGraceMs),
+                                        [&] { return callbacksRunning == 0; });
+        }
+        if (idle) {
+            t.join();
+        } else {
+            complain("alarm callback still running at shutdown; its thread is let go");
+            t.detach();
+        }
     }
 
     // Ends every flash wait at once (shutdown).
@@ -620,13 +637,11 @@ ZORAP_EXPORT ZORAP_STATUS ZORAP_RegisterAlarmNotificationCallback(ZORAP_ALARM_CA
 
 ZORAP_EXPORT ZORAP_STATUS ZORAP_UnRegisterAlarmNotificationCallback(ZORAP_ALARM_CALLBACK callback) {
     return zorap_sim::run(ZORAP_FN_UnRegisterAlarmNotificationCallback, [&](Library& L) -> ZORAP_STATUS {
-        std::unique_lock<std::mutex> l(L.alarmMu);
+        // No new call starts after this; one that runs may still finish
+        // (ZORAP_Uninitialize waits for it).
+        std::lock_guard<std::mutex> l(L.alarmMu);
         if (!callback || L.callback != callback) return ZORAP_ERR_NOT_FOUND;
         L.callback = nullptr;
-        // After this returns the callback is not running, unless the caller
-        // is the callback itself.
-        if (std::this_thread::get_id() != L.alarmThreadId)
-            L.alarmIdleCv.wait(l, [&] { return !L.inCallback; });
         return ZORAP_OK;
     });
 }
@@ -977,7 +992,7 @@ ZORAP_EXPORT int zorap_sim_wait_alarms_idle(uint32_t timeoutMs) {
     return zorap_sim::control("zorap_sim_wait_alarms_idle", [&](Library& L) {
         std::unique_lock<std::mutex> l(L.alarmMu);
         bool idle = L.alarmIdleCv.wait_for(l, std::chrono::milliseconds(timeoutMs), [&] {
-            return L.alarmQueue.empty() && !L.inCallback;
+            return L.alarmQueue.empty() && L.callbacksRunning == 0;
         });
         return idle ? 0 : -1;
     });

@@ -87,6 +87,39 @@ TEST_F(AlarmTest, UnregisterAndUninitializeStopDelivery) {
 
 // A reader walks the main tree under its own lock, as the provider does,
 // while another thread builds backups without that lock and swaps under it.
+// A caller that holds its own lock across shutdown while its callback waits
+// for that lock is not blocked for ever.
+namespace {
+std::mutex gCallerLock;
+std::atomic<int> gBlockedCalls{0};
+int blockOnCallerLock(unsigned int, int, int, unsigned char*) {
+    std::lock_guard<std::mutex> l(gCallerLock);
+    ++gBlockedCalls;
+    return 0;
+}
+}  // namespace
+
+TEST_F(SimTest, ShutdownDoesNotWaitForEverOnACallbackThatWaitsForTheCaller) {
+    ASSERT_EQ(ZORAP_OK, ZORAP_RegisterAlarmNotificationCallback(blockOnCallerLock));
+    {
+        std::lock_guard<std::mutex> l(gCallerLock);
+        ASSERT_EQ(0, zorap_sim_raise_alarm(1, 0, "x"));
+        ASSERT_EQ(-1, zorap_sim_wait_alarms_idle(100));  // the callback is stuck on our lock
+        testing::internal::CaptureStderr();
+        EXPECT_EQ(ZORAP_OK, ZORAP_UnRegisterAlarmNotificationCallback(blockOnCallerLock));
+        EXPECT_EQ(ZORAP_OK, ZORAP_Uninitialize());
+        EXPECT_NE(std::string::npos, testing::internal::GetCapturedStderr().find("let go"));
+    }
+    ASSERT_EQ(0, zorap_sim_wait_alarms_idle(5000));  // it finishes once the lock is free
+    EXPECT_EQ(1, gBlockedCalls.load());
+    // A new start gets a new alarm thread.
+    ASSERT_EQ(ZORAP_OK, ZORAP_Initialize(0, 0));
+    ASSERT_EQ(ZORAP_OK, ZORAP_RegisterAlarmNotificationCallback(blockOnCallerLock));
+    ASSERT_EQ(0, zorap_sim_raise_alarm(2, 0, "y"));
+    ASSERT_EQ(0, zorap_sim_wait_alarms_idle(5000));
+    EXPECT_EQ(2, gBlockedCalls.load());
+}
+
 TEST_F(SimTest, BackupBuildsRunBesideAReaderOfTheMainTree) {
     std::mutex providerLock;
     std::atomic<bool> stop{false};
