@@ -153,9 +153,6 @@ CMPIrc scalarToValue(const CMPIValue& v, CMPIType t, Value& out) {
             else out = s->null ? Value::nullOf(Type::String) : Value::fromString(s->s);
             return CMPI_RC_OK;
         }
-        case CMPI_chars:
-            out = v.chars ? Value::fromString(v.chars) : Value::nullOf(Type::String);
-            return CMPI_RC_OK;
         case CMPI_charsptr:
             out = v.dataPtr.ptr ? Value::fromString(static_cast<const char*>(v.dataPtr.ptr))
                                 : Value::nullOf(Type::String);
@@ -251,6 +248,11 @@ CMPIrc toValue(const CMPIValue* v, CMPIType type, Value& out) {
     }
     Type st;
     if (!scalarType(type, st)) return CMPI_RC_ERR_INVALID_DATA_TYPE;
+    // As both servers do it, a CMPI_chars value pointer is the text itself.
+    if (type == CMPI_chars) {
+        out = v ? Value::fromString(reinterpret_cast<const char*>(v)) : Value::nullOf(Type::String);
+        return CMPI_RC_OK;
+    }
     if (!v || type == CMPI_null) {
         out = Value::nullOf(st);
         return CMPI_RC_OK;

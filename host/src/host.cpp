@@ -610,19 +610,21 @@ Status Host::activateFilter(const std::string& query, const std::string& sourceN
             st = mi->ft->activateFilter(mi, ctx, &se->enc, cls.c_str(), op, first ? 1 : 0);
             c.event("activateFilter " + cls + " first=" + (first ? "1" : "0") + " rc=" + std::to_string(st.rc));
             if (st.rc != CMPI_RC_OK) return st;
+            {
+                // The subscription stands before indications are enabled.
+                std::lock_guard<std::mutex> g(c.indLock);
+                f.id = c.nextFilterId++;
+                filterId = f.id;
+                c.filters.push_back(f);
+                if (enable) c.indicationsEnabled = true;
+            }
             if (enable) {
                 const CMPIStatus en = mi->ft->enableIndications(mi, ctx);
                 c.event("enableIndications rc=" + std::to_string(en.rc));
             }
             return st;
         });
-    if (!r.ok()) return r;
-    std::lock_guard<std::mutex> g(c.indLock);
-    f.id = c.nextFilterId++;
-    filterId = f.id;
-    c.filters.push_back(f);
-    if (enable) c.indicationsEnabled = true;
-    return Status();
+    return r;
 }
 
 Status Host::deactivateFilter(int filterId) {
