@@ -1,0 +1,282 @@
+// VPD decoding: the tag walk over the adapter's VPD stream, one table of the
+// keywords and their lines, and the option ROM version lines.
+#include "inventory/AdapterFunc_VPD.h"
+
+#include <cstdio>
+#include <cstring>
+
+#include "inventory/AdapterFunc_Chip.h"
+#include "support/Vexlan_NIC_Utils.h"
+#include "support/ossimpl.h"
+
+char g_productId[kVpdLineSize];
+char g_RTag[kVpdLineSize];
+char g_partNumber[kVpdLineSize];
+char g_serialNumber[kVpdLineSize];
+char g_miscInfo[kVpdLineSize];
+char g_manufacturingId[kVpdLineSize];
+char g_efiVersion[kVpdLineSize];
+char g_fwVersion[kVpdLineSize];
+char g_biosVersion[kVpdLineSize];
+char g_fcodeVersion[kVpdLineSize];
+char g_fruNumberVersion[kVpdLineSize];
+char g_fcCodeVersion[kVpdLineSize];
+char g_flashImageVersion[kVpdLineSize];
+char g_assetTag[kVpdLineSize];
+char g_UUID[kVpdLineSize];
+char g_I2CUUID[kVpdLineSize];
+char g_endTag[kVpdLineSize];
+char g_optionROMBIOS[kVpdLineSize];
+char g_optionROMEFI[kVpdLineSize];
+char g_optionROMFCode[kVpdLineSize];
+char g_optionROMFirmware[kVpdLineSize];
+
+namespace {
+
+// Tags of the VPD stream; everything else is a two-letter keyword.
+constexpr unsigned char kTagIdentifier = 0x82;
+constexpr unsigned char kTagReadOnly = 0x90;
+constexpr unsigned char kTagWritable = 0x91;
+constexpr unsigned char kTagEnd = 0x78;
+constexpr unsigned char kFiller = 0x00;
+
+// Every tag and keyword header is three bytes: the tag and a 16-bit length,
+// or the two letters and an 8-bit length.
+constexpr std::size_t kHeaderSize = 3;
+
+// Room of the local copy that trimmed values go through.
+constexpr std::size_t kValueCopySize = 256;
+
+// How a keyword's value becomes its line.
+enum class ValueForm {
+    Text,     // label and the value bytes as they stand
+    Trimmed,  // label and the value, trimmed of blanks
+    Version,  // label and the six digits "MMmmss" as "M.m.s"
+    Byte,     // label and the first value byte in two hex digits
+};
+
+struct KeywordRow {
+    char keyword[3];
+    char* line;          // null: decoded into a local line and dropped
+    char const* label;
+    ValueForm form;
+};
+
+// In the order the keywords are matched.
+KeywordRow const kKeywords[] = {
+    {"RV", nullptr, "Checksum & Reserved: ", ValueForm::Byte},
+    {"RW", nullptr, "Remaining RW Data: ", ValueForm::Byte},
+    {"PN", g_partNumber, "Part Number:", ValueForm::Text},
+    {"EC", nullptr, "Engineering Date Code:", ValueForm::Text},
+    {"SN", g_serialNumber, "Serial Number:", ValueForm::Text},
+    {"V0", g_miscInfo, "Miscellaneous Information:", ValueForm::Text},
+    {"V2", nullptr, "Manufacturing Date Code:", ValueForm::Text},
+    {"MN", g_manufacturingId, "Manufacturing Id:", ValueForm::Text},
+    {"V1", g_efiVersion, "EFI Driver Version:", ValueForm::Trimmed},
+    {"V3", g_fwVersion, "Firmware Version:", ValueForm::Trimmed},
+    {"V4", g_biosVersion, "BIOS Version:", ValueForm::Trimmed},
+    {"V5", g_fcodeVersion, "FCode Version:", ValueForm::Trimmed},
+    {"RM", g_flashImageVersion, "Flash Image Version:", ValueForm::Trimmed},
+    {"V9", g_flashImageVersion, "Flash Image Version:", ValueForm::Version},
+    {"FC", g_fcCodeVersion, "FC Code:", ValueForm::Text},
+    {"FN", g_fruNumberVersion, "Fru Number:", ValueForm::Text},
+    {"YA", g_assetTag, "Asset Tag:", ValueForm::Text},
+    {"YU", g_UUID, "UUID:", ValueForm::Text},
+};
+
+// "<label><value>" into a line: the value ends at its length or at a zero
+// byte, and the whole is cut to the line's room.
+void writeLine(char* line, char const* label, char const* value, int length) {
+    std::size_t used = safeStrCpy(line, label, kVpdLineSize);
+    std::size_t count = strnlen(value, static_cast<std::size_t>(length));
+    if (count > kVpdLineSize - 1 - used) count = kVpdLineSize - 1 - used;
+    std::memcpy(line + used, value, count);
+    line[used + count] = '\0';
+}
+
+// The value copied into a zeroed local (at most its room less one byte) and
+// trimmed of blanks.
+void trimmedCopy(unsigned char const* value, int length, char (&copy)[kValueCopySize]) {
+    std::memset(copy, 0, sizeof copy);
+    std::size_t count = static_cast<std::size_t>(length);
+    if (count > sizeof copy - 1) count = sizeof copy - 1;
+    std::strncpy(copy, reinterpret_cast<char const*>(value), count);
+    Trim(copy);
+}
+
+void decodeKeyword(KeywordRow const& row, unsigned char const* value, int length) {
+    char dropped[kVpdLineSize];
+    char* line = row.line != nullptr ? row.line : dropped;
+    char copy[kValueCopySize];
+
+    switch (row.form) {
+    case ValueForm::Text:
+        writeLine(line, row.label, reinterpret_cast<char const*>(value), length);
+        break;
+    case ValueForm::Trimmed:
+        trimmedCopy(value, length, copy);
+        writeLine(line, row.label, copy, length);
+        break;
+    case ValueForm::Version: {
+        trimmedCopy(value, length, copy);
+        int major = 0;
+        int minor = 0;
+        int sub = 0;
+        std::sscanf(copy, "%2d%2d%2d", &major, &minor, &sub);
+        char version[40];
+        std::snprintf(version, sizeof version, "%d.%d.%d", major, minor, sub);
+        std::snprintf(line, kVpdLineSize, "%s%s", row.label, version);
+        break;
+    }
+    case ValueForm::Byte:
+        std::snprintf(line, kVpdLineSize, "%s%02X", row.label, length > 0 ? value[0] : 0u);
+        break;
+    }
+}
+
+// Little-endian 16-bit length of an identifier tag.
+std::size_t identifierLength(unsigned char const* tag) {
+    return static_cast<std::size_t>(tag[1]) | (static_cast<std::size_t>(tag[2]) << 8);
+}
+
+}  // namespace
+
+void PrintVPDField(unsigned char const* tag, unsigned char const* value, int length) {
+    if (tag == nullptr) return;
+    // A negative precision would print up to the next zero byte.
+    if (length < 0) length = 0;
+    if (value == nullptr) length = 0;
+    if (length == 0) value = reinterpret_cast<unsigned char const*>("");
+
+    switch (tag[0]) {
+    case kTagIdentifier:
+        writeLine(g_productId, "Product Identifier:", reinterpret_cast<char const*>(value), length);
+        return;
+    case kTagReadOnly:
+        std::snprintf(g_RTag, kVpdLineSize, "VPD-R Tag:");
+        return;
+    case kTagWritable:
+        // Decoded and dropped: nothing reads the writable section's tag.
+        return;
+    case kTagEnd:
+        std::snprintf(g_endTag, kVpdLineSize, "End Tag:");
+        return;
+    default:
+        break;
+    }
+    for (KeywordRow const& row : kKeywords) {
+        if (tag[0] == static_cast<unsigned char>(row.keyword[0]) &&
+            tag[1] == static_cast<unsigned char>(row.keyword[1])) {
+            decodeKeyword(row, value, length);
+            return;
+        }
+    }
+}
+
+void PrintVPD(unsigned char const* vpd, std::size_t size) {
+    if (vpd == nullptr || size == 0) return;
+
+    // Start of the value behind the header at pos, never beyond the end.
+    auto valueAt = [&](std::size_t pos) {
+        return pos + kHeaderSize <= size ? vpd + pos + kHeaderSize : vpd + size;
+    };
+
+    std::size_t pos = 0;
+    if (vpd[pos] == kTagEnd) {
+        PrintVPDField(vpd + pos, valueAt(pos), 0);
+        return;
+    }
+    for (;;) {
+        unsigned char const tag = vpd[pos];
+        if (tag == kTagReadOnly || tag == kTagWritable) {
+            // The section tags open their keywords; their bodies are walked
+            // keyword by keyword.
+            PrintVPDField(vpd + pos, valueAt(pos), 0);
+            pos += kHeaderSize;
+        } else if (tag == kFiller) {
+            pos += kHeaderSize;
+        } else {
+            if (pos + kHeaderSize > size) return;  // header cut by the end
+            std::size_t length = tag == kTagIdentifier ? identifierLength(vpd + pos) : vpd[pos + 2];
+            std::size_t available = size - pos - kHeaderSize;
+            std::size_t shown = length < available ? length : available;
+            PrintVPDField(vpd + pos, vpd + pos + kHeaderSize, static_cast<int>(shown));
+            pos += kHeaderSize + length;
+        }
+        if (pos >= size) return;  // no end tag within the buffer
+        if (vpd[pos] == kTagEnd) {
+            PrintVPDField(vpd + pos, valueAt(pos), 0);
+            return;
+        }
+    }
+}
+
+void PrintVPD(unsigned char* vpd) {
+    PrintVPD(vpd, ZORAP_VPD_BUFFER_SIZE);
+}
+
+int GetHBAVPDData(_tagZORAPSDMDevice* device) {
+    if (device == nullptr) return -1;
+
+    std::uint32_t length = ZORAP_VPD_BUFFER_SIZE;
+    std::memset(g_I2CUUID, 0, sizeof g_I2CUUID);
+
+    char* uuid = nullptr;
+    std::uint32_t uuidLength = 0;
+    if (ZORAP_GetUUIDFromI2CVPD(device, &uuid, &uuidLength) == ZORAP_OK && uuid != nullptr) {
+        safeStrCpy(g_I2CUUID, uuid, sizeof g_I2CUUID);
+        ZORAP_FreeMem(uuid);
+    }
+
+    // Older chips have no readable VPD.
+    if (GetRSXType(device) < 8) return -1;
+
+    std::size_t const bufferSize = length;
+    auto* buffer = static_cast<unsigned char*>(CoreZMalloc(bufferSize));
+    if (buffer == nullptr) return -1;
+
+    ZORAP_STATUS status = ZORAP_GetVpd(device->deviceHandle, 0, buffer, &length);
+    if (status == ZORAP_OK) PrintVPD(buffer, bufferSize);
+
+    CoreFree(buffer);
+    return static_cast<int>(status);
+}
+
+void GetHBAOptionROMVersions(_tagZORAPSDMDevice* device) {
+    if (GetRSXType(device) < 6) return;
+
+    // The record's text need not be terminated within its field.
+    char biosText[sizeof device->biosVersionText + 1];
+    std::memcpy(biosText, device->biosVersionText, sizeof device->biosVersionText);
+    biosText[sizeof device->biosVersionText] = '\0';
+    char bios[64] = {};
+    CleanStr(biosText, bios, sizeof bios);
+    std::snprintf(g_optionROMBIOS, kVpdLineSize, "OptionROM BIOS Version:%s", bios);
+
+    std::uint32_t const mask = device->optionRomMask;
+    char version[32];
+
+    if ((mask & ZORAP_OPTROM_FCODE) == 0)
+        std::snprintf(version, sizeof version, "N/A");
+    else if (GetRSX4GbOrNewerType(device) == 0)
+        std::snprintf(version, sizeof version, "%d.%02d.%02d", device->fcodeVersion[0],
+                      device->fcodeVersion[1], device->fcodeVersion[2]);
+    else
+        std::snprintf(version, sizeof version, "%d.%02d", device->fcodeVersion[0],
+                      device->fcodeVersion[1]);
+    std::snprintf(g_optionROMFCode, kVpdLineSize, "OptionROM FCode Version:%s", version);
+
+    if ((mask & ZORAP_OPTROM_EFI) == 0)
+        std::snprintf(version, sizeof version, "N/A");
+    else
+        std::snprintf(version, sizeof version, "%d.%02d", device->efiVersion[0],
+                      device->efiVersion[1]);
+    std::snprintf(g_optionROMEFI, kVpdLineSize, "OptionROM EFI Version:%s", version);
+
+    if ((mask & ZORAP_OPTROM_FIRMWARE) == 0)
+        std::snprintf(version, sizeof version, "N/A");
+    else
+        std::snprintf(version, sizeof version, "%d.%02d.%02d", device->firmwareVersion[0],
+                      device->firmwareVersion[1], device->firmwareVersion[2]);
+    std::snprintf(g_optionROMFirmware, kVpdLineSize, "OptionROM Firmware Version:%s", version);
+}
