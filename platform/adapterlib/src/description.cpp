@@ -6,6 +6,8 @@
 #include <nlohmann/json.hpp>
 
 #include <cctype>
+#include <cerrno>
+#include <cstdio>
 #include <cstdlib>
 #include <initializer_list>
 #include <set>
@@ -639,13 +641,11 @@ Host parseDescription(const std::string& jsonText) {
             h.adapters.push_back(readAdapter(an, i));
         }
     }
-    // Device handles, and the uniqueness the per-interface calls rely on.
-    uint32_t handle = 0x100;
+    // The per-interface calls find a NIC function by its name alone.
     std::set<std::string> interfaces;
     for (size_t i = 0; i < h.adapters.size(); ++i)
         for (auto& port : h.adapters[i].ports)
             for (auto& p : port.protocols) {
-                if (p.isFc()) p.fc.handle = handle++;
                 if (p.isNic() && !interfaces.insert(p.nic.interfaceName).second)
                     fail("$.adapters[" + std::to_string(i) + "]",
                          "interface \"" + p.nic.interfaceName + "\" is given twice");

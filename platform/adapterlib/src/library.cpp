@@ -21,8 +21,10 @@
 #include <cstring>
 #include <fstream>
 #include <list>
+#include <map>
 #include <mutex>
 #include <new>
+#include <set>
 #include <sstream>
 #include <thread>
 #include <unordered_set>
@@ -228,8 +230,33 @@ public:
         if (traceMask) std::fprintf(stderr, "zorap: %s\n", text.c_str());
     }
 
+    // Device handles stay with a function (its port and node WWN) across
+    // reloads, so a caller holding an older tree still reaches the same port.
+    std::map<std::pair<Wwn, Wwn>, uint32_t> handles;
+    uint32_t nextHandle = 0x100;
+
+    void assignHandles(Host& h) {
+        std::set<uint32_t> used;
+        for (auto& a : h.adapters)
+            for (auto& p : a.ports)
+                for (auto& q : p.protocols) {
+                    if (!q.isFc()) continue;
+                    auto key = std::make_pair(q.fc.portWwn, q.fc.nodeWwn);
+                    auto it = handles.find(key);
+                    if (it == handles.end() || used.count(it->second)) {
+                        uint32_t h2 = nextHandle++;
+                        if (it == handles.end()) handles.emplace(key, h2);
+                        q.fc.handle = h2;
+                    } else {
+                        q.fc.handle = it->second;
+                    }
+                    used.insert(q.fc.handle);
+                }
+    }
+
     // Install a freshly read description (mu held).
     void install(Loaded&& l, bool markChanged) {
+        assignHandles(l.host);
         model = std::move(l.host);
         modelPath = l.path;
         loadedStamp = notedStamp = l.stamp;

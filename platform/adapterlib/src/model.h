@@ -63,7 +63,7 @@ struct Target {
 using FcStats = std::array<uint32_t, 9>;
 
 struct FcFunction {
-    uint32_t handle = 0;  // assigned at load
+    uint32_t handle = 0;  // assigned by the library when the description is installed
     uint32_t portIndex = 0;
     Wwn nodeWwn{}, portWwn{};
     uint8_t stateCode = 1;  // live

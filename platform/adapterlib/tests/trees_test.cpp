@@ -58,6 +58,24 @@ TEST_F(SimTest, BackupIsBuiltAsideAndSwapMakesItMain) {
     EXPECT_EQ("NEW-1", firstSerial());
 }
 
+TEST_F(SimTest, DeviceHandlesStayWithTheirPortAcrossReloads) {
+    uint32_t first = device(0, 0)->deviceHandle;
+    uint32_t second = device(0, 1)->deviceHandle;
+    // The second port now comes first, beside a port never seen before.
+    ASSERT_EQ(0, zorap_sim_load_json(R"({"adapters":[{"model":"M","serialNumber":"S","chip":"RSX-1620",
+        "ports":[{"protocols":[
+          {"type":"fc","nodeWWN":"30:00:00:00:00:00:00:01","portWWN":"31:00:00:00:00:00:00:02"},
+          {"type":"fc","nodeWWN":"30:00:00:00:00:00:00:01","portWWN":"31:00:00:00:00:00:00:77"}]}]}]})"));
+    ASSERT_EQ(ZORAP_OK, ZORAP_UpdateBackupAdapterList());
+    ASSERT_EQ(ZORAP_OK, ZORAP_SwapBackupToMainAdapterList());
+    EXPECT_EQ(second, device(0, 0)->deviceHandle);
+    uint32_t fresh = device(0, 1)->deviceHandle;
+    EXPECT_NE(first, fresh);
+    EXPECT_NE(second, fresh);
+    _zorap_port_property_t prop{};
+    EXPECT_EQ(ZORAP_ERR_NOT_FOUND, ZORAP_GetHbaDevicePortProperty(first, 0, &prop));
+}
+
 TEST_F(SimTest, ChangedFileIsSeenAndReadByTheNextBackup) {
     std::string path = tempFile(oneAdapter("FILE-1"));
     ASSERT_EQ(0, zorap_sim_load_file(path.c_str()));
