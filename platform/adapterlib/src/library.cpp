@@ -69,6 +69,9 @@ constexpr const char* kFunctionNames[ZORAP_FN_COUNT] = {
 // that still walks one (the alarm thread of a caller may, without a lock).
 constexpr size_t kRetiredTrees = 2;
 
+// A description file larger than this is refused unread.
+constexpr off_t kMaxDescriptionBytes = 16 * 1024 * 1024;
+
 // How long shutdown waits for a running alarm callback.
 constexpr int kCallbackGraceMs = 2000;
 
@@ -141,6 +144,11 @@ Loaded readSource(const Source& src) {
         out.path = src.kind == Source::File ? src.path : defaultPath();
         out.stamp = stampOf(out.path);
         what = "adapter description " + out.path;
+        if (out.stamp.exists && out.stamp.size > kMaxDescriptionBytes) {
+            complain(what + ": larger than 16 MiB; no adapters");
+            out.host.osName = defaultOsName();
+            return out;
+        }
         std::ifstream in(out.path, std::ios::binary);
         if (!in) {
             complain(what + ": cannot be read (" + std::strerror(errno) + "); no adapters");
@@ -154,7 +162,9 @@ Loaded readSource(const Source& src) {
     try {
         out.host = parseDescription(text);
         out.ok = true;
-    } catch (const DescriptionError& e) {
+    } catch (const std::bad_alloc&) {
+        throw;
+    } catch (const std::exception& e) {
         complain(what + ": " + e.what() + "; no adapters");
         out.host = Host{};
         out.host.osName = defaultOsName();
