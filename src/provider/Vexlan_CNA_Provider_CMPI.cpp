@@ -1,0 +1,441 @@
+// The provider object: construction, lifecycle, and the dispatch of instance
+// and method requests by class name. The polling thread is in
+// Vexlan_CNA_Provider_Polling.cpp, the tables in Vexlan_CNA_Provider_Tables.cpp.
+#include "provider/Vexlan_CNA_Provider_CMPI.h"
+
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdlib>
+#include <ctime>
+
+#include "inventory/AdapterFunc.h"
+#include "provider/Vexlan_CNA_Provider_Tables.h"
+#include "support/Vexlan_FC_Utils_CMPI.h"
+#include "support/Vexlan_NIC_Properties.h"
+
+pthread_mutex_t Vexlan_CNA_Provider::provider_lock;
+pthread_mutex_t Vexlan_CNA_Provider::provider_write_lock;
+pthread_mutex_t Vexlan_CNA_Provider::linux_enable_indications_mutex;
+pthread_mutex_t Vexlan_CNA_Provider::properties_file_lock;
+std::atomic<bool> Vexlan_CNA_Provider::m_bIndicationEnabled{false};
+std::atomic<int> Vexlan_CNA_Provider::m_numSubscriptions{0};
+
+std::atomic<Vexlan_CNA_Provider*> g_Vexlan_CNA_Provider{nullptr};
+const int g_SUPPORT_HDR = 1;
+const int g_SupportTRB2xx = 1;
+
+// ---- Locks --------------------------------------------------------------------
+
+void lockProviderMutex(pthread_mutex_t* mutex)
+{
+    // Repeated until it succeeds; a failing call (never seen on a sound mutex)
+    // is retried after a short pause rather than at full speed.
+    while (pthread_mutex_lock(mutex) != 0) {
+        struct timespec pause = {0, 1000000};
+        nanosleep(&pause, nullptr);
+    }
+}
+
+ProviderLockGuard::ProviderLockGuard(pthread_mutex_t* mutex) : mutex_(mutex)
+{
+    lockProviderMutex(mutex_);
+}
+
+ProviderLockGuard::~ProviderLockGuard()
+{
+    pthread_mutex_unlock(mutex_);
+}
+
+namespace {
+
+// A mutex that can't be initialised ends the process.
+void initMutexOrExit(pthread_mutex_t* mutex, const char* logName)
+{
+    int rc = pthread_mutex_init(mutex, nullptr);
+    if (rc != 0) {
+        if (g_EnableLogError)
+            Vexlan_FC_Utils_CMPI::LogError("Error %d Initializing %s mutex", rc, logName);
+        exit(1);
+    }
+}
+
+const char* classNameText(const CmpiObjectPath& cop, CMPIStatus& rc)
+{
+    CMPIObjectPath* enc = cop.getEnc();
+    rc = CMPIStatus{CMPI_RC_OK, nullptr};
+    CMPIString* cls = enc->ft->getClassName(enc, &rc);
+    if (rc.rc != CMPI_RC_OK || cls == nullptr)
+        return nullptr;
+    const char* text = cls->ft->getCharPtr(cls, nullptr);
+    return text != nullptr ? text : "";
+}
+
+// Calls `call(ops)` for the row of each group that the path's class matches,
+// rebuilding the row's list first when the row says so.
+template <class Call>
+void walkRoutes(const CmpiObjectPath& cop, Call&& call)
+{
+    std::size_t count = 0;
+    const InstanceRoute* routes = instanceRoutes(count);
+    const RouteGroup groups[] = {RouteGroup::Always, RouteGroup::SupportHdr, RouteGroup::Nic};
+    for (RouteGroup group : groups) {
+        if (group == RouteGroup::SupportHdr && g_SUPPORT_HDR == 0)
+            continue;
+        for (std::size_t i = 0; i < count; ++i) {
+            const InstanceRoute& route = routes[i];
+            if (route.group != group || !cop.classPathIsA(route.className))
+                continue;
+            if (route.rebuild != nullptr) {
+                route.rebuild->remove();
+                route.rebuild->build();
+            }
+            call(route.ops);
+            break;
+        }
+    }
+}
+
+// The common flow of enumInstanceNames, enumInstances and getInstance, under
+// provider_lock from the first step to the last.
+template <class Call>
+CmpiStatus dispatchInstanceRequest(const char* name, CmpiResult& rslt, const CmpiObjectPath& cop, Call&& call)
+{
+    {
+        ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+        try {
+            CMPIStatus rc;
+            const char* className = classNameText(cop, rc);
+            if (rc.rc != CMPI_RC_OK) {
+                if (g_EnableLogError)
+                    Vexlan_FC_Utils_CMPI::LogError("Vexlan_CNA_Provider %s: Error getting classname, status.rc=%d!",
+                                                   name, static_cast<int>(rc.rc));
+                rslt.returnDone();
+                return CmpiStatus(rc);
+            }
+            if (g_EnableDebugPrint)
+                Vexlan_FC_Utils_CMPI::DebugPrint("Entering Vexlan_CNA_Provider %s: classname = %s", name,
+                                                 className != nullptr ? className : "");
+            walkRoutes(cop, call);
+            rslt.returnDone();
+        } catch (const CmpiStatus& st) {
+            if (g_EnableLogError)
+                Vexlan_FC_Utils_CMPI::LogError("Vexlan_CNA_Provider %s caught exception status: %d %s", name,
+                                               static_cast<int>(st.rc()), st.msg() != nullptr ? st.msg() : "");
+            rslt.returnDone();
+            return st;
+        } catch (...) {
+            if (g_EnableLogError)
+                Vexlan_FC_Utils_CMPI::LogError("Vexlan_CNA_Provider %s detected an unknown exception", name);
+            rslt.returnDone();
+            std::string text = std::string("Vexlan_CNA_Provider ") + name + " detected an unknown exception";
+            return CmpiStatus(CMPI_RC_ERR_FAILED, text.c_str());
+        }
+    }
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("Exiting  Vexlan_CNA_Provider %s\n", name);
+    return CmpiStatus(CMPI_RC_OK);
+}
+
+}  // namespace
+
+// ---- Construction and lifecycle ---------------------------------------------------
+
+Vexlan_CNA_Provider::Vexlan_CNA_Provider(const CmpiBroker& mbp, const CmpiContext& ctx)
+    : CmpiBaseMI(mbp, ctx),
+      CmpiInstanceMI(mbp, ctx),
+      CmpiAssociationMI(mbp, ctx),
+      CmpiIndicationMI(mbp, ctx),
+      CmpiMethodMI(mbp, ctx),
+      initialized(false),
+      initializing(false),
+      pollingEnabled(false),
+      threadArgs()
+{
+    Vexlan_FC_Utils_CMPI::InitializeLogFile();
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("Vexlan_CNA_Provider constructor was called");
+
+    initMutexOrExit(&provider_lock, "provider_lock");
+    initMutexOrExit(&linux_enable_indications_mutex, "enable_indications_mutex");
+    initMutexOrExit(&properties_file_lock, "properties_file_lock");
+    initMutexOrExit(&provider_write_lock, "provider_write_lock");
+
+    // Both log switches off, the configured texts at their defaults, then the
+    // settings file; with the debug log on, the banner and the configuration.
+    LoadProviderProperties();
+
+    // A provider made again in the same process (after the last cleanup)
+    // starts with the subscription gate closed, as a fresh load does.
+    m_bIndicationEnabled = false;
+    m_numSubscriptions = 0;
+
+    initialized = false;
+    initializing = false;
+    pollingEnabled = false;
+}
+
+Vexlan_CNA_Provider::~Vexlan_CNA_Provider()
+{
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider destructor was called *****");
+    pthread_mutex_destroy(&provider_lock);
+    pthread_mutex_destroy(&linux_enable_indications_mutex);
+    pthread_mutex_destroy(&properties_file_lock);
+    pthread_mutex_destroy(&provider_write_lock);
+    Vexlan_CNA_Provider* self = this;
+    g_Vexlan_CNA_Provider.compare_exchange_strong(self, nullptr);
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("Vexlan_CNA_Provider destructor complete");
+}
+
+CmpiContext* Vexlan_CNA_Provider::prepareThreadContext(const CmpiContext& ctx)
+{
+    try {
+        contextHolders_.push_back(std::make_unique<CmpiContext>(broker->prepareAttachThread(ctx)));
+        return contextHolders_.back().get();
+    } catch (...) {
+        return nullptr;
+    }
+}
+
+CmpiStatus Vexlan_CNA_Provider::initialize(const CmpiContext& ctx)
+{
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider initialize was called *****");
+    if (initialized) {
+        if (g_EnableDebugPrint)
+            Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider already initialized *****\n\n");
+        sleep(2);
+        return CmpiStatus(CMPI_RC_OK);
+    }
+    threadArgs.context = prepareThreadContext(ctx);
+    startPollingLoop(ctx);
+    // Gives the new thread time to take provider_lock, so that a request that
+    // follows waits for the first build instead of seeing empty lists.
+    sleep(2);
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider initialize done *****\n\n");
+    return CmpiStatus(CMPI_RC_OK);
+}
+
+CmpiStatus Vexlan_CNA_Provider::cleanup(CmpiContext&)
+{
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider cleanup was called *****");
+    bool started = initializing || initialized;
+    if (initializing) {
+        while (!initialized)
+            sleep(1);
+    }
+    if (started) {
+        stopPollingLoop();
+        cleanupAgent();
+        initialized = false;
+        initializing = false;
+    }
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider cleanup done *****");
+    return CmpiStatus(CMPI_RC_OK);
+}
+
+bool Vexlan_CNA_Provider::isUnloadable() const
+{
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider isUnloadable was called *****");
+    if (gbFlashUpdateInProgress) {
+        if (g_EnableDebugPrint)
+            Vexlan_FC_Utils_CMPI::DebugPrint(
+                "***** Vexlan_CNA_Provider Flash update in progress. So, prevent unloading*****");
+        return false;
+    }
+    return true;
+}
+
+void Vexlan_CNA_Provider::cleanupAgent()
+{
+    ProviderLockGuard lock(&provider_lock);
+    Clear_CNA_List();
+    kPollingSteps.Clear_RegisteredProfile_List();
+    std::size_t count = 0;
+    const ListSequenceRow* rows = listSequence(count);
+    for (std::size_t i = 0; i < count; ++i) {
+        if (rows[i].supportHdr && g_SUPPORT_HDR == 0)
+            continue;
+        rows[i].ops->remove();
+    }
+    ZORAP_UnRegisterAlarmNotificationCallback(kPollingSteps.alarmCallback);
+    ZORAP_Uninitialize();
+}
+
+// ---- Instance requests -------------------------------------------------------------
+
+CmpiStatus Vexlan_CNA_Provider::enumInstanceNames(const CmpiContext& ctx, CmpiResult& rslt,
+                                                  const CmpiObjectPath& cop)
+{
+    return dispatchInstanceRequest("enumInstanceNames", rslt, cop,
+                                   [&](const ClassOps& ops) { ops.enumInstanceNames(ctx, rslt, cop); });
+}
+
+CmpiStatus Vexlan_CNA_Provider::enumInstances(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& cop,
+                                              const char** properties)
+{
+    return dispatchInstanceRequest("enumInstances", rslt, cop,
+                                   [&](const ClassOps& ops) { ops.enumInstances(ctx, rslt, cop, properties); });
+}
+
+CmpiStatus Vexlan_CNA_Provider::getInstance(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& cop,
+                                            const char** properties)
+{
+    return dispatchInstanceRequest("getInstance", rslt, cop,
+                                   [&](const ClassOps& ops) { ops.getInstance(ctx, rslt, cop, properties, true); });
+}
+
+CmpiStatus Vexlan_CNA_Provider::createInstance(const CmpiContext&, CmpiResult&, const CmpiObjectPath&,
+                                               const CmpiInstance&)
+{
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("Vexlan_CNA_Provider createInstance was called but NOT SUPPORTED");
+    return CmpiStatus(CMPI_RC_ERR_NOT_SUPPORTED, "Vexlan_CNA_Provider cannot create");
+}
+
+CmpiStatus Vexlan_CNA_Provider::setInstance(const CmpiContext&, CmpiResult&, const CmpiObjectPath&,
+                                            const CmpiInstance&, const char**)
+{
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("Vexlan_CNA_Provider setInstance was called but NOT SUPPORTED");
+    // Waits for any running request and any running backup enumeration.
+    {
+        ProviderLockGuard outer(&provider_lock);
+        ProviderLockGuard inner(&provider_write_lock);
+    }
+    return CmpiStatus(CMPI_RC_ERR_NOT_SUPPORTED, "Vexlan_CNA_Provider cannot set");
+}
+
+CmpiStatus Vexlan_CNA_Provider::deleteInstance(const CmpiContext&, CmpiResult&, const CmpiObjectPath&)
+{
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("Vexlan_CNA_Provider deleteInstance was called but NOT SUPPORTED");
+    return CmpiStatus(CMPI_RC_ERR_NOT_SUPPORTED, "Vexlan_CNA_Provider cannot delete");
+}
+
+// ---- Methods --------------------------------------------------------------------------
+
+CmpiStatus Vexlan_CNA_Provider::invokeMethod(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& ref,
+                                             const char* methodName, const CmpiArgs& in, CmpiArgs& out)
+{
+    // Up to five rounds of 2 seconds for the first build; the call goes on
+    // after them whether it has finished or not.
+    for (int round = 0; round < 5; ++round) {
+        if (!initialized) {
+            if (g_EnableDebugPrint)
+                Vexlan_FC_Utils_CMPI::DebugPrint("invokeMethod is waiting for the provider to initialize...");
+            sleep(2);
+        }
+    }
+    {
+        // An exception out of a method passes to the wrapper, which turns it
+        // into the status; the guards release both locks on the way.
+        ProviderLockGuard outer(&provider_lock);
+        ProviderLockGuard inner(&provider_write_lock);
+        CMPIStatus rc;
+        const char* className = classNameText(ref, rc);
+        if (rc.rc != CMPI_RC_OK) {
+            if (g_EnableLogError)
+                Vexlan_FC_Utils_CMPI::LogError("Vexlan_CNA_Provider: invokeMethod error getting ClassName\n");
+            rslt.returnDone();
+            return CmpiStatus(rc);
+        }
+        if (g_EnableDebugPrint)
+            Vexlan_FC_Utils_CMPI::DebugPrint("Entering Vexlan_CNA_Provider invokeMethod: classname = %s, MethodName=%s",
+                                             className != nullptr ? className : "",
+                                             methodName != nullptr ? methodName : "");
+        std::size_t count = 0;
+        const MethodRoute* routes = methodRoutes(count);
+        for (std::size_t i = 0; i < count; ++i) {
+            if (ref.classPathIsA(routes[i].className)) {
+                routes[i].invokeMethod(ctx, rslt, ref, methodName, in, out);
+                break;
+            }
+        }
+        rslt.returnDone();
+    }
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("Exiting  Vexlan_CNA_Provider invokeMethod\n");
+    return CmpiStatus(CMPI_RC_OK);
+}
+
+// ---- Associations ---------------------------------------------------------------------
+// The association modules are routed by their own table; until they exist every
+// traversal answers nothing, with success, under provider_lock.
+
+namespace {
+CmpiStatus emptyTraversal(CmpiResult& rslt)
+{
+    ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+    rslt.returnDone();
+    return CmpiStatus(CMPI_RC_OK);
+}
+}  // namespace
+
+CmpiStatus Vexlan_CNA_Provider::associators(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath&,
+                                            const char*, const char*, const char*, const char*, const char**)
+{
+    return emptyTraversal(rslt);
+}
+
+CmpiStatus Vexlan_CNA_Provider::associatorNames(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath&,
+                                                const char*, const char*, const char*, const char*)
+{
+    return emptyTraversal(rslt);
+}
+
+CmpiStatus Vexlan_CNA_Provider::references(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath&,
+                                           const char*, const char*, const char**)
+{
+    return emptyTraversal(rslt);
+}
+
+CmpiStatus Vexlan_CNA_Provider::referenceNames(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath&,
+                                               const char*, const char*)
+{
+    return emptyTraversal(rslt);
+}
+
+// ---- Indications ------------------------------------------------------------------------
+// Every filter is accepted; the subscription gate itself comes with the
+// indications.
+
+CmpiStatus Vexlan_CNA_Provider::authorizeFilter(const CmpiContext&, const CmpiSelectExp&, const char*,
+                                                const CmpiObjectPath&, const char*)
+{
+    return CmpiStatus(CMPI_RC_OK);
+}
+
+CmpiStatus Vexlan_CNA_Provider::mustPoll(const CmpiContext&, const CmpiSelectExp&, const char*,
+                                         const CmpiObjectPath&)
+{
+    return CmpiStatus(CMPI_RC_OK);
+}
+
+CmpiStatus Vexlan_CNA_Provider::activateFilter(const CmpiContext&, const CmpiSelectExp&, const char*,
+                                               const CmpiObjectPath&, CMPIBoolean)
+{
+    return CmpiStatus(CMPI_RC_OK);
+}
+
+CmpiStatus Vexlan_CNA_Provider::deActivateFilter(const CmpiContext&, const CmpiSelectExp&, const char*,
+                                                 const CmpiObjectPath&, CMPIBoolean)
+{
+    return CmpiStatus(CMPI_RC_OK);
+}
+
+CmpiStatus Vexlan_CNA_Provider::enableIndications()
+{
+    return CmpiStatus(CMPI_RC_OK);
+}
+
+CmpiStatus Vexlan_CNA_Provider::disableIndications()
+{
+    return CmpiStatus(CMPI_RC_OK);
+}

@@ -1,0 +1,330 @@
+// The provider's tables: which module serves which class, in which order the
+// polling thread builds and removes the lists, and the modules that later work
+// builds (bound to one shared placeholder until then).
+//
+// The order of every table is the behaviour: a request walks the routes from
+// the top, group by group; the polling thread walks the list sequence from
+// the top (and removes in the same order).
+#include "provider/Vexlan_CNA_Provider_Tables.h"
+
+#include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
+#include "provider/Vexlan_CNA_Provider_CMPI.h"
+
+namespace {
+
+// ---- The shared placeholder -------------------------------------------------
+// What a module not built yet answers: nothing, with success.
+CmpiStatus placeholderEnumInstanceNames(const CmpiContext&, CmpiResult&, const CmpiObjectPath&)
+{
+    return CmpiStatus(CMPI_RC_OK);
+}
+CmpiStatus placeholderEnumInstances(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char**)
+{
+    return CmpiStatus(CMPI_RC_OK);
+}
+CmpiStatus placeholderGetInstance(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char**, bool)
+{
+    return CmpiStatus(CMPI_RC_OK);
+}
+CmpiStatus placeholderInvokeMethod(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char*,
+                                   const CmpiArgs&, CmpiArgs&)
+{
+    return CmpiStatus(CMPI_RC_OK);
+}
+void placeholderListOp() {}
+void placeholderStep() {}
+void placeholderLinkWatch(ThreadArgs&) {}
+int placeholderAlarm(unsigned int, int, int, unsigned char*)
+{
+    return 0;
+}
+
+constexpr ClassOps kPlaceholder = {placeholderEnumInstanceNames, placeholderEnumInstances, placeholderGetInstance};
+constexpr ListOps kNoList = {placeholderListOp, placeholderListOp};
+
+// ---- Modules built -----------------------------------------------------------
+namespace ops {
+constexpr ClassOps ComputerSystem = CLASS_OPS(ComputerSystem);
+}  // namespace ops
+
+namespace lists {
+constexpr ListOps ComputerSystem = {::removeComputerSystem, ::buildComputerSystem};
+}  // namespace lists
+
+// ---- Modules not built yet ---------------------------------------------------
+// Every class and association module, list and method that later work builds
+// stands here once, bound to the shared placeholder: routes answer empty with
+// success, lists build and remove nothing. When a module is written, replace
+// its line here (and only here) by its real operations, for example
+//     constexpr ClassOps FCPort = CLASS_OPS(FCPort);
+//     constexpr ListOps FCPortList = {::removeFCPortList, ::buildFCPortList};
+// and include its header above. The tables below name these constants.
+namespace ops {
+constexpr ClassOps FCPort = kPlaceholder;
+constexpr ClassOps PortController = kPlaceholder;
+constexpr ClassOps FCPortStatistics = kPlaceholder;
+constexpr ClassOps LogicalPortGroup = kPlaceholder;
+constexpr ClassOps PhysicalPackage = kPlaceholder;
+constexpr ClassOps Product = kPlaceholder;
+constexpr ClassOps SCSIProtocolController = kPlaceholder;
+constexpr ClassOps SoftwareIdentity = kPlaceholder;
+constexpr ClassOps AssocComputerSystemPortController = kPlaceholder;
+constexpr ClassOps AssocComputerSystemSCSIProtocolController = kPlaceholder;
+constexpr ClassOps AssocComputerSystemFCPort = kPlaceholder;
+constexpr ClassOps AssocComputerSystemLogicalPortGroup = kPlaceholder;
+constexpr ClassOps AssocComputerSystemSoftwareIdentity = kPlaceholder;
+constexpr ClassOps AssocSoftwareIdentityPortController = kPlaceholder;
+constexpr ClassOps AssocPhysicalPackagePortController = kPlaceholder;
+constexpr ClassOps AssocPhysicalConnectorFCPort = kPlaceholder;
+constexpr ClassOps AssocPhysicalPortFCPort = kPlaceholder;
+constexpr ClassOps AssocPortControllerFCPort = kPlaceholder;
+constexpr ClassOps AssocPortControllerSoftwareInstallationService = kPlaceholder;
+constexpr ClassOps AssocLogicalPortGroupFCPort = kPlaceholder;
+constexpr ClassOps AssocFCPortFCPortStatistics = kPlaceholder;
+constexpr ClassOps AssocProductPhysicalPackage = kPlaceholder;
+constexpr ClassOps AssocSCSIProtocolControllerFCPort = kPlaceholder;
+constexpr ClassOps ObjectManager = kPlaceholder;
+constexpr ClassOps CIMXMLCommMech = kPlaceholder;
+constexpr ClassOps AssocComputerSystemObjectManager = kPlaceholder;
+constexpr ClassOps AssocObjectManagerCommMech = kPlaceholder;
+constexpr ClassOps AssocComputerSystemCommMech = kPlaceholder;
+constexpr ClassOps Namespace = kPlaceholder;
+constexpr ClassOps AssocObjectManagerNamespace = kPlaceholder;
+constexpr ClassOps PhysicalConnector = kPlaceholder;
+constexpr ClassOps PhysicalPort = kPlaceholder;
+constexpr ClassOps AssocPhysicalPackagePhysicalConnector = kPlaceholder;
+constexpr ClassOps AssocPhysicalPackagePhysicalPort = kPlaceholder;
+constexpr ClassOps SoftwareInstallationService = kPlaceholder;
+constexpr ClassOps SoftwareInstallationServiceCapabilities = kPlaceholder;
+constexpr ClassOps AssocSoftwareIdentitySoftwareInstallationService = kPlaceholder;
+constexpr ClassOps AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities = kPlaceholder;
+constexpr ClassOps AssocComputerSystemSoftwareInstallationService = kPlaceholder;
+constexpr ClassOps ConcreteJob = kPlaceholder;
+constexpr ClassOps StorageExtent = kPlaceholder;
+constexpr ClassOps SCSIProtocolEndpointHBA = kPlaceholder;
+constexpr ClassOps SCSIProtocolEndpointTarget = kPlaceholder;
+constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointHBA = kPlaceholder;
+constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointTarget = kPlaceholder;
+constexpr ClassOps AssocComputerSystemStorageExtent = kPlaceholder;
+constexpr ClassOps AssocFCPortSCSIProtocolEndpointHBA = kPlaceholder;
+constexpr ClassOps EthernetPort = kPlaceholder;
+constexpr ClassOps Nic_PortController = kPlaceholder;
+constexpr ClassOps LANEndPoint = kPlaceholder;
+constexpr ClassOps Nic_RegisteredProfile = kPlaceholder;
+constexpr ClassOps Nic_SoftwareIdentity = kPlaceholder;
+constexpr ClassOps NetworkPort = kPlaceholder;
+constexpr ClassOps IPProtocolEndPointCapabilities = kPlaceholder;
+constexpr ClassOps Nic_SoftwareInstallationService = kPlaceholder;
+constexpr ClassOps Nic_SoftwareInstallationServiceCapabilities = kPlaceholder;
+constexpr ClassOps IPProtocolEndPoint = kPlaceholder;
+constexpr ClassOps Nic_AssocComputerSystemPortController = kPlaceholder;
+constexpr ClassOps AssocComputerSystemEthernetPort = kPlaceholder;
+constexpr ClassOps AssocPortControllerEthernetPort = kPlaceholder;
+constexpr ClassOps AssocPhysicalConnectorEthernetPort = kPlaceholder;
+constexpr ClassOps AssocPhysicalPortEthernetPort = kPlaceholder;
+constexpr ClassOps Nic_AssocPhysicalPackagePortController = kPlaceholder;
+constexpr ClassOps AssocEthernetPortLANEndPoint = kPlaceholder;
+constexpr ClassOps AssocComputerSystemLANEndPoint = kPlaceholder;
+constexpr ClassOps AssocElementConformsToRegisteredProfile = kPlaceholder;
+constexpr ClassOps Nic_AssocSoftwareIdentityPortController = kPlaceholder;
+constexpr ClassOps AssocComputerSystemNetworkPort = kPlaceholder;
+constexpr ClassOps AssocNetworkPortLANEndPoint = kPlaceholder;
+constexpr ClassOps AssocIPProtocolEndPointCapabilitiesIPProtocolEndPoint = kPlaceholder;
+constexpr ClassOps Nic_AssocComputerSystemSoftwareInstallationService = kPlaceholder;
+constexpr ClassOps Nic_AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities = kPlaceholder;
+constexpr ClassOps Nic_AssocSoftwareIdentitySoftwareInstallationService = kPlaceholder;
+constexpr ClassOps Nic_AssocPortControllerSoftwareInstallationService = kPlaceholder;
+constexpr ClassOps AssocComputerSystemIPProtocolEndPoint = kPlaceholder;
+constexpr ClassOps AssocLANEndPointIPProtocolEndPoint = kPlaceholder;
+constexpr ClassOps Nic_AssocComputerSystemSoftwareIdentity = kPlaceholder;
+}  // namespace ops
+
+namespace lists {
+constexpr ListOps NamespaceList = kNoList;
+constexpr ListOps ObjectManager = kNoList;
+constexpr ListOps FCPortStatisticsList = kNoList;
+constexpr ListOps LogicalPortGroupList = kNoList;
+constexpr ListOps PhysicalPackageList = kNoList;
+constexpr ListOps ProductList = kNoList;
+constexpr ListOps CIMXMLCommMech = kNoList;
+constexpr ListOps RegisteredProfileList = kNoList;
+constexpr ListOps RegisteredSubProfileList = kNoList;
+constexpr ListOps SCSIProtocolControllerList = kNoList;
+constexpr ListOps SoftwareIdentityList = kNoList;
+constexpr ListOps PhysicalConnectorList = kNoList;
+constexpr ListOps PhysicalPortList = kNoList;
+constexpr ListOps SCSIProtocolEndpointHBAList = kNoList;
+constexpr ListOps SCSIProtocolEndpointTargetList = kNoList;
+constexpr ListOps StorageExtentList = kNoList;
+constexpr ListOps FCPortList = kNoList;
+constexpr ListOps PortControllerList = kNoList;
+constexpr ListOps AssocFCPortFCPortStatistics = kNoList;
+constexpr ListOps AssocComputerSystemSCSIProtocolEndpointTarget = kNoList;
+constexpr ListOps AssocComputerSystemStorageExtent = kNoList;
+constexpr ListOps AssocFCPortSCSIProtocolEndpointHBA = kNoList;
+}  // namespace lists
+
+namespace methods {
+constexpr InvokeMethodOp SoftwareInstallationService = placeholderInvokeMethod;
+constexpr InvokeMethodOp Nic_SoftwareInstallationService = placeholderInvokeMethod;
+}  // namespace methods
+
+namespace steps {
+constexpr void (*InitializeRegisteredProfileList)() = placeholderStep;
+constexpr void (*Clear_RegisteredProfile_List)() = placeholderStep;
+constexpr void (*DeserializeConcreteJobToPrefFile)() = placeholderStep;
+constexpr void (*Update_CNA_List)(ThreadArgs&) = placeholderLinkWatch;
+constexpr ZORAP_ALARM_CALLBACK OSSGenerateHostNotificationAlarm = placeholderAlarm;
+}  // namespace steps
+
+// ---- Instance routes -----------------------------------------------------------
+// getInstance walks the same rows: the three NIC rows that it would test in
+// another order (PortControllerEthernetPort, ComputerSystemLANEndpoint,
+// EthernetPortLANEndpoint) name unrelated classes, so one order serves.
+constexpr InstanceRoute kInstanceRoutes[] = {
+    // Group 1, always walked
+    {"Vexlan_Adapter_ComputerSystem", ops::ComputerSystem, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_FCPort", ops::FCPort, &lists::FCPortList, RouteGroup::Always},
+    {"Vexlan_FCHBA_PortController", ops::PortController, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_FCPortStatistics", ops::FCPortStatistics, &lists::FCPortStatisticsList, RouteGroup::Always},
+    {"Vexlan_FCHBA_LogicalPortGroup", ops::LogicalPortGroup, nullptr, RouteGroup::Always},
+    {"Vexlan_Adapter_PhysicalPackage", ops::PhysicalPackage, nullptr, RouteGroup::Always},
+    {"Vexlan_Adapter_Product", ops::Product, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_SCSIProtocolController", ops::SCSIProtocolController, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_SoftwareIdentity", ops::SoftwareIdentity, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_ComputerSystemPortController", ops::AssocComputerSystemPortController, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_ComputerSystemSCSIProtocolController", ops::AssocComputerSystemSCSIProtocolController, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_ComputerSystemFCPort", ops::AssocComputerSystemFCPort, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_ComputerSystemLogicalPortGroup", ops::AssocComputerSystemLogicalPortGroup, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_ComputerSystemSoftwareIdentity", ops::AssocComputerSystemSoftwareIdentity, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_SoftwareIdentityPortController", ops::AssocSoftwareIdentityPortController, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_PhysicalPackagePortController", ops::AssocPhysicalPackagePortController, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_PhysicalConnectorFCPort", ops::AssocPhysicalConnectorFCPort, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_PhysicalPortFCPort", ops::AssocPhysicalPortFCPort, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_PortControllerFCPort", ops::AssocPortControllerFCPort, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_PortControllerSoftwareInstallationService", ops::AssocPortControllerSoftwareInstallationService, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_LogicalPortGroupFCPort", ops::AssocLogicalPortGroupFCPort, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_FCPortFCPortStatistics", ops::AssocFCPortFCPortStatistics, &lists::AssocFCPortFCPortStatistics, RouteGroup::Always},
+    {"Vexlan_Adapter_ProductPhysicalPackage", ops::AssocProductPhysicalPackage, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_SCSIProtocolControllerFCPort", ops::AssocSCSIProtocolControllerFCPort, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_ObjectManager", ops::ObjectManager, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_CIMXMLCommMech", ops::CIMXMLCommMech, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_ComputerSystemObjectManager", ops::AssocComputerSystemObjectManager, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_ObjectManagerCommMech", ops::AssocObjectManagerCommMech, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_ComputerSystemCommMech", ops::AssocComputerSystemCommMech, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_Namespace", ops::Namespace, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_ObjectManagerNamespace", ops::AssocObjectManagerNamespace, nullptr, RouteGroup::Always},
+    {"Vexlan_Adapter_PhysicalConnector", ops::PhysicalConnector, nullptr, RouteGroup::Always},
+    {"Vexlan_Adapter_PhysicalPort", ops::PhysicalPort, nullptr, RouteGroup::Always},
+    {"Vexlan_Adapter_PhysicalPackagePhysicalConnector", ops::AssocPhysicalPackagePhysicalConnector, nullptr, RouteGroup::Always},
+    {"Vexlan_Adapter_PhysicalPackagePhysicalPort", ops::AssocPhysicalPackagePhysicalPort, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_SoftwareInstallationService", ops::SoftwareInstallationService, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_SoftwareInstallationServiceCapabilities", ops::SoftwareInstallationServiceCapabilities, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_SoftwareIdentitySoftwareInstallationService", ops::AssocSoftwareIdentitySoftwareInstallationService, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_SoftwareInstallationServiceSoftwareInstallationServiceCapabilities", ops::AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_ComputerSystemSoftwareInstallationService", ops::AssocComputerSystemSoftwareInstallationService, nullptr, RouteGroup::Always},
+    {"Vexlan_Adapter_ConcreteJob", ops::ConcreteJob, nullptr, RouteGroup::Always},
+    // Group 2, walked only when g_SUPPORT_HDR is not zero
+    {"Vexlan_FCHBA_StorageExtent", ops::StorageExtent, &lists::StorageExtentList, RouteGroup::SupportHdr},
+    {"Vexlan_FCHBA_SCSIProtocolEndpointHBA", ops::SCSIProtocolEndpointHBA, nullptr, RouteGroup::SupportHdr},
+    {"Vexlan_FCHBA_SCSIProtocolEndpointTarget", ops::SCSIProtocolEndpointTarget, &lists::SCSIProtocolEndpointTargetList, RouteGroup::SupportHdr},
+    {"Vexlan_FCHBA_ComputerSystemSCSIProtocolEndpointHBA", ops::AssocComputerSystemSCSIProtocolEndpointHBA, nullptr, RouteGroup::SupportHdr},
+    {"Vexlan_FCHBA_ComputerSystemSCSIProtocolEndpointTarget", ops::AssocComputerSystemSCSIProtocolEndpointTarget, &lists::AssocComputerSystemSCSIProtocolEndpointTarget, RouteGroup::SupportHdr},
+    {"Vexlan_FCHBA_ComputerSystemStorageExtent", ops::AssocComputerSystemStorageExtent, &lists::AssocComputerSystemStorageExtent, RouteGroup::SupportHdr},
+    {"Vexlan_FCHBA_FCPortSCSIProtocolEndpointHBA", ops::AssocFCPortSCSIProtocolEndpointHBA, &lists::AssocFCPortSCSIProtocolEndpointHBA, RouteGroup::SupportHdr},
+    // Group 3, always walked
+    {"Vexlan_NIC_EthernetPort2", ops::EthernetPort, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_PortController", ops::Nic_PortController, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_LANEndpoint", ops::LANEndPoint, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_RegisteredProfile", ops::Nic_RegisteredProfile, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_SoftwareIdentity", ops::Nic_SoftwareIdentity, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_NetworkPort", ops::NetworkPort, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_IPProtocolEndpointCapabilities", ops::IPProtocolEndPointCapabilities, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_SoftwareInstallationService", ops::Nic_SoftwareInstallationService, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_SoftwareInstallationServiceCapabilities", ops::Nic_SoftwareInstallationServiceCapabilities, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_IPProtocolEndpoint", ops::IPProtocolEndPoint, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_ComputerSystemPortController", ops::Nic_AssocComputerSystemPortController, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_ComputerSystemEthernetPort", ops::AssocComputerSystemEthernetPort, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_PortControllerEthernetPort", ops::AssocPortControllerEthernetPort, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_PhysicalConnectorEthernetPort", ops::AssocPhysicalConnectorEthernetPort, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_PhysicalPortEthernetPort", ops::AssocPhysicalPortEthernetPort, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_PhysicalPackagePortController", ops::Nic_AssocPhysicalPackagePortController, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_EthernetPortLANEndpoint", ops::AssocEthernetPortLANEndPoint, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_ComputerSystemLANEndpoint", ops::AssocComputerSystemLANEndPoint, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_ElementConformsToRegisteredProfile", ops::AssocElementConformsToRegisteredProfile, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_SoftwareIdentityPortController", ops::Nic_AssocSoftwareIdentityPortController, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_ComputerSystemNetworkPort", ops::AssocComputerSystemNetworkPort, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_NetworkPortLANEndpoint", ops::AssocNetworkPortLANEndPoint, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_IPProtocolEndpointCapabilitiesIPProtocolEndpoint", ops::AssocIPProtocolEndPointCapabilitiesIPProtocolEndPoint, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_ComputerSystemSoftwareInstallationService", ops::Nic_AssocComputerSystemSoftwareInstallationService, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_SoftwareInstallationServiceSoftwareInstallationServiceCapabilities", ops::Nic_AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_SoftwareIdentitySoftwareInstallationService", ops::Nic_AssocSoftwareIdentitySoftwareInstallationService, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_PortControllerSoftwareInstallationService", ops::Nic_AssocPortControllerSoftwareInstallationService, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_ComputerSystemIPProtocolEndpoint", ops::AssocComputerSystemIPProtocolEndPoint, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_LANEndpointIPProtocolEndpoint", ops::AssocLANEndPointIPProtocolEndPoint, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_ComputerSystemSoftwareIdentity", ops::Nic_AssocComputerSystemSoftwareIdentity, nullptr, RouteGroup::Nic},
+};
+
+// ---- Build sequence ------------------------------------------------------------------
+// Built in this order; removed in this order too (after the NIC adapter list
+// and the NIC profile chain).
+constexpr ListSequenceRow kListSequence[] = {
+    {"Namespace", &lists::NamespaceList, false},
+    {"ComputerSystem", &lists::ComputerSystem, false},
+    {"ObjectManager", &lists::ObjectManager, false},
+    {"FCPortStatistics", &lists::FCPortStatisticsList, false},
+    {"LogicalPortGroup", &lists::LogicalPortGroupList, false},
+    {"PhysicalPackage", &lists::PhysicalPackageList, false},
+    {"Product", &lists::ProductList, false},
+    {"CIMXMLCommMech", &lists::CIMXMLCommMech, false},
+    {"RegisteredProfile", &lists::RegisteredProfileList, false},
+    {"RegisteredSubProfile", &lists::RegisteredSubProfileList, false},
+    {"SCSIProtocolController", &lists::SCSIProtocolControllerList, false},
+    {"SoftwareIdentity", &lists::SoftwareIdentityList, false},
+    {"PhysicalConnector", &lists::PhysicalConnectorList, false},
+    {"PhysicalPort", &lists::PhysicalPortList, false},
+    {"SCSIProtocolEndpointHBA", &lists::SCSIProtocolEndpointHBAList, true},
+    {"SCSIProtocolEndpointTarget", &lists::SCSIProtocolEndpointTargetList, true},
+    {"StorageExtent", &lists::StorageExtentList, true},
+    {"FCPort", &lists::FCPortList, false},
+    {"PortController", &lists::PortControllerList, false},
+};
+
+// ---- Method routes ---------------------------------------------------------------
+constexpr MethodRoute kMethodRoutes[] = {
+    {"Vexlan_FCHBA_SoftwareInstallationService", methods::SoftwareInstallationService},
+    {"Vexlan_NIC_SoftwareInstallationService", methods::Nic_SoftwareInstallationService},
+};
+
+}  // namespace
+
+const PollingSteps kPollingSteps = {
+    steps::InitializeRegisteredProfileList,
+    steps::Clear_RegisteredProfile_List,
+    steps::DeserializeConcreteJobToPrefFile,
+    steps::Update_CNA_List,
+    steps::OSSGenerateHostNotificationAlarm,
+};
+
+const InstanceRoute* instanceRoutes(std::size_t& count)
+{
+    count = sizeof(kInstanceRoutes) / sizeof(kInstanceRoutes[0]);
+    return kInstanceRoutes;
+}
+
+const MethodRoute* methodRoutes(std::size_t& count)
+{
+    count = sizeof(kMethodRoutes) / sizeof(kMethodRoutes[0]);
+    return kMethodRoutes;
+}
+
+const ListSequenceRow* listSequence(std::size_t& count)
+{
+    count = sizeof(kListSequence) / sizeof(kListSequence[0]);
+    return kListSequence;
+}
+
+bool isPlaceholder(const ClassOps& ops)
+{
+    return ops.enumInstances == kPlaceholder.enumInstances;
+}

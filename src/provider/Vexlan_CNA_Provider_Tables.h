@@ -1,0 +1,96 @@
+// The tables that drive the provider: the routes of the instance and method
+// requests by class name, the sequence in which the polling thread builds and
+// removes the lists, and the steps of other subsystems that the polling
+// thread and cleanupAgent call. Vexlan_CNA_Provider_Tables.cpp holds them and
+// the one section that lists the modules not built yet.
+#ifndef VEXLAN_PROVIDER_VEXLAN_CNA_PROVIDER_TABLES_H
+#define VEXLAN_PROVIDER_VEXLAN_CNA_PROVIDER_TABLES_H
+
+#include <cstddef>
+
+#include "CmpiImpl.h"
+#include "zorap_cna.h"
+
+struct ThreadArgs;
+
+using EnumInstanceNamesOp = CmpiStatus (*)(const CmpiContext&, CmpiResult&, const CmpiObjectPath&);
+using EnumInstancesOp = CmpiStatus (*)(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char**);
+// getInstance_X with its sendInstance argument; the dispatcher passes true.
+using GetInstanceOp = CmpiStatus (*)(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char**,
+                                     bool);
+using InvokeMethodOp = CmpiStatus (*)(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char*,
+                                      const CmpiArgs&, CmpiArgs&);
+
+// The three request operations of one class or association module.
+struct ClassOps {
+    EnumInstanceNamesOp enumInstanceNames;
+    EnumInstancesOp enumInstances;
+    GetInstanceOp getInstance;
+};
+#define CLASS_OPS(X) ClassOps{::enumInstanceNames_##X, ::enumInstances_##X, ::getInstance_##X}
+
+// For a module whose getInstance_X has no sendInstance argument:
+//     ClassOps{::enumInstanceNames_X, ::enumInstances_X, withoutSendFlag<::getInstance_X>}
+template <CmpiStatus (*Get)(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char**)>
+CmpiStatus withoutSendFlag(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& cop,
+                           const char** properties, bool)
+{
+    return Get(ctx, rslt, cop, properties);
+}
+
+// The remove and build operations of one list.
+struct ListOps {
+    void (*remove)();
+    void (*build)();
+};
+
+// The three groups of routes, walked in this order; a match ends its group,
+// not the request.
+enum class RouteGroup {
+    Always,      // group 1
+    SupportHdr,  // group 2, walked only when g_SUPPORT_HDR is not zero
+    Nic,         // group 3
+};
+
+// One row of the instance routes: a request whose path's class is (or
+// derives from) `className` calls `ops`; with `rebuild` set, the list is
+// removed and built again right before, so that the request sees fresh data.
+struct InstanceRoute {
+    const char* className;
+    ClassOps ops;
+    const ListOps* rebuild;
+    RouteGroup group;
+};
+
+struct MethodRoute {
+    const char* className;
+    InvokeMethodOp invokeMethod;
+};
+
+// One row of the polling thread's build sequence; the remove sequence is the
+// same order. Rows marked supportHdr count only when g_SUPPORT_HDR is not zero.
+struct ListSequenceRow {
+    const char* name;
+    const ListOps* ops;
+    bool supportHdr;
+};
+
+// The operations of other subsystems that the polling thread and
+// cleanupAgent call around the build sequence.
+struct PollingSteps {
+    void (*InitializeRegisteredProfileList)();
+    void (*Clear_RegisteredProfile_List)();
+    void (*DeserializeConcreteJobToPrefFile)();
+    void (*Update_CNA_List)(ThreadArgs& args);
+    ZORAP_ALARM_CALLBACK alarmCallback;   // OSSGenerateHostNotificationAlarm
+};
+
+const InstanceRoute* instanceRoutes(std::size_t& count);
+const MethodRoute* methodRoutes(std::size_t& count);
+const ListSequenceRow* listSequence(std::size_t& count);
+extern const PollingSteps kPollingSteps;
+
+// True when `ops` is the shared placeholder of a module not built yet.
+bool isPlaceholder(const ClassOps& ops);
+
+#endif
