@@ -44,7 +44,7 @@ int IsIBM11SProductId(char* id) {
 }
 
 char* GetSerialNumberFromIBM11SProductId(char const* id) {
-    static char szProductId[kIdentityTextSize];
+    static thread_local char szProductId[kIdentityTextSize];
     safeStrCpy(szProductId, id != nullptr ? id : "", sizeof szProductId);
     if (IsIBM11SProductId(szProductId))
         std::memmove(szProductId, szProductId + kSerialStart, kProductIdLength - kSerialStart + 1);
@@ -52,7 +52,7 @@ char* GetSerialNumberFromIBM11SProductId(char const* id) {
 }
 
 char* GetPartNumberFromIBM11SProductId(char* id) {
-    static char szProductId[kIdentityTextSize];
+    static thread_local char szProductId[kIdentityTextSize];
     if (!IsIBM11SProductId(id)) return nullptr;
     std::memcpy(szProductId, id + kPartNumberStart, kPartNumberLength);
     szProductId[kPartNumberLength] = '\0';
@@ -60,7 +60,7 @@ char* GetPartNumberFromIBM11SProductId(char* id) {
 }
 
 char* ConvertSerialNumberToUUID(char* serial) {
-    static char sOutput[sizeof kEmptyUuid] = "00000000-0000-0000-0000-000000000000";
+    static thread_local char sOutput[sizeof kEmptyUuid] = "00000000-0000-0000-0000-000000000000";
     if (serial == nullptr) return sOutput;
 
     std::size_t place = 0;
@@ -79,7 +79,7 @@ char* ConvertSerialNumberToUUID(char* serial) {
 }
 
 char* GetPhysicalPackageTag(char* id) {
-    static char szTag[kIdentityTextSize];
+    static thread_local char szTag[kIdentityTextSize];
     char* uuid = IsIBM11SProductId(id) ? ConvertSerialNumberToUUID(GetSerialNumberFromIBM11SProductId(id))
                                        : ConvertSerialNumberToUUID(id);
     safeStrCpy(szTag, uuid, sizeof szTag);

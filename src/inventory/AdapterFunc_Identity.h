@@ -2,9 +2,9 @@
 // character "11S" product IDs and their serial and part number parts, and the
 // UUID-shaped tag made from a serial.
 //
-// The text results live in static buffers of each function, overwritten by
-// the next call of that function; callers use them at once, under the
-// provider's locks.
+// The text results live in buffers of each function, one per thread,
+// overwritten by the next call of that function on the same thread; callers
+// use them at once.
 #ifndef VEXLAN_INVENTORY_ADAPTERFUNC_IDENTITY_H
 #define VEXLAN_INVENTORY_ADAPTERFUNC_IDENTITY_H
 

@@ -10,8 +10,6 @@
 #include "inventory/AdapterFunc_Chip.h"
 #include "inventory/AdapterFunc_Identity.h"
 
-using decode_test::deviceOfChip;
-
 namespace {
 
 _tagZORAPSDMDevice deviceWithId(std::uint16_t pciDeviceId) {
@@ -59,15 +57,6 @@ TEST(ChipClassification, NullAndUnknownDevices) {
     EXPECT_EQ(GetRSX4GbOrNewerType(&unknown), 1);
     EXPECT_EQ(GetRSX4GbType(&unknown), 0);
     EXPECT_EQ(GetRSX8GbType(&unknown), 0);
-}
-
-TEST(ChipClassification, BoundaryChipsOfTheSerialSource) {
-    _tagZORAPSDMDevice seven = deviceOfChip("RSX-251");
-    _tagZORAPSDMDevice eight = deviceOfChip("RSX-460");
-    EXPECT_EQ(GetRSXType(&seven), 7);
-    EXPECT_EQ(GetRSX4GbOrNewerType(&seven), 0);
-    EXPECT_EQ(GetRSXType(&eight), 8);
-    EXPECT_EQ(GetRSX4GbOrNewerType(&eight), 1);
 }
 
 TEST(ProductIdentity, BrandedModelsIgnoreCase) {

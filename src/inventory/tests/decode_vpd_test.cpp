@@ -66,16 +66,10 @@ TEST_F(VpdWalk, FullStreamFillsEveryLineWithItsLabel) {
     EXPECT_EQ(decode_test::filledVpdBuffers(), 15);
 }
 
-TEST_F(VpdWalk, UntrimmedKeywordsKeepTheirBlanks) {
-    decode(VpdStream().keyword("PN", " VXF 01 ").keyword("SN", "AB  ").end());
+TEST_F(VpdWalk, UntrimmedValuesStandAsTheyAreUpToAZeroByte) {
+    decode(VpdStream().keyword("PN", " VXF 01 ").keyword("SN", std::string("AB\0CD", 5)).end());
     EXPECT_STREQ(g_partNumber, "Part Number: VXF 01 ");
-    EXPECT_STREQ(g_serialNumber, "Serial Number:AB  ");
-}
-
-TEST_F(VpdWalk, ValueStopsAtAZeroByteWithinItsLength) {
-    decode(VpdStream().keyword("SN", std::string("AB\0CD", 5)).keyword("PN", "X").end());
     EXPECT_STREQ(g_serialNumber, "Serial Number:AB");
-    EXPECT_STREQ(g_partNumber, "Part Number:X");
 }
 
 TEST_F(VpdWalk, FlashImageVersionFromEitherKeywordLaterWins) {
@@ -204,14 +198,12 @@ protected:
     }
 };
 
-TEST_F(OptionRom, OldestChipsReadNothing) {
-    _tagZORAPSDMDevice d = device("RSX-241", 7);
-    GetHBAOptionROMVersions(&d);
+TEST_F(OptionRom, OlderChipsShowThreePartFCodeOldestNothing) {
+    _tagZORAPSDMDevice oldest = device("RSX-241", 7);
+    GetHBAOptionROMVersions(&oldest);
     GetHBAOptionROMVersions(nullptr);
     EXPECT_EQ(decode_test::filledVpdBuffers(), 0);
-}
 
-TEST_F(OptionRom, OlderChipsShowThreePartFCode) {
     _tagZORAPSDMDevice d = device("RSX-250", 7);
     GetHBAOptionROMVersions(&d);
     EXPECT_STREQ(g_optionROMBIOS, "OptionROM BIOS Version:3.64");
