@@ -1,0 +1,313 @@
+// Vexlan_FCHBA_FCPort as a class module: a full list, one slot per FC
+// protocol function, each filled from the device's VPD, option ROM, port
+// property record and chip code.
+#include "classes/Vexlan_FC_FCPort_CMPI.h"
+
+#include <cstdarg>
+#include <cstdio>
+#include <cstring>
+
+#include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
+#include "inventory/AdapterFunc_Chip.h"
+#include "inventory/AdapterFunc_Transceiver.h"
+#include "inventory/AdapterFunc_VPD.h"
+#include "support/Vexlan_FC_Utils_CMPI.h"
+
+ClassList<FCPortEntry> g_FCPortList;
+
+namespace {
+
+const char kSystemClassName[] = "Vexlan_Adapter_ComputerSystem";
+const char kClassName[] = "Vexlan_FCHBA_FCPort";
+
+#define debug(...)                                      \
+    do {                                                \
+        if (g_EnableDebugPrint)                         \
+            Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__); \
+    } while (0)
+
+// Appends ";<text>" to a text of `size` bytes, cutting at the end.
+void appendField(char* target, std::size_t size, const char* text)
+{
+    std::size_t used = strnlen(target, size);
+    if (used + 1 < size)
+        FormatFCText(target + used, size - used, ";%s", text);
+}
+
+// The VPD lines that follow product, part number and serial in VPDData, in
+// their order, each only when the VPD had it.
+char* const kOptionalVpdLines[] = {g_fcCodeVersion, g_fruNumberVersion, g_miscInfo,    g_manufacturingId,
+                                   g_efiVersion,    g_fwVersion,         g_biosVersion, g_fcodeVersion};
+
+// The buffers a port build clears before it reads the device's VPD.
+char* const kClearedVpdLines[] = {g_productId,  g_RTag,         g_partNumber,       g_serialNumber,
+                                  g_miscInfo,   g_manufacturingId, g_efiVersion,    g_fwVersion,
+                                  g_biosVersion, g_fcodeVersion, g_fruNumberVersion, g_fcCodeVersion,
+                                  g_flashImageVersion, g_assetTag, g_endTag};
+
+char* const kOptionROMLines[] = {g_optionROMBIOS, g_optionROMEFI, g_optionROMFCode, g_optionROMFirmware};
+
+// VPDData of one device from the freshly decoded buffers.
+void composeVpdData(FCPortEntry& entry, int chipCode)
+{
+    FormatFCText(entry.vpdData, sizeof(entry.vpdData), "%s;%s;%s", g_productId, g_partNumber, g_serialNumber);
+    for (const char* line : kOptionalVpdLines)
+        if (line[0] != '\0')
+            appendField(entry.vpdData, sizeof(entry.vpdData), line);
+    if (IsEnodeMacChipCode(chipCode) && g_flashImageVersion[0] != '\0')
+        appendField(entry.vpdData, sizeof(entry.vpdData), g_flashImageVersion);
+}
+
+// OperationalStatus of the port state code, with the DeviceStatus bits that a
+// loop down sets and an online port clears.
+constexpr std::uint32_t kLoopDownStatusBits = 0x1u | 0x1000u;
+
+void takePortState(_tagZORAPSDMDevice* device, FCPortEntry& entry)
+{
+    switch (device->portStateCode) {
+    case ZORAP_PORT_STATE_ONLINE:
+        debug("Port state ok...");
+        entry.operationalStatus = 2;
+        device->portPropertyIndex &= ~kLoopDownStatusBits;
+        break;
+    case ZORAP_PORT_STATE_LOOPDOWN:
+        debug("Port state - Loopdown...");
+        entry.operationalStatus = 6;
+        device->portPropertyIndex |= kLoopDownStatusBits;
+        break;
+    case ZORAP_PORT_STATE_SUSPENDED:
+        debug("Port state - Suspended...");
+        entry.operationalStatus = 1;
+        break;
+    default:
+        debug("Port state - other ...");
+        entry.operationalStatus = 1;
+        break;
+    }
+}
+
+// Fills one slot from one FC function. `serial` is the build's serial buffer,
+// which keeps its text from one device to the next.
+bool createFCPort(_tagZORAPSDMDevice* device, FCPortEntry& entry, char* serial, std::size_t serialSize)
+{
+    for (char* line : kClearedVpdLines)
+        std::memset(line, 0, kVpdLineSize);
+    std::memset(entry.vpdData, 0, sizeof(entry.vpdData));
+
+    const int chipCode = GetRSXType(device);
+    const int vpdResult = GetHBAVPDData(device);
+    if (vpdResult == 0) {
+        debug("Vexlan_FC_FCPort: createFCPort: VPD data retrieved successfully.");
+        composeVpdData(entry, chipCode);
+    } else {
+        debug("Vexlan_FC_FCPort: createFCPort: Unable to retrieve VPD data!");
+    }
+
+    for (char* line : kOptionROMLines)
+        std::memset(line, 0, kVpdLineSize);
+    std::memset(entry.optionROMVersions, 0, sizeof(entry.optionROMVersions));
+    if (chipCode > 5) {
+        GetHBAOptionROMVersions(device);
+        debug("Vexlan_FC_FCPort: createFCPort: Option ROM versions retrieved.");
+        FormatFCText(entry.optionROMVersions, sizeof(entry.optionROMVersions), "%s;%s;%s;%s", g_optionROMBIOS,
+                      g_optionROMEFI, g_optionROMFCode, g_optionROMFirmware);
+    }
+
+    TakeFCSerial(device, vpdResult, serial, serialSize);
+    char nodeWWN[kFCWWNTextSize];
+    FormatWWN(device->nodeWWN, nodeWWN, sizeof(nodeWWN));
+    FormatWWN(device->portWWN, entry.portWWN, sizeof(entry.portWWN));
+    FormatFCText(entry.deviceId, sizeof(entry.deviceId), "%s_%s_%s", serial, nodeWWN, entry.portWWN);
+    FormatFCText(entry.serialNumber, sizeof(entry.serialNumber), "%s", serial);
+
+    device->portPropertyIndex = 0;
+    if (ZORAP_GetHbaDevicePortProperty(device->deviceHandle, 0, device->portWWN) != 0) {
+        debug("Vexlan_FC_FCPort: Failed to get DevicePortProperty, setting PortStatus & PortType to Unknown...");
+        entry.operationalStatus = 0;
+        entry.portType = 0;
+        entry.speed = 0;
+    } else {
+        takePortState(device, entry);
+        entry.portType = FCPortTypeForCode(device->portTypeCode);
+        entry.speed = FCPortSpeedForCode(device->portSpeedCode, chipCode, entry.speedDescription,
+                                         sizeof(entry.speedDescription));
+    }
+
+    entry.maxSpeed = FCPortMaxSpeed(device);
+    entry.deviceNumber = static_cast<std::uint16_t>(device->portIndex & 0xFFFFu);
+    entry.deviceStatus = device->portPropertyIndex;
+    FormatFCText(entry.model, sizeof(entry.model), "%.*s", static_cast<int>(sizeof(device->modelName)),
+                  device->modelName);
+    entry.macAvailable = TakeENodeMAC(device, entry.macAddress);
+    entry.device = device;
+    return true;
+}
+
+// ---- the class's tables -----------------------------------------------------
+
+const PropertyRow<FCPortEntry> kProperties[] = {
+    {"SystemCreationClassName", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(kSystemClassName))},
+    {"SystemName", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(hostName_ComputerSystem))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(kClassName))},
+    {"DeviceID", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.deviceId))},
+    {"OperationalStatus", CMPI_uint16A, CLASS_VALUE(FCPortEntry, uint16Array({e.operationalStatus}))},
+    {"ActiveFC4Types", CMPI_uint16A, CLASS_VALUE(FCPortEntry, uint16Array({0}))},
+    {"PortType", CMPI_uint16, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint16>(e.portType)))},
+    {"Speed", CMPI_uint64, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint64>(e.speed)))},
+    {"MaxSpeed", CMPI_uint64, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint64>(e.maxSpeed)))},
+    {"PermanentAddress", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.portWWN))},
+    {"LinkTechnology", CMPI_uint16, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint16>(4)))},
+    {"ElementName", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.deviceId))},
+    {"UsageRestriction", CMPI_uint16, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint16>(0)))},
+    {"SupportedMaximumTransmissionUnit", CMPI_uint64, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint64>(0)))},
+    {"VPDData", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.vpdData))},
+    {"OptionROMVersions", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.optionROMVersions))},
+    {"SpeedDescription", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.speedDescription))},
+    {"DeviceNumber", CMPI_uint16, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint16>(e.deviceNumber)))},
+    {"DeviceStatus", CMPI_sint32, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPISint32>(e.deviceStatus)))},
+    {"Model", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.model))},
+    {"ENodeMACAddress", CMPI_string, CLASS_VALUE(FCPortEntry, ENodeMACText(e.macAvailable, e.macAddress))},
+};
+
+const char* const kKeys[] = {"SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID", nullptr};
+
+const ClassModule<FCPortEntry> kFCPort = ClassModule<FCPortEntry>("FCPort")
+                                             .list(g_FCPortList, ListKind::Full)
+                                             .key("DeviceID", [](const FCPortEntry& e) -> const char* { return e.deviceId; })
+                                             .filterKeys(kKeys)
+                                             .pathKeys(kKeys)
+                                             .properties(kProperties);
+
+
+// ---- speeds -------------------------------------------------------------------
+
+struct SpeedRow {
+    std::uint32_t code;
+    std::uint64_t speed;            // bits per second
+    std::uint64_t speedOnEnodeChip; // the same code on chips 15, 17, 21, 26
+    const char* description;        // null: "See Speed"
+};
+
+const SpeedRow kSpeeds[] = {
+    {0, 0, 0, nullptr},
+    {1, 1062500000ull, 1062500000ull, nullptr},
+    {2, 2125000000ull, 2125000000ull, nullptr},
+    {3, 0, 0, "Auto Negotiate"},
+    {4, 4250000000ull, 4250000000ull, nullptr},
+    {8, 8500000000ull, 8500000000ull, nullptr},
+    {10, 10625000000ull, 10625000000ull, nullptr},
+    {16, 17000000000ull, 10625000000ull, nullptr},
+};
+
+// CIM PortType by the library's type code 0..9.
+const std::uint16_t kPortTypes[] = {0, 10, 11, 12, 13, 15, 16, 1, 14, 17};
+
+}  // namespace
+
+// ---- device routines ------------------------------------------------------------
+
+bool IsFCProtocol(_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* protocol)
+{
+    return protocol->protocolType < 2;
+}
+
+int FormatFCText(char* out, std::size_t size, const char* format, ...)
+{
+    if (out == nullptr || size == 0)
+        return 0;
+    va_list args;
+    va_start(args, format);
+    int n = std::vsnprintf(out, size, format, args);
+    va_end(args);
+    return n;
+}
+
+void FormatWWN(const std::uint8_t* wwn, char* out, std::size_t size)
+{
+    FormatFCText(out, size, "%02X%02X%02X%02X%02X%02X%02X%02X", wwn[0], wwn[1], wwn[2], wwn[3], wwn[4], wwn[5],
+                  wwn[6], wwn[7]);
+}
+
+void TakeFCSerial(_tagZORAPSDMDevice* device, int vpdResult, char* serial, std::size_t size)
+{
+    if (GetRSX4GbOrNewerType(device) == 0) {
+        FormatFCText(serial, size, "%.*s", static_cast<int>(sizeof(device->deviceSerial)), device->deviceSerial);
+        return;
+    }
+    if (vpdResult != 0)
+        return;
+    const char* colon = static_cast<const char*>(std::memchr(g_serialNumber, ':', strnlen(g_serialNumber, kVpdLineSize)));
+    if (colon != nullptr)
+        FormatFCText(serial, size, "%s", colon + 1);
+}
+
+std::uint8_t TakeENodeMAC(_tagZORAPSDMDevice* device, std::uint8_t* mac)
+{
+    if (!IsEnodeMacChipCode(GetRSXType(device)))
+        return 0;
+    GetDeviceMacAddress(device, reinterpret_cast<char*>(mac));
+    return 1;
+}
+
+CmpiData ENodeMACText(std::uint8_t macAvailable, const std::uint8_t* mac)
+{
+    if (macAvailable != 1)
+        return CmpiData("Not Available");
+    char text[13];
+    std::snprintf(text, sizeof(text), "%02X%02X%02X%02X%02X%02X", mac[0], mac[1], mac[2], mac[3], mac[4], mac[5]);
+    return CmpiData(text);
+}
+
+std::uint64_t FCPortSpeedForCode(std::uint32_t speedCode, int chipCode, char* description, std::size_t size)
+{
+    const char* text = "See Speed";
+    std::uint64_t speed = 0;
+    for (const SpeedRow& row : kSpeeds) {
+        if (row.code != speedCode)
+            continue;
+        speed = IsEnodeMacChipCode(chipCode) ? row.speedOnEnodeChip : row.speed;
+        if (row.description != nullptr)
+            text = row.description;
+        break;
+    }
+    FormatFCText(description, size, "%s", text);
+    return speed;
+}
+
+std::uint64_t FCPortMaxSpeed(_tagZORAPSDMDevice* device)
+{
+    const int chipCode = GetRSXType(device);
+    if (chipCode == 24 || chipCode == 25)
+        return 17000000000ull;
+    if (IsEnodeMacChipCode(chipCode))
+        return 10625000000ull;
+    if (GetRSX8GbType(device) > 0)
+        return 8500000000ull;
+    if (GetRSX4GbType(device) > 0)
+        return 4250000000ull;
+    return 2125000000ull;
+}
+
+std::uint16_t FCPortTypeForCode(std::uint8_t typeCode)
+{
+    return typeCode < sizeof(kPortTypes) / sizeof(kPortTypes[0]) ? kPortTypes[typeCode] : 0;
+}
+
+// ---- list operations --------------------------------------------------------------
+
+void buildFCPortList()
+{
+    // The serial of a device whose VPD can't be read is the one before it.
+    char serial[256] = {};
+    kFCPort.build(IsFCProtocol, [&](_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* protocol,
+                                    FCPortEntry& entry, int) {
+        return createFCPort(&protocol->fcDevice, entry, serial, sizeof(serial));
+    });
+}
+
+void removeFCPortList()
+{
+    g_FCPortList.remove();
+}
+
+VEXLAN_LIST_CLASS_OPERATIONS(FCPort, kFCPort)
