@@ -8,6 +8,10 @@
 #include "provider/Vexlan_CNA_Provider_Tables.h"
 
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
+#include "classes/Vexlan_FC_FCPortStatistics_CMPI.h"
+#include "classes/Vexlan_FC_FCPort_CMPI.h"
+#include "classes/Vexlan_FC_LogicalPortGroup_CMPI.h"
+#include "classes/Vexlan_FC_PortController_CMPI.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
 
 namespace {
@@ -45,10 +49,18 @@ constexpr ListOps kNoList = {placeholderListOp, placeholderListOp};
 // ---- Modules built -----------------------------------------------------------
 namespace ops {
 constexpr ClassOps ComputerSystem = CLASS_OPS(ComputerSystem);
+constexpr ClassOps FCPort = CLASS_OPS(FCPort);
+constexpr ClassOps PortController = CLASS_OPS(PortController);
+constexpr ClassOps FCPortStatistics = CLASS_OPS(FCPortStatistics);
+constexpr ClassOps LogicalPortGroup = CLASS_OPS(LogicalPortGroup);
 }  // namespace ops
 
 namespace lists {
 constexpr ListOps ComputerSystem = {::removeComputerSystem, ::buildComputerSystem};
+constexpr ListOps FCPortStatisticsList = {::removeFCPortStatisticsList, ::buildFCPortStatisticsList};
+constexpr ListOps LogicalPortGroupList = {::removeLogicalPortGroupList, ::buildLogicalPortGroupList};
+constexpr ListOps FCPortList = {::removeFCPortList, ::buildFCPortList};
+constexpr ListOps PortControllerList = {::removePortControllerList, ::buildPortControllerList};
 }  // namespace lists
 
 // ---- Modules not built yet ---------------------------------------------------
@@ -60,10 +72,6 @@ constexpr ListOps ComputerSystem = {::removeComputerSystem, ::buildComputerSyste
 //     constexpr ListOps FCPortList = {::removeFCPortList, ::buildFCPortList};
 // and include its header above. The tables below name these constants.
 namespace ops {
-constexpr ClassOps FCPort = kPlaceholder;
-constexpr ClassOps PortController = kPlaceholder;
-constexpr ClassOps FCPortStatistics = kPlaceholder;
-constexpr ClassOps LogicalPortGroup = kPlaceholder;
 constexpr ClassOps PhysicalPackage = kPlaceholder;
 constexpr ClassOps Product = kPlaceholder;
 constexpr ClassOps SCSIProtocolController = kPlaceholder;
@@ -142,8 +150,6 @@ constexpr ClassOps Nic_AssocComputerSystemSoftwareIdentity = kPlaceholder;
 namespace lists {
 constexpr ListOps NamespaceList = kNoList;
 constexpr ListOps ObjectManager = kNoList;
-constexpr ListOps FCPortStatisticsList = kNoList;
-constexpr ListOps LogicalPortGroupList = kNoList;
 constexpr ListOps PhysicalPackageList = kNoList;
 constexpr ListOps ProductList = kNoList;
 constexpr ListOps CIMXMLCommMech = kNoList;
@@ -156,8 +162,6 @@ constexpr ListOps PhysicalPortList = kNoList;
 constexpr ListOps SCSIProtocolEndpointHBAList = kNoList;
 constexpr ListOps SCSIProtocolEndpointTargetList = kNoList;
 constexpr ListOps StorageExtentList = kNoList;
-constexpr ListOps FCPortList = kNoList;
-constexpr ListOps PortControllerList = kNoList;
 constexpr ListOps AssocFCPortFCPortStatistics = kNoList;
 constexpr ListOps AssocComputerSystemSCSIProtocolEndpointTarget = kNoList;
 constexpr ListOps AssocComputerSystemStorageExtent = kNoList;
