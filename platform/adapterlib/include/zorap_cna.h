@@ -220,7 +220,8 @@ typedef struct _tagZORAPSDMDevice {
     char     biosVersionText[32];    /* BIOS version text of the option ROM */
     uint16_t transceiverSupport;     /* 1: the port has a pluggable transceiver cage */
     uint16_t reserved0;
-    uint32_t optionRomMask;          /* ZORAP_OPTROM_* bits: which versions are present */
+    uint32_t optionRomMask;          /* ZORAP_OPTROM_* bits: which versions are present;
+                                        bit 0 (the firmware flag) marks firmwareVersion valid */
     uint8_t  firmwareVersion[3];     /* major, minor, sub */
     uint8_t  efiVersion[2];          /* major, minor */
     uint8_t  fcodeVersion[3];        /* major, minor, sub */
@@ -510,6 +511,46 @@ ZORAP_STATIC_ASSERT(ZORAP_PORTPROP_SAME(portTypeCode) && ZORAP_PORTPROP_SAME(por
                         sizeof(_zorap_port_property_t),
                     "port property record layout matches the device record");
 #undef ZORAP_PORTPROP_SAME
+
+/* The named fields of the device record stand in the order of the record. */
+#define ZORAP_BEFORE(t, a, b) (offsetof(t, a) < offsetof(t, b))
+ZORAP_STATIC_ASSERT(ZORAP_BEFORE(_tagZORAPSDMDevice, portPropertyIndex, deviceHandle) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, deviceHandle, portIndex) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, portIndex, pciDeviceId) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, pciDeviceId, subsystemVendorId) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, subsystemVendorId, subsystemDeviceId) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, subsystemDeviceId, nodeWWN) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, nodeWWN, modelName) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, modelName, deviceSerial) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, deviceSerial, biosVersionText) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, biosVersionText, transceiverSupport) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, transceiverSupport, optionRomMask) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, optionRomMask, firmwareVersion) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, firmwareVersion, efiVersion) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, efiVersion, fcodeVersion) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, fcodeVersion, portWWN) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, portWWN, portTypeCode) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, portTypeCode, portStateCode) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, portStateCode, portSpeedCode) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, portSpeedCode, transceiverState) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, transceiverState, statIoCount) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, statCrcErrors, macAddress) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, macAddress, targetCount) &&
+                    ZORAP_BEFORE(_tagZORAPSDMDevice, targetCount, targetList),
+                    "device fields in the order of the record");
+/* The adapter info read by NIC callers: six WWN bytes first, then these. */
+ZORAP_STATIC_ASSERT(offsetof(_zorap_nic_adapter_info_t, nodeWWN) == 0 &&
+                    ZORAP_BEFORE(_zorap_nic_adapter_info_t, modelName, serialNumber) &&
+                    ZORAP_BEFORE(_zorap_nic_adapter_info_t, serialNumber, versionString) &&
+                    ZORAP_BEFORE(_zorap_nic_adapter_info_t, versionString, partNumber),
+                    "adapter info fields in order");
+/* The port info starts with the fields NIC callers read, in this order. */
+ZORAP_STATIC_ASSERT(ZORAP_BEFORE(_zorap_nic_port_info_t, macAddress, interfaceName) &&
+                    ZORAP_BEFORE(_zorap_nic_port_info_t, interfaceName, portNumber) &&
+                    ZORAP_BEFORE(_zorap_nic_port_info_t, portNumber, linkProperties) &&
+                    ZORAP_BEFORE(_zorap_nic_port_info_t, linkProperties, maxTransmissionUnit),
+                    "port info fields in order");
+#undef ZORAP_BEFORE
 
 ZORAP_STATIC_ASSERT(offsetof(_zorap_adapter_t, serialNumber) == 0, "adapter serial first");
 ZORAP_STATIC_ASSERT(offsetof(_zorap_phy_port_t, portNumber) == 0, "port number first");
