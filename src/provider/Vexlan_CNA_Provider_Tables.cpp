@@ -8,6 +8,18 @@
 #include "provider/Vexlan_CNA_Provider_Tables.h"
 
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
+#include "classes/Vexlan_FCHBA_CIMXMLCommMech_CMPI.h"
+#include "classes/Vexlan_FCHBA_Namespace_CMPI.h"
+#include "classes/Vexlan_FCHBA_ObjectManager_CMPI.h"
+#include "classes/Vexlan_FCHBA_RegisteredProfile_CMPI.h"
+#include "classes/Vexlan_FCHBA_RegisteredSubProfile_CMPI.h"
+#include "classes/Vexlan_NIC_EthernetPort.h"
+#include "classes/Vexlan_NIC_IPProtocolEndPoint.h"
+#include "classes/Vexlan_NIC_IPProtocolEndPointCapabilities.h"
+#include "classes/Vexlan_NIC_LANEndPoint.h"
+#include "classes/Vexlan_NIC_NetworkPort.h"
+#include "classes/Vexlan_NIC_PortController.h"
+#include "classes/Vexlan_NIC_RegisteredProfile.h"
 #include "classes/Vexlan_FC_FCPortStatistics_CMPI.h"
 #include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "classes/Vexlan_FC_LogicalPortGroup_CMPI.h"
@@ -49,6 +61,16 @@ constexpr ListOps kNoList = {placeholderListOp, placeholderListOp};
 // ---- Modules built -----------------------------------------------------------
 namespace ops {
 constexpr ClassOps ComputerSystem = CLASS_OPS(ComputerSystem);
+constexpr ClassOps ObjectManager = CLASS_OPS(ObjectManager);
+constexpr ClassOps CIMXMLCommMech = CLASS_OPS(CIMXMLCommMech);
+constexpr ClassOps Namespace = CLASS_OPS(Namespace);
+constexpr ClassOps EthernetPort = CLASS_OPS(EthernetPort);
+constexpr ClassOps Nic_PortController = CLASS_OPS(Nic_PortController);
+constexpr ClassOps LANEndPoint = CLASS_OPS(LANEndPoint);
+constexpr ClassOps Nic_RegisteredProfile = CLASS_OPS(Nic_RegisteredProfile);
+constexpr ClassOps NetworkPort = CLASS_OPS(NetworkPort);
+constexpr ClassOps IPProtocolEndPointCapabilities = CLASS_OPS(IPProtocolEndPointCapabilities);
+constexpr ClassOps IPProtocolEndPoint = CLASS_OPS(IPProtocolEndPoint);
 constexpr ClassOps FCPort = CLASS_OPS(FCPort);
 constexpr ClassOps PortController = CLASS_OPS(PortController);
 constexpr ClassOps FCPortStatistics = CLASS_OPS(FCPortStatistics);
@@ -57,6 +79,11 @@ constexpr ClassOps LogicalPortGroup = CLASS_OPS(LogicalPortGroup);
 
 namespace lists {
 constexpr ListOps ComputerSystem = {::removeComputerSystem, ::buildComputerSystem};
+constexpr ListOps NamespaceList = {::removeNamespaceList, ::buildNamespaceList};
+constexpr ListOps ObjectManager = {::removeObjectManager, ::buildObjectManager};
+constexpr ListOps CIMXMLCommMech = {::removeCIMXMLCommMech, ::buildCIMXMLCommMech};
+constexpr ListOps RegisteredProfileList = {::removeRegisteredProfileList, ::buildRegisteredProfileList};
+constexpr ListOps RegisteredSubProfileList = {::removeRegisteredSubProfileList, ::buildRegisteredSubProfileList};
 constexpr ListOps FCPortStatisticsList = {::removeFCPortStatisticsList, ::buildFCPortStatisticsList};
 constexpr ListOps LogicalPortGroupList = {::removeLogicalPortGroupList, ::buildLogicalPortGroupList};
 constexpr ListOps FCPortList = {::removeFCPortList, ::buildFCPortList};
@@ -91,12 +118,9 @@ constexpr ClassOps AssocLogicalPortGroupFCPort = kPlaceholder;
 constexpr ClassOps AssocFCPortFCPortStatistics = kPlaceholder;
 constexpr ClassOps AssocProductPhysicalPackage = kPlaceholder;
 constexpr ClassOps AssocSCSIProtocolControllerFCPort = kPlaceholder;
-constexpr ClassOps ObjectManager = kPlaceholder;
-constexpr ClassOps CIMXMLCommMech = kPlaceholder;
 constexpr ClassOps AssocComputerSystemObjectManager = kPlaceholder;
 constexpr ClassOps AssocObjectManagerCommMech = kPlaceholder;
 constexpr ClassOps AssocComputerSystemCommMech = kPlaceholder;
-constexpr ClassOps Namespace = kPlaceholder;
 constexpr ClassOps AssocObjectManagerNamespace = kPlaceholder;
 constexpr ClassOps PhysicalConnector = kPlaceholder;
 constexpr ClassOps PhysicalPort = kPlaceholder;
@@ -115,16 +139,9 @@ constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointHBA = kPlaceholder;
 constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointTarget = kPlaceholder;
 constexpr ClassOps AssocComputerSystemStorageExtent = kPlaceholder;
 constexpr ClassOps AssocFCPortSCSIProtocolEndpointHBA = kPlaceholder;
-constexpr ClassOps EthernetPort = kPlaceholder;
-constexpr ClassOps Nic_PortController = kPlaceholder;
-constexpr ClassOps LANEndPoint = kPlaceholder;
-constexpr ClassOps Nic_RegisteredProfile = kPlaceholder;
 constexpr ClassOps Nic_SoftwareIdentity = kPlaceholder;
-constexpr ClassOps NetworkPort = kPlaceholder;
-constexpr ClassOps IPProtocolEndPointCapabilities = kPlaceholder;
 constexpr ClassOps Nic_SoftwareInstallationService = kPlaceholder;
 constexpr ClassOps Nic_SoftwareInstallationServiceCapabilities = kPlaceholder;
-constexpr ClassOps IPProtocolEndPoint = kPlaceholder;
 constexpr ClassOps Nic_AssocComputerSystemPortController = kPlaceholder;
 constexpr ClassOps AssocComputerSystemEthernetPort = kPlaceholder;
 constexpr ClassOps AssocPortControllerEthernetPort = kPlaceholder;
@@ -148,13 +165,8 @@ constexpr ClassOps Nic_AssocComputerSystemSoftwareIdentity = kPlaceholder;
 }  // namespace ops
 
 namespace lists {
-constexpr ListOps NamespaceList = kNoList;
-constexpr ListOps ObjectManager = kNoList;
 constexpr ListOps PhysicalPackageList = kNoList;
 constexpr ListOps ProductList = kNoList;
-constexpr ListOps CIMXMLCommMech = kNoList;
-constexpr ListOps RegisteredProfileList = kNoList;
-constexpr ListOps RegisteredSubProfileList = kNoList;
 constexpr ListOps SCSIProtocolControllerList = kNoList;
 constexpr ListOps SoftwareIdentityList = kNoList;
 constexpr ListOps PhysicalConnectorList = kNoList;
@@ -174,8 +186,8 @@ constexpr InvokeMethodOp Nic_SoftwareInstallationService = placeholderInvokeMeth
 }  // namespace methods
 
 namespace steps {
-constexpr void (*InitializeRegisteredProfileList)() = placeholderStep;
-constexpr void (*Clear_RegisteredProfile_List)() = placeholderStep;
+constexpr void (*InitializeRegisteredProfileList)() = ::InitializeRegisteredProfileList;
+constexpr void (*Clear_RegisteredProfile_List)() = ::Clear_RegisteredProfile_List;
 constexpr void (*DeserializeConcreteJobToPrefFile)() = placeholderStep;
 constexpr void (*Update_CNA_List)(ThreadArgs&) = placeholderLinkWatch;
 constexpr ZORAP_ALARM_CALLBACK OSSGenerateHostNotificationAlarm = placeholderAlarm;
