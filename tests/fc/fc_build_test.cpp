@@ -1,0 +1,415 @@
+// The builds of the FC class lists over adapter descriptions written here:
+// the values each slot takes from the adapter library, and how each list
+// places and counts its slots.
+#include <cstring>
+#include <set>
+#include <string>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include "classes/Vexlan_FC_FCPortStatistics_CMPI.h"
+#include "classes/Vexlan_FC_FCPort_CMPI.h"
+#include "classes/Vexlan_FC_LogicalPortGroup_CMPI.h"
+#include "classes/Vexlan_FC_PortController_CMPI.h"
+#include "fc_test_support.h"
+#include "support/Vexlan_FC_Utils_CMPI.h"
+#include "support/ossimpl-CIM.h"
+#include "zorap_cna.h"
+#include "zorap_sim_control.h"
+
+using fctest::fcAdapter;
+using fctest::fcFunction;
+using fctest::host;
+using fctest::json;
+
+namespace {
+
+class FCBuild : public ::testing::Test {
+protected:
+    void SetUp() override
+    {
+        // No log file is written by these tests.
+        g_EnableDebugPrint = false;
+        g_EnableLogError = false;
+    }
+
+    void TearDown() override
+    {
+        removeFCPortList();
+        removePortControllerList();
+        removeLogicalPortGroupList();
+        removeFCPortStatisticsList();
+        zorap_sim_reset();
+        ZORAP_Uninitialize();
+    }
+
+    static void use(const json& description)
+    {
+        ZORAP_Uninitialize();
+        ASSERT_EQ(0, zorap_sim_load_json(description.dump().c_str()));
+        ASSERT_EQ(ZORAP_OK, ZORAP_Initialize(0, 0));
+    }
+
+    // One adapter of the chip with one physical port carrying `functions`.
+    static json oneAdapter(const std::string& chip, std::vector<json> functions, const std::string& serial = "SER1")
+    {
+        json a = fcAdapter(1, chip, 0, serial);
+        a["ports"] = json::array({{{"portNumber", 0}, {"protocols", functions}}});
+        return host(json::array({a}));
+    }
+
+    static const FCPortEntry& port(int i) { return g_FCPortList.entries[i]; }
+};
+
+TEST_F(FCBuild, PortStateGivesOperationalStatusAndDeviceStatus)
+{
+    use(oneAdapter("RSX-1610", {fcFunction(1, 0, {{"state", "online"}}), fcFunction(1, 1, {{"state", "loopdown"}}),
+                                fcFunction(1, 2, {{"state", "suspended"}}), fcFunction(1, 3, {{"state", 9}})}));
+    buildFCPortList();
+    ASSERT_EQ(4, g_FCPortList.count);
+    const unsigned expected[4][2] = {{2, 0}, {6, 4097}, {1, 0}, {1, 0}};
+    for (int i = 0; i < 4; ++i) {
+        EXPECT_EQ(expected[i][0], port(i).operationalStatus) << i;
+        EXPECT_EQ(expected[i][1], port(i).deviceStatus) << i;
+        EXPECT_EQ(1, port(i).valid);
+    }
+}
+
+TEST_F(FCBuild, PortTypeCodesMapToCimPortTypes)
+{
+    std::vector<json> functions;
+    for (int code = 0; code <= 10; ++code)
+        functions.push_back(fcFunction(1, code, {{"portType", code}}));
+    use(oneAdapter("RSX-1610", functions));
+    buildFCPortList();
+    const unsigned expected[] = {0, 10, 11, 12, 13, 15, 16, 1, 14, 17, 0};
+    ASSERT_EQ(11, g_FCPortList.count);
+    for (int i = 0; i < 11; ++i)
+        EXPECT_EQ(expected[i], port(i).portType) << "code " << i;
+}
+
+struct SpeedCase {
+    const char* chip;
+    int speedCode;
+    unsigned long long speed;
+    const char* description;
+};
+
+class FCBuildSpeed : public FCBuild, public ::testing::WithParamInterface<SpeedCase> {};
+
+TEST_P(FCBuildSpeed, SpeedAndDescriptionFromSpeedCodeAndChip)
+{
+    const SpeedCase& c = GetParam();
+    use(oneAdapter(c.chip, {fcFunction(1, 0, {{"speed", c.speedCode}})}));
+    buildFCPortList();
+    ASSERT_EQ(1, g_FCPortList.count);
+    EXPECT_EQ(c.speed, port(0).speed);
+    EXPECT_STREQ(c.description, port(0).speedDescription);
+}
+
+INSTANTIATE_TEST_SUITE_P(Codes, FCBuildSpeed,
+                         ::testing::Values(SpeedCase{"RSX-1610", 0, 0ull, "See Speed"},
+                                           SpeedCase{"RSX-1610", 1, 1062500000ull, "See Speed"},
+                                           SpeedCase{"RSX-1610", 2, 2125000000ull, "See Speed"},
+                                           SpeedCase{"RSX-1610", 3, 0ull, "Auto Negotiate"},
+                                           SpeedCase{"RSX-1610", 4, 4250000000ull, "See Speed"},
+                                           SpeedCase{"RSX-1610", 5, 0ull, "See Speed"},
+                                           SpeedCase{"RSX-1610", 8, 8500000000ull, "See Speed"},
+                                           SpeedCase{"RSX-1610", 10, 10625000000ull, "See Speed"},
+                                           SpeedCase{"RSX-1610", 16, 17000000000ull, "See Speed"},
+                                           SpeedCase{"RSX-A20", 16, 10625000000ull, "See Speed"},
+                                           SpeedCase{"RSX-AB1", 16, 10625000000ull, "See Speed"},
+                                           SpeedCase{"RSX-A30", 16, 17000000000ull, "See Speed"}),
+                         [](const ::testing::TestParamInfo<SpeedCase>& info) {
+                             std::string name = std::string(info.param.chip) + "_code" +
+                                                std::to_string(info.param.speedCode);
+                             for (char& ch : name)
+                                 if (ch == '-')
+                                     ch = '_';
+                             return name;
+                         });
+
+TEST_F(FCBuild, MaxSpeedByChipGeneration)
+{
+    const struct {
+        const char* chip;
+        unsigned long long maxSpeed;
+    } chips[] = {{"RSX-1610", 17000000000ull}, {"RSX-1620", 17000000000ull}, {"RSX-A20", 10625000000ull},
+                 {"RSX-A40", 10625000000ull},  {"RSX-A80", 10625000000ull},  {"RSX-AB0", 10625000000ull},
+                 {"RSX-880", 8500000000ull},   {"RSX-460", 4250000000ull},   {"RSX-471", 4250000000ull},
+                 {"RSX-890", 2125000000ull},   {"RSX-A10", 2125000000ull},   {"RSX-210", 2125000000ull}};
+    json adapters = json::array();
+    for (std::size_t i = 0; i < sizeof(chips) / sizeof(chips[0]); ++i)
+        adapters.push_back(fcAdapter(static_cast<int>(i), chips[i].chip, 1, "S" + std::to_string(i)));
+    json unknown = fcAdapter(99, "RSX-210", 1, "UNKNOWN");
+    unknown.erase("chip");
+    unknown["pciDeviceId"] = "0x9999";
+    adapters.push_back(unknown);
+    use(host(adapters));
+    buildFCPortList();
+    ASSERT_EQ(static_cast<int>(adapters.size()), g_FCPortList.count);
+    for (std::size_t i = 0; i < sizeof(chips) / sizeof(chips[0]); ++i)
+        EXPECT_EQ(chips[i].maxSpeed, port(static_cast<int>(i)).maxSpeed) << chips[i].chip;
+    EXPECT_EQ(2125000000ull, port(g_FCPortList.count - 1).maxSpeed) << "an unknown device ID";
+}
+
+TEST_F(FCBuild, VpdTextFollowsTheFieldOrderAndFlashImageOnlyOnConvergedChips)
+{
+    use(host(json::array({fcAdapter(1, "RSX-1610", 1, "HBA16"), fcAdapter(2, "RSX-A20", 1, "CNA15")})));
+    buildFCPortList();
+    ASSERT_EQ(2, g_FCPortList.count);
+    const std::string common = ";Fru Number:FRU-1;Miscellaneous Information:misc;Manufacturing Id:7E5A;"
+                               "EFI Driver Version:7.01;Firmware Version:8.1.2;BIOS Version:3.5;FCode Version:4.02.01";
+    EXPECT_EQ("Product Identifier:Test FC HBA;Part Number:VXT-1;Serial Number:HBA16;FC Code:FC-CODE" + common,
+              std::string(port(0).vpdData));
+    EXPECT_EQ("Product Identifier:Test FC HBA;Part Number:VXT-1;Serial Number:CNA15;FC Code:FC-CODE" + common +
+                  ";Flash Image Version:1.23.45",
+              std::string(port(1).vpdData));
+    EXPECT_STREQ("OptionROM BIOS Version:3.5;OptionROM EFI Version:7.01;OptionROM FCode Version:4.02;"
+                 "OptionROM Firmware Version:8.01.02",
+                 port(0).optionROMVersions);
+    EXPECT_STREQ("VXT1", port(0).model);
+    EXPECT_STREQ("HBA16", port(0).serialNumber);
+}
+
+TEST_F(FCBuild, OlderChipsTakeTheLibrarySerialAndReadNoVpd)
+{
+    json option = fcAdapter(1, "RSX-250", 1, "VPD-SERIAL");   // code 6: option ROM, no VPD
+    option["deviceSerial"] = "LIB-SERIAL6";
+    json oldest = fcAdapter(2, "RSX-231", 1, "VPD-SERIAL3");  // code 3: neither
+    oldest["deviceSerial"] = "LIB-SERIAL3";
+    use(host(json::array({option, oldest})));
+    buildFCPortList();
+    ASSERT_EQ(2, g_FCPortList.count);
+    EXPECT_STREQ("", port(0).vpdData);
+    EXPECT_STREQ("LIB-SERIAL6", port(0).serialNumber);
+    EXPECT_EQ(0, std::strncmp(port(0).deviceId, "LIB-SERIAL6_", 12));
+    EXPECT_STRNE("", port(0).optionROMVersions);
+    EXPECT_STREQ("", port(1).vpdData);
+    EXPECT_STREQ("", port(1).optionROMVersions);
+    EXPECT_STREQ("LIB-SERIAL3", port(1).serialNumber);
+}
+
+TEST_F(FCBuild, ENodeMacOnlyOnConvergedChips)
+{
+    json cna = fcAdapter(1, "RSX-A20", 0, "CNA");
+    cna["ports"] = json::array(
+        {{{"protocols", json::array({fcFunction(1, 0, {{"type", "fcoe"}, {"enodeMac", "02:7e:5a:00:00:01"}})})}}});
+    json plain = fcAdapter(2, "RSX-A10", 0, "PLAIN");
+    plain["ports"] = json::array(
+        {{{"protocols", json::array({fcFunction(2, 0, {{"type", "fcoe"}, {"enodeMac", "02:7e:5a:00:00:02"}})})}}});
+    use(host(json::array({cna, plain})));
+    buildFCPortList();
+    buildPortControllerList();
+    ASSERT_EQ(2, g_FCPortList.count);
+    const unsigned char mac[6] = {0x02, 0x7e, 0x5a, 0x00, 0x00, 0x01};
+    EXPECT_EQ(1, port(0).macAvailable);
+    EXPECT_EQ(0, std::memcmp(mac, port(0).macAddress, 6));
+    EXPECT_EQ(0, port(1).macAvailable);
+    ASSERT_EQ(2, g_PortControllerList.count);
+    EXPECT_EQ(1, g_PortControllerList.entries[0].macAvailable);
+    EXPECT_EQ(0, std::memcmp(mac, g_PortControllerList.entries[0].macAddress, 6));
+    EXPECT_EQ(0, g_PortControllerList.entries[1].macAvailable);
+}
+
+TEST_F(FCBuild, PortsOfOneAdapterDifferOnlyInThePortWWN)
+{
+    use(host(json::array({fcAdapter(7, "RSX-1620", 2, "DUAL")})));
+    buildFCPortList();
+    ASSERT_EQ(2, g_FCPortList.count);
+    EXPECT_STREQ("DUAL_3000000000070000_3100000000070000", port(0).deviceId);
+    EXPECT_STREQ("DUAL_3000000000070000_3100000000070100", port(1).deviceId);
+    EXPECT_STREQ("3100000000070100", port(1).portWWN);
+    EXPECT_EQ(0, port(0).deviceNumber);
+    EXPECT_EQ(1, port(1).deviceNumber);
+    EXPECT_EQ(&ZORAP_GetAdapterList()->firstAdapter->phyPortList->firstPhyPort->protocolList->firstProtocol->fcDevice,
+              port(0).device);
+}
+
+TEST_F(FCBuild, FailedPortPropertyReadKeepsTheSlotWithUnknownState)
+{
+    use(host(json::array({fcAdapter(1, "RSX-1610", 2, "PP")})));
+    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_GetHbaDevicePortProperty, ZORAP_ERR_FAILED, 1));
+    buildFCPortList();
+    ASSERT_EQ(2, g_FCPortList.count);
+    EXPECT_EQ(1, port(0).valid);
+    EXPECT_EQ(0, port(0).operationalStatus);
+    EXPECT_EQ(0, port(0).portType);
+    EXPECT_EQ(0u, port(0).speed);
+    EXPECT_STREQ("", port(0).speedDescription);
+    EXPECT_EQ(0u, port(0).deviceStatus);
+    EXPECT_EQ(17000000000ull, port(0).maxSpeed);
+    EXPECT_STRNE("", port(0).vpdData);
+    EXPECT_EQ(2, port(1).operationalStatus);
+    EXPECT_EQ(8500000000ull, port(1).speed);
+}
+
+TEST_F(FCBuild, UnreadableVpdReusesTheSerialOfTheDeviceBefore)
+{
+    json first = fcAdapter(1, "RSX-1610", 1, "FIRST");
+    first.erase("vpd");
+    json second = fcAdapter(2, "RSX-1610", 1, "SECOND");
+    json third = fcAdapter(3, "RSX-1610", 1, "THIRD");
+    third.erase("vpd");
+    use(host(json::array({first, second, third})));
+    buildFCPortList();
+    buildPortControllerList();
+    ASSERT_EQ(3, g_FCPortList.count);
+    EXPECT_STREQ("_3000000000010000_3100000000010000", port(0).deviceId);
+    EXPECT_STREQ("SECOND", port(1).serialNumber);
+    EXPECT_STREQ("SECOND_3000000000030000_3100000000030000", port(2).deviceId);
+    EXPECT_STREQ("", port(2).vpdData);
+    // The third device's reused serial makes it a duplicate controller.
+    ASSERT_EQ(2, g_PortControllerList.count);
+    EXPECT_STREQ("", g_PortControllerList.entries[0].deviceId);
+    EXPECT_STREQ("SECOND", g_PortControllerList.entries[1].deviceId);
+}
+
+TEST_F(FCBuild, NoAdaptersLeavesEveryListEmpty)
+{
+    use(host(json::array()));
+    buildFCPortList();
+    buildPortControllerList();
+    buildLogicalPortGroupList();
+    buildFCPortStatisticsList();
+    EXPECT_EQ(0, g_FCPortList.count);
+    EXPECT_EQ(nullptr, g_FCPortList.entries);
+    EXPECT_EQ(0, g_PortControllerList.count);
+    EXPECT_EQ(nullptr, g_PortControllerList.entries);
+    EXPECT_EQ(0, g_LogicalPortGroupList.count);
+    EXPECT_EQ(nullptr, g_LogicalPortGroupList.entries);
+    EXPECT_EQ(0, g_FCPortStatisticsList.count);
+    EXPECT_EQ(nullptr, g_FCPortStatisticsList.entries);
+}
+
+TEST_F(FCBuild, PortControllerDropsSerialsSeenBeforeComparingWithCase)
+{
+    json a = fcAdapter(1, "RSX-1610", 2, "abc1");
+    json b = fcAdapter(2, "RSX-1610", 1, "ABC1");
+    json c = fcAdapter(3, "RSX-1610", 1, "abc1");
+    use(host(json::array({a, b, c})));
+    buildPortControllerList();
+    ASSERT_EQ(2, g_PortControllerList.count);
+    EXPECT_STREQ("abc1", g_PortControllerList.entries[0].deviceId);
+    EXPECT_STREQ("ABC1", g_PortControllerList.entries[1].deviceId);
+    EXPECT_EQ(&ZORAP_GetAdapterList()->firstAdapter->phyPortList->firstPhyPort->protocolList->firstProtocol->fcDevice,
+              g_PortControllerList.entries[0].device);
+
+    int index = -1;
+    unsigned char upper[] = "ABC1";
+    EXPECT_EQ(1, IsDeviceInPortControllerList(upper, &index));
+    EXPECT_EQ(0, index) << "the first slot wins, case ignored";
+    unsigned char other[] = "zzz";
+    index = -1;
+    EXPECT_EQ(0, IsDeviceInPortControllerList(other, &index));
+    EXPECT_EQ(-1, index);
+}
+
+TEST_F(FCBuild, LogicalPortGroupOfOneDualPortAdapterNamesItsFirstPort)
+{
+    use(host(json::array({fcAdapter(5, "RSX-1620", 2, "GRP")})));
+    buildLogicalPortGroupList();
+    char hostName[kHostNameBufferSize] = {};
+    int kind = 0;
+    GetHostName(hostName, &kind);
+    ASSERT_EQ(1, g_LogicalPortGroupList.count);
+    EXPECT_EQ(std::string(hostName) + "_GRP_3000000000050000_3100000000050000",
+              g_LogicalPortGroupList.entries[0].instanceId);
+    EXPECT_STREQ("3000000000050000", g_LogicalPortGroupList.entries[0].nodeWWN);
+}
+
+TEST_F(FCBuild, LogicalPortGroupSlotsAndCountPartAfterADuplicate)
+{
+    use(host(json::array({fcAdapter(1, "RSX-1620", 2, "A1"), fcAdapter(2, "RSX-1620", 2, "A2")})));
+    buildLogicalPortGroupList();
+    ASSERT_EQ(3, g_LogicalPortGroupList.count);
+    const LogicalPortGroupEntry* e = g_LogicalPortGroupList.entries;
+    EXPECT_EQ(1, e[0].valid);
+    EXPECT_EQ(0, e[1].valid);
+    EXPECT_STREQ("", e[1].instanceId);
+    EXPECT_STREQ("", e[1].nodeWWN);
+    EXPECT_EQ(1, e[2].valid);
+    EXPECT_STREQ("3000000000020000", e[2].nodeWWN);
+    // Slot 3 was compared with slots 0 and 1 only, so it holds a second group
+    // of adapter 2, out of reach of the enumerations.
+    EXPECT_EQ(1, e[3].valid);
+    EXPECT_STREQ("3000000000020000", e[3].nodeWWN);
+}
+
+TEST_F(FCBuild, StatisticsCopyTheNineCountersInOrder)
+{
+    json counters = {{"ioCount", 1},       {"megabyteCount", 2},      {"lipCount", 3},
+                     {"linkFailures", 4},  {"lossOfSync", 5},         {"lossOfSignal", 6},
+                     {"primitiveSeqErrors", 7}, {"invalidTxWords", 8}, {"crcErrors", 4294967295u}};
+    use(oneAdapter("RSX-1610", {fcFunction(1, 0, {{"stats", counters}})}));
+    buildFCPortStatisticsList();
+    ASSERT_EQ(1, g_FCPortStatisticsList.count);
+    const FCPortStatisticsEntry& s = g_FCPortStatisticsList.entries[0];
+    EXPECT_STREQ("3000000000010000_3100000000010000", s.instanceId);
+    EXPECT_STREQ("3100000000010000", s.portWWN);
+    EXPECT_EQ(3u, s.lipCount);
+    EXPECT_EQ(4u, s.linkFailures);
+    EXPECT_EQ(5u, s.lossOfSync);
+    EXPECT_EQ(6u, s.lossOfSignal);
+    EXPECT_EQ(7u, s.primitiveSeqErrors);
+    EXPECT_EQ(4294967295ull, s.crcErrors) << "widened without sign";
+    EXPECT_EQ(8u, s.invalidTxWords);
+    EXPECT_EQ(1u, s.ioCount);
+    EXPECT_EQ(2u, s.megabyteCount);
+}
+
+TEST_F(FCBuild, FailedStatisticsReadGivesZerosAndKeepsTheSlot)
+{
+    json counters = {{"ioCount", 11}, {"megabyteCount", 12}, {"lipCount", 13}, {"crcErrors", 14}};
+    use(oneAdapter("RSX-1610", {fcFunction(1, 0, {{"stats", counters}}), fcFunction(1, 1, {{"stats", counters}})}));
+    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_RefreshDeviceStats, ZORAP_ERR_FAILED, 1));
+    buildFCPortStatisticsList();
+    ASSERT_EQ(2, g_FCPortStatisticsList.count);
+    const FCPortStatisticsEntry& failed = g_FCPortStatisticsList.entries[0];
+    EXPECT_EQ(1, failed.valid);
+    EXPECT_STREQ("3000000000010000_3100000000010000", failed.instanceId);
+    EXPECT_EQ(0u, failed.lipCount);
+    EXPECT_EQ(0u, failed.crcErrors);
+    EXPECT_EQ(0u, failed.ioCount);
+    EXPECT_EQ(0u, failed.megabyteCount);
+    EXPECT_EQ(13u, g_FCPortStatisticsList.entries[1].lipCount);
+    EXPECT_EQ(11u, g_FCPortStatisticsList.entries[1].ioCount);
+}
+
+TEST_F(FCBuild, SixtyFourAdaptersOfFourFunctionsEach)
+{
+    use(fctest::wideHost());
+    buildFCPortList();
+    buildPortControllerList();
+    buildLogicalPortGroupList();
+    buildFCPortStatisticsList();
+
+    ASSERT_EQ(256, g_FCPortList.count);
+    ASSERT_EQ(256, g_FCPortStatisticsList.count);
+    std::set<std::string> ports, stats;
+    for (int i = 0; i < 256; ++i) {
+        EXPECT_EQ(1, port(i).valid);
+        EXPECT_EQ(i % 4, port(i).deviceNumber);
+        ports.insert(port(i).deviceId);
+        stats.insert(g_FCPortStatisticsList.entries[i].instanceId);
+    }
+    EXPECT_EQ(256u, ports.size());
+    EXPECT_EQ(256u, stats.size());
+    EXPECT_STREQ("VXW0063_30000000003F0000_31000000003F0300", port(255).deviceId);
+
+    ASSERT_EQ(64, g_PortControllerList.count);
+    for (int a = 0; a < 64; ++a) {
+        char serial[16];
+        std::snprintf(serial, sizeof(serial), "VXW%04d", a);
+        EXPECT_STREQ(serial, g_PortControllerList.entries[a].deviceId);
+    }
+
+    // Each adapter's first function opens a group; once slots 1 to 3 stayed
+    // unfilled, the duplicate test no longer reaches the newest groups.
+    ASSERT_EQ(253, g_LogicalPortGroupList.count);
+    for (int i = 0; i < 256; ++i)
+        EXPECT_EQ(i >= 1 && i <= 3 ? 0 : 1, g_LogicalPortGroupList.entries[i].valid) << i;
+}
+
+}  // namespace
