@@ -509,6 +509,12 @@ bool parseWwnText(const char* text, Wwn& out) {
     return true;
 }
 
+template <typename T>
+void releaseAll(T& object) {
+    T empty{};
+    std::swap(object, empty);
+}
+
 template <typename Body>
 int control(const char* what, Body&& body) {
     try {
@@ -1113,9 +1119,15 @@ __attribute__((destructor)) static void zorap_sim_unload() {
         std::lock_guard<std::mutex> g(L.mu);
         L.releaseTrees();
         L.initialized = false;
-        L.model = zorap_sim::Host{};
-        L.source = zorap_sim::Source{};
-        std::string().swap(L.modelPath);
+        // Swapped with empty objects, so every heap block goes (an assigned
+        // empty string would keep its old buffer).
+        zorap_sim::releaseAll(L.model);
+        zorap_sim::releaseAll(L.source);
+        zorap_sim::releaseAll(L.modelPath);
+        zorap_sim::releaseAll(L.handles);
+        // Blocks still handed out are the caller's leak; the set that knew
+        // them goes, so that a leak checker sees them.
+        zorap_sim::releaseAll(L.allocations);
     } catch (...) {
     }
 }
