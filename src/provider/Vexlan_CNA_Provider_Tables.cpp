@@ -24,6 +24,14 @@
 #include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "classes/Vexlan_FC_LogicalPortGroup_CMPI.h"
 #include "classes/Vexlan_FC_PortController_CMPI.h"
+#include "classes/Vexlan_FC_SCSIProtocolController_CMPI.h"
+#include "classes/Vexlan_FC_SCSIProtocolEndpointHBA_CMPI.h"
+#include "classes/Vexlan_FC_SCSIProtocolEndpointTarget_CMPI.h"
+#include "classes/Vexlan_FC_StorageExtent_CMPI.h"
+#include "classes/Vexlan_Adapter_PhysicalPackage_CMPI.h"
+#include "classes/Vexlan_Adapter_Product_CMPI.h"
+#include "classes/Vexlan_Adapter_PhysicalConnector_CMPI.h"
+#include "classes/Vexlan_Adapter_PhysicalPort_CMPI.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
 
 namespace {
@@ -75,6 +83,14 @@ constexpr ClassOps FCPort = CLASS_OPS(FCPort);
 constexpr ClassOps PortController = CLASS_OPS(PortController);
 constexpr ClassOps FCPortStatistics = CLASS_OPS(FCPortStatistics);
 constexpr ClassOps LogicalPortGroup = CLASS_OPS(LogicalPortGroup);
+constexpr ClassOps PhysicalPackage = CLASS_OPS(PhysicalPackage);
+constexpr ClassOps Product = CLASS_OPS(Product);
+constexpr ClassOps SCSIProtocolController = CLASS_OPS(SCSIProtocolController);
+constexpr ClassOps PhysicalConnector = CLASS_OPS(PhysicalConnector);
+constexpr ClassOps PhysicalPort = CLASS_OPS(PhysicalPort);
+constexpr ClassOps StorageExtent = CLASS_OPS(StorageExtent);
+constexpr ClassOps SCSIProtocolEndpointHBA = CLASS_OPS(SCSIProtocolEndpointHBA);
+constexpr ClassOps SCSIProtocolEndpointTarget = CLASS_OPS(SCSIProtocolEndpointTarget);
 }  // namespace ops
 
 namespace lists {
@@ -88,6 +104,14 @@ constexpr ListOps FCPortStatisticsList = {::removeFCPortStatisticsList, ::buildF
 constexpr ListOps LogicalPortGroupList = {::removeLogicalPortGroupList, ::buildLogicalPortGroupList};
 constexpr ListOps FCPortList = {::removeFCPortList, ::buildFCPortList};
 constexpr ListOps PortControllerList = {::removePortControllerList, ::buildPortControllerList};
+constexpr ListOps PhysicalPackageList = {::removePhysicalPackageList, ::buildPhysicalPackageList};
+constexpr ListOps ProductList = {::removeProductList, ::buildProductList};
+constexpr ListOps SCSIProtocolControllerList = {::removeSCSIProtocolControllerList, ::buildSCSIProtocolControllerList};
+constexpr ListOps PhysicalConnectorList = {::removePhysicalConnectorList, ::buildPhysicalConnectorList};
+constexpr ListOps PhysicalPortList = {::removePhysicalPortList, ::buildPhysicalPortList};
+constexpr ListOps SCSIProtocolEndpointHBAList = {::removeSCSIProtocolEndpointHBAList, ::buildSCSIProtocolEndpointHBAList};
+constexpr ListOps SCSIProtocolEndpointTargetList = {::removeSCSIProtocolEndpointTargetList, ::buildSCSIProtocolEndpointTargetList};
+constexpr ListOps StorageExtentList = {::removeStorageExtentList, ::buildStorageExtentList};
 }  // namespace lists
 
 // ---- Modules not built yet ---------------------------------------------------
@@ -99,9 +123,6 @@ constexpr ListOps PortControllerList = {::removePortControllerList, ::buildPortC
 //     constexpr ListOps FCPortList = {::removeFCPortList, ::buildFCPortList};
 // and include its header above. The tables below name these constants.
 namespace ops {
-constexpr ClassOps PhysicalPackage = kPlaceholder;
-constexpr ClassOps Product = kPlaceholder;
-constexpr ClassOps SCSIProtocolController = kPlaceholder;
 constexpr ClassOps SoftwareIdentity = kPlaceholder;
 constexpr ClassOps AssocComputerSystemPortController = kPlaceholder;
 constexpr ClassOps AssocComputerSystemSCSIProtocolController = kPlaceholder;
@@ -122,8 +143,6 @@ constexpr ClassOps AssocComputerSystemObjectManager = kPlaceholder;
 constexpr ClassOps AssocObjectManagerCommMech = kPlaceholder;
 constexpr ClassOps AssocComputerSystemCommMech = kPlaceholder;
 constexpr ClassOps AssocObjectManagerNamespace = kPlaceholder;
-constexpr ClassOps PhysicalConnector = kPlaceholder;
-constexpr ClassOps PhysicalPort = kPlaceholder;
 constexpr ClassOps AssocPhysicalPackagePhysicalConnector = kPlaceholder;
 constexpr ClassOps AssocPhysicalPackagePhysicalPort = kPlaceholder;
 constexpr ClassOps SoftwareInstallationService = kPlaceholder;
@@ -132,9 +151,6 @@ constexpr ClassOps AssocSoftwareIdentitySoftwareInstallationService = kPlacehold
 constexpr ClassOps AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities = kPlaceholder;
 constexpr ClassOps AssocComputerSystemSoftwareInstallationService = kPlaceholder;
 constexpr ClassOps ConcreteJob = kPlaceholder;
-constexpr ClassOps StorageExtent = kPlaceholder;
-constexpr ClassOps SCSIProtocolEndpointHBA = kPlaceholder;
-constexpr ClassOps SCSIProtocolEndpointTarget = kPlaceholder;
 constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointHBA = kPlaceholder;
 constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointTarget = kPlaceholder;
 constexpr ClassOps AssocComputerSystemStorageExtent = kPlaceholder;
@@ -165,15 +181,7 @@ constexpr ClassOps Nic_AssocComputerSystemSoftwareIdentity = kPlaceholder;
 }  // namespace ops
 
 namespace lists {
-constexpr ListOps PhysicalPackageList = kNoList;
-constexpr ListOps ProductList = kNoList;
-constexpr ListOps SCSIProtocolControllerList = kNoList;
 constexpr ListOps SoftwareIdentityList = kNoList;
-constexpr ListOps PhysicalConnectorList = kNoList;
-constexpr ListOps PhysicalPortList = kNoList;
-constexpr ListOps SCSIProtocolEndpointHBAList = kNoList;
-constexpr ListOps SCSIProtocolEndpointTargetList = kNoList;
-constexpr ListOps StorageExtentList = kNoList;
 constexpr ListOps AssocFCPortFCPortStatistics = kNoList;
 constexpr ListOps AssocComputerSystemSCSIProtocolEndpointTarget = kNoList;
 constexpr ListOps AssocComputerSystemStorageExtent = kNoList;

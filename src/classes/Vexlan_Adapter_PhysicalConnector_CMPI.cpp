@@ -1,0 +1,324 @@
+// Vexlan_Adapter_PhysicalConnector as a class module: a dense list in which a
+// repeated tag is dropped; the enumerations skip invalid slots.
+#include "classes/Vexlan_Adapter_PhysicalConnector_CMPI.h"
+
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <memory>
+
+#include "classes/Vexlan_Adapter_PhysicalPackage_CMPI.h"
+#include "support/Vexlan_FC_Utils_CMPI.h"
+#include "support/ossimpl.h"
+
+ClassList<PhysicalConnectorEntry> g_PhysicalConnectorList = {0, nullptr};
+
+#define PC_DEBUG(...)                                          \
+    do {                                                       \
+        if (g_EnableDebugPrint)                                \
+            Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__);     \
+    } while (0)
+
+void CreatePhysicalConnectorTag(char* out, char* transceiverSerial, char* adapterSerial, int portNumber)
+{
+    if (out == nullptr)
+        return;
+    std::snprintf(out, kPhysicalTagSize, "%s_%s_%d", transceiverSerial != nullptr ? transceiverSerial : "",
+                  adapterSerial != nullptr ? adapterSerial : "", portNumber);
+}
+
+int ParsePhysicalConnectorTag(char* tag, char* transceiverSerial, char* adapterSerial, int* portNumber)
+{
+    if (tag == nullptr || transceiverSerial == nullptr || adapterSerial == nullptr || portNumber == nullptr)
+        return 0;
+    char work[256] = {};
+    std::snprintf(work, sizeof(work), "%s", tag);
+    char* rest = nullptr;
+    char* part = strtok_r(work, "_", &rest);
+    if (part == nullptr)
+        return 0;
+    std::snprintf(transceiverSerial, kPhysicalTagPartSize, "%s", part);
+    part = strtok_r(nullptr, "_", &rest);
+    if (part == nullptr)
+        return 0;
+    std::snprintf(adapterSerial, kPhysicalTagPartSize, "%s", part);
+    part = strtok_r(nullptr, "_", &rest);
+    if (part == nullptr)
+        return 0;
+    *portNumber = static_cast<int>(std::strtol(part, nullptr, 10));
+    return 1;
+}
+
+int getZORAPStructs(_CNAStruc*, _CNAPortStruc* port, _zorap_adapter_t** adapter, _zorap_phy_port_t** phyPort,
+                    _zorap_protocol_t** protocol)
+{
+    if (port == nullptr)
+        return 0;
+    int found = 0;
+    classmodule::walkProtocols([&](_zorap_adapter_t* a, _zorap_phy_port_t* p, _zorap_protocol_t* pr) {
+        if (found || pr->protocolType != 2)
+            return;
+        // The MAC sits in an 8-byte field; all eight bytes are compared.
+        if (std::memcmp(&pr->nicPortInfo.macAddress, &port->macAddress, 8) != 0)
+            return;
+        found = 1;
+        if (adapter != nullptr)
+            *adapter = a;
+        if (phyPort != nullptr)
+            *phyPort = p;
+        if (protocol != nullptr)
+            *protocol = pr;
+    });
+    return found;
+}
+
+namespace {
+
+// The tag of a NIC port's transceiver on a library adapter and port.
+void nicConnectorTag(char* out, const _CNAPortStruc* port, const _zorap_adapter_t* adapter,
+                     const _zorap_phy_port_t* phy)
+{
+    char transceiverSerial[sizeof(port->sfpFields.SerialNumber) + 1];
+    char adapterSerial[sizeof(adapter->serialNumber) + 1];
+    copyFieldText(transceiverSerial, port->sfpFields.SerialNumber);
+    copyFieldText(adapterSerial, adapter->serialNumber);
+    CreatePhysicalConnectorTag(out, transceiverSerial, adapterSerial, phy->portNumber);
+}
+
+}  // namespace
+
+int calcTag_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port, char* out)
+{
+    PC_DEBUG("Vexlan_NIC_PhysicalConnector makeInstance_PhysicalConnector was called\n");
+    if (out == nullptr)
+        return 0;
+    out[0] = '\0';
+    _zorap_adapter_t* adapter = nullptr;
+    _zorap_phy_port_t* phy = nullptr;
+    _zorap_protocol_t* protocol = nullptr;
+    if (!getZORAPStructs(cna, port, &adapter, &phy, &protocol))
+        return 0;
+    nicConnectorTag(out, port, adapter, phy);
+    return 1;
+}
+
+// ---------------------------------------------------------------------------
+// The build.
+// ---------------------------------------------------------------------------
+namespace {
+
+// The slot below `count` with this tag, or -1.
+int slotWithTag(const char* tag)
+{
+    for (int i = 0; i < g_PhysicalConnectorList.count; ++i)
+        if (std::strcmp(g_PhysicalConnectorList.entries[i].tag, tag) == 0)
+            return i;
+    return -1;
+}
+
+void logSameTag(int slot)
+{
+    PC_DEBUG("Exiting  createPhysicalConnector: Current device has the same the serial number as a device in the "
+             "list at index=%d. Skip!\n",
+             slot);
+}
+
+// A NIC function: the transceiver that the NIC adapter list read for the
+// port with this MAC address on an adapter of this serial.
+void createNicConnector(_zorap_adapter_t* adapter, _zorap_phy_port_t* phy, _zorap_protocol_t* protocol, int& n)
+{
+    char adapterSerial[sizeof(adapter->serialNumber) + 1];
+    copyFieldText(adapterSerial, adapter->serialNumber);
+    const _CNAPortStruc* found = nullptr;
+    for (_CNAStruc* cna = m_CNAList; cna != nullptr && found == nullptr; cna = cna->next) {
+        char cnaSerial[sizeof(cna->serialNumber) + 1];
+        copyFieldText(cnaSerial, cna->serialNumber);
+        if (std::strcmp(cnaSerial, adapterSerial) != 0)
+            continue;
+        for (const _CNAPortStruc* port = cna->portList; port != nullptr; port = port->next)
+            if (port->hasTransceiver &&
+                std::memcmp(&port->macAddress, &protocol->nicPortInfo.macAddress, 8) == 0) {
+                found = port;
+                break;
+            }
+    }
+    if (found == nullptr)
+        return;
+    char tag[kPhysicalTagSize];
+    nicConnectorTag(tag, found, adapter, phy);
+    const int same = slotWithTag(tag);
+    if (same >= 0) {
+        logSameTag(same);
+        return;
+    }
+    PhysicalConnectorEntry& entry = g_PhysicalConnectorList.entries[g_PhysicalConnectorList.count++];
+    copyFieldText(entry.sfp.Name, found->sfpFields.Name);
+    copyFieldText(entry.sfp.Manufacturer, found->sfpFields.Manufacturer);
+    copyFieldText(entry.sfp.SerialNumber, found->sfpFields.SerialNumber);
+    copyFieldText(entry.sfp.PartNumber, found->sfpFields.PartNumber);
+    std::memset(entry.sfp.RawData, 0, sizeof(entry.sfp.RawData));
+    std::snprintf(entry.tag, sizeof(entry.tag), "%s", tag);
+    entry.sfp.SFPStatus = 1;
+    entry.valid = 1;
+    ++n;
+}
+
+struct CoreBlock {
+    void operator()(unsigned char* block) const { CoreFree(block); }
+};
+
+// An FC function with a transceiver cage: the module's data as the library
+// reads it, when a module with a serial sits in the cage.
+void createFCConnector(_zorap_adapter_t* adapter, _zorap_phy_port_t* phy, _tagZORAPSDMDevice* device, int& n)
+{
+    PC_DEBUG("Entering createPhysicalConnector, index = %d", n);
+    // The data block is released on every way out.
+    std::unique_ptr<unsigned char, CoreBlock> buffer(static_cast<unsigned char*>(CoreZMalloc(kSFPDataSize)));
+    if (!buffer) {
+        if (g_EnableLogError)
+            Vexlan_FC_Utils_CMPI::LogError("createPhysicalConnector: Unable to allocate memory for the DMI buffer\n");
+        return;
+    }
+    if (ZORAP_GetSFPData(device, buffer.get()) != 0) {
+        PC_DEBUG("No Transceiver on DeviceNumber %u\n", device->portIndex);
+        return;
+    }
+    _SFPFields fields;
+    std::memset(&fields, 0, sizeof(fields));
+    parseSFPFields(device, buffer.get(), kSFPDataSize, &fields);
+    if (fields.SerialNumber[0] == '\0') {
+        PC_DEBUG("Empty SerialNumber for the Transceiver on DeviceNumber %u\n", device->portIndex);
+        return;
+    }
+    char adapterSerial[sizeof(adapter->serialNumber) + 1];
+    copyFieldText(adapterSerial, adapter->serialNumber);
+    char tag[kPhysicalTagSize];
+    CreatePhysicalConnectorTag(tag, fields.SerialNumber, adapterSerial, phy->portNumber);
+    const int same = slotWithTag(tag);
+    if (same >= 0) {
+        logSameTag(same);
+        return;
+    }
+    PhysicalConnectorEntry& entry = g_PhysicalConnectorList.entries[g_PhysicalConnectorList.count++];
+    entry.sfp = fields;
+    std::snprintf(entry.tag, sizeof(entry.tag), "%s", tag);
+    entry.valid = 1;
+    PC_DEBUG("Exiting  createPhysicalConnector\n");
+    ++n;
+}
+
+}  // namespace
+
+void buildPhysicalConnectorList()
+{
+    int wanted = 0;
+    bool haveAdapters = classmodule::walkProtocols([&](_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* pr) {
+        if (pr->protocolType < 3)
+            ++wanted;
+    });
+    ClassList<PhysicalConnectorEntry>& list = g_PhysicalConnectorList;
+    if (!haveAdapters || !list.allocate(wanted))
+        return;
+    const int capacity = wanted;
+    list.count = 0;
+    int n = 0;
+    classmodule::walkProtocols([&](_zorap_adapter_t* a, _zorap_phy_port_t* p, _zorap_protocol_t* pr) {
+        // A tree that grew between the two walks finds no slot.
+        if (list.count >= capacity)
+            return;
+        if (pr->protocolType == 2)
+            createNicConnector(a, p, pr, n);
+        else if (pr->protocolType < 2 && pr->fcDevice.transceiverSupport == 1)
+            createFCConnector(a, p, &pr->fcDevice, n);
+    });
+    int valid = 0;
+    for (int i = 0; i < list.count; ++i)
+        if (list.entries[i].valid)
+            ++valid;
+    list.count = valid;
+}
+
+void removePhysicalConnectorList()
+{
+    g_PhysicalConnectorList.remove();
+}
+
+// ---------------------------------------------------------------------------
+// The instance.
+// ---------------------------------------------------------------------------
+namespace {
+
+const char kClassName[] = "Vexlan_Adapter_PhysicalConnector";
+
+template <std::size_t N>
+PropertyValue sfpText(const char (&field)[N])
+{
+    return CmpiData(std::string(field, strnlen(field, N)));
+}
+
+const PropertyRow<PhysicalConnectorEntry> kProperties[] = {
+    {"CreationClassName", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, CmpiData(kClassName))},
+    {"Tag", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, CmpiData(e.tag))},
+    {"Name", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, CmpiData(kClassName))},
+    {"ElementName", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, CmpiData("Physical Port Connector"))},
+    {"ConnectorLayout", CMPI_uint16, CLASS_VALUE(PhysicalConnectorEntry, CmpiData(static_cast<CMPIUint16>(1)))},
+    {"ConnectorDescription", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, CmpiData("SFP"))},
+    {"Manufacturer", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, sfpText(e.sfp.Manufacturer))},
+    {"SerialNumber", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, sfpText(e.sfp.SerialNumber))},
+    {"PartNumber", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, sfpText(e.sfp.PartNumber))},
+    {"SFPDataA0", CMPI_uint8A, CLASS_VALUE(PhysicalConnectorEntry, uint8Array(e.sfp.RawData, 256))},
+    {"SFPDataA2", CMPI_uint8A, CLASS_VALUE(PhysicalConnectorEntry, uint8Array(e.sfp.RawData + 256, 256))},
+    {"SFPStatus", CMPI_uint16, CLASS_VALUE(PhysicalConnectorEntry, CmpiData(static_cast<CMPIUint16>(e.sfp.SFPStatus)))},
+};
+
+// The property filter keeps Tag alone, while the path also carries
+// CreationClassName.
+const char* const kFilterKeys[] = {"Tag", nullptr};
+const char* const kPathKeys[] = {"CreationClassName", "Tag", nullptr};
+
+const ClassModule<PhysicalConnectorEntry> kPhysicalConnector =
+    ClassModule<PhysicalConnectorEntry>("PhysicalConnector")
+        .list(g_PhysicalConnectorList, ListKind::Dense)
+        .key("Tag", [](const PhysicalConnectorEntry& e) -> const char* { return e.tag; })
+        .filterKeys(kFilterKeys)
+        .pathKeys(kPathKeys)
+        .properties(kProperties)
+        .enumerationsTestValid();
+
+}  // namespace
+
+VEXLAN_LIST_CLASS_OPERATIONS(PhysicalConnector, kPhysicalConnector)
+
+// ---------------------------------------------------------------------------
+// The NIC side's way in: the slot whose tag is the port's, the library's
+// records looked up anew for each slot.
+// ---------------------------------------------------------------------------
+int findSlot_Nic_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port)
+{
+    for (int i = 0; i < g_PhysicalConnectorList.count; ++i) {
+        char tag[kPhysicalTagSize];
+        calcTag_PhysicalConnector(cna, port, tag);
+        if (std::strcmp(tag, g_PhysicalConnectorList.entries[i].tag) == 0)
+            return i;
+    }
+    return -1;
+}
+
+CmpiObjectPath makePath_Nic_PhysicalConnector(const char* className, const char* nameSpace, _CNAStruc* cna,
+                                              _CNAPortStruc* port)
+{
+    PC_DEBUG("Vexlan_NIC_PhysicalConnector makePath_PhysicalConnector was called\n");
+    const int slot = findSlot_Nic_PhysicalConnector(cna, port);
+    if (slot < 0)
+        return CmpiObjectPath(static_cast<CMPIObjectPath*>(nullptr));
+    return makePath_PhysicalConnector(className, nameSpace, slot);
+}
+
+CmpiInstance makeInstance_Nic_PhysicalConnector(const char* className, const char* nameSpace,
+                                                const char** properties, _CNAStruc* cna, _CNAPortStruc* port)
+{
+    const int slot = findSlot_Nic_PhysicalConnector(cna, port);
+    if (slot < 0)
+        return CmpiInstance(static_cast<CMPIInstance*>(nullptr));
+    return makeInstance_PhysicalConnector(className, nameSpace, properties, slot);
+}

@@ -1,0 +1,407 @@
+// Vexlan_Adapter_PhysicalPackage as a class module: a dense list of one slot
+// per adapter serial, built from the FC devices' VPD or from the NIC adapter
+// list, whichever protocol of the board the walk meets first.
+#include "classes/Vexlan_Adapter_PhysicalPackage_CMPI.h"
+
+#include <cstdio>
+#include <cstring>
+#include <string>
+
+#include "inventory/AdapterFunc_Chip.h"
+#include "inventory/AdapterFunc_Identity.h"
+#include "inventory/AdapterFunc_VPD.h"
+#include "support/Vexlan_FC_Utils_CMPI.h"
+#include "support/Vexlan_NIC_Utils.h"
+
+ClassList<PhysicalPackageEntry> g_PhysicalPackageList = {0, nullptr};
+
+#define PP_DEBUG(...)                                          \
+    do {                                                       \
+        if (g_EnableDebugPrint)                                \
+            Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__);     \
+    } while (0)
+
+std::uint32_t AdapterTypeOfKind(std::uint32_t adapterKind)
+{
+    switch (adapterKind) {
+    case 1:
+        return 0;
+    case 2:
+        return 1;
+    case 3:
+        return 2;
+    default:
+        return 3;
+    }
+}
+
+namespace {
+
+// Default text, then the value of every VPD entry of the adapter's first
+// port whose keyword is exactly `keyword`; the last one wins.
+template <std::size_t M>
+char* calcFromVpd(_CNAStruc* cna, char* out, const char (&fallback)[M], const char* keyword)
+{
+    if (out == nullptr)
+        return nullptr;
+    out[0] = '\0';
+    if (cna == nullptr)
+        return out;
+    copyBoundedText(out, kPhysicalPackageTextSize, fallback, M);
+    const _CNAPortStruc* port = cna->portList;
+    if (port == nullptr)
+        return out;
+    std::uint32_t n = port->portExtra.vpdCount;
+    if (n > ZORAP_NIC_VPD_ENTRIES)
+        n = ZORAP_NIC_VPD_ENTRIES;
+    for (std::uint32_t i = 0; i < n; ++i) {
+        const _zorap_vpd_entry_t& vpd = port->portExtra.vpd[i];
+        if (strnlen(vpd.keyword, sizeof(vpd.keyword)) == sizeof(vpd.keyword) || std::strcmp(vpd.keyword, keyword) != 0)
+            continue;
+        copyBoundedText(out, kPhysicalPackageTextSize, vpd.value, sizeof(vpd.value));
+    }
+    return out;
+}
+
+}  // namespace
+
+char* calcTag_PhysicalPackage(_CNAStruc* cna, char* out)
+{
+    return cna != nullptr ? calcFromVpd(cna, out, cna->serialNumber, "YU") : calcFromVpd(cna, out, "", "YU");
+}
+
+char* calcSKU_PhysicalPackage(_CNAStruc* cna, char* out)
+{
+    return cna != nullptr ? calcFromVpd(cna, out, cna->partNumber, "FN") : calcFromVpd(cna, out, "", "FN");
+}
+
+char* calcPartNumber_PhysicalPackage(_CNAStruc* cna, char* out)
+{
+    return cna != nullptr ? calcFromVpd(cna, out, cna->partNumber, "PN") : calcFromVpd(cna, out, "", "PN");
+}
+
+// ---------------------------------------------------------------------------
+// The build.
+// ---------------------------------------------------------------------------
+namespace {
+
+using Serial = char[128];
+
+// The slot below `count` whose serial equals `serial` exactly, or -1.
+int slotWithSerial(const ClassList<PhysicalPackageEntry>& list, const char* serial)
+{
+    for (int i = 0; i < list.count; ++i)
+        if (std::strcmp(list.entries[i].serialNumber, serial) == 0)
+            return i;
+    return -1;
+}
+
+// The serial of an FC device: the library's own serial text for chips of
+// code 7 and below; for newer chips the "SN" value of the VPD just read. When
+// that read failed the serial stays what the device before left in it.
+void selectFCSerial(_tagZORAPSDMDevice* device, int vpdResult, Serial& serial)
+{
+    if (GetRSX4GbOrNewerType(device) == 0) {
+        copyFieldText(serial, device->deviceSerial);
+        return;
+    }
+    if (vpdResult != 0)
+        return;
+    const char* colon = std::strchr(g_serialNumber, ':');
+    if (colon != nullptr)
+        safeStrCpy(serial, colon + 1, sizeof(Serial));
+}
+
+// The debug texts of one VPD-derived field: "<line label><line>",
+// "<value label><value>", and the line for a missing value.
+struct VpdFieldTexts {
+    const char* lineLabel;
+    const char* valueLabel;
+    const char* missing;
+};
+constexpr VpdFieldTexts kFruTexts = {"createPhysicalPackage: g_fruNumberVersion=", "createPhysicalPackage: fruVersion=",
+                                     "createPhysicalPackage: fruVersion is NULL"};
+constexpr VpdFieldTexts kPartNumberTexts = {"createPhysicalPackage: g_partNumber=",
+                                            "createPhysicalPackage: partNumber=",
+                                            "createPhysicalPackage: PartNumber is NULL"};
+
+// The value of a labelled VPD line ("Label:value") into `target`, with the
+// debug lines of the field; without a value `target` stays empty.
+void vpdValueInto(const char* line, char (&target)[128], const VpdFieldTexts& texts)
+{
+    const char* colon = nullptr;
+    if (line[0] != '\0') {
+        PP_DEBUG("%s%s", texts.lineLabel, line);
+        colon = std::strchr(line, ':');
+    }
+    if (colon == nullptr) {
+        PP_DEBUG("%s", texts.missing);
+        return;
+    }
+    PP_DEBUG("%s%s", texts.valueLabel, colon + 1);
+    safeStrCpy(target, colon + 1, sizeof(target));
+}
+
+// One FC protocol. Returns with `index` moved on.
+void createFCPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zorap_adapter_t* adapter,
+                     _tagZORAPSDMDevice* device, Serial& serial, int& index)
+{
+    PP_DEBUG("Calling createPhysicalPackage() for FC/FCoE device.");
+    PP_DEBUG("Entering createPhysicalPackage, index = %d", index);
+    std::memset(g_serialNumber, 0, sizeof(g_serialNumber));
+    std::memset(g_fruNumberVersion, 0, sizeof(g_fruNumberVersion));
+    const int r = GetHBAVPDData(device);
+    if (r == 0)
+        PP_DEBUG("Vexlan_FC_PhysicalPackage: createPhysicalPackage: VPD data retrieved successfully.");
+    else
+        PP_DEBUG("Vexlan_FC_PhysicalPackage: createPhysicalPackage: Unable to retrieve VPD data!");
+    selectFCSerial(device, r, serial);
+
+    const int same = slotWithSerial(list, serial);
+    if (same >= 0) {
+        PP_DEBUG("Exiting  createPhysicalPackage: Current device has the same the serial number as a device in the "
+                 "list at index=%d. Skip!\n",
+                 same);
+        PP_DEBUG("Done calling createPhysicalPackage() for FC/FCoE device.");
+        ++index;
+        return;
+    }
+    // Devices of one board that name more serials than the tree has adapters
+    // find no slot for the extra ones.
+    if (list.count >= capacity) {
+        PP_DEBUG("Done calling createPhysicalPackage() for FC/FCoE device.");
+        ++index;
+        return;
+    }
+
+    PhysicalPackageEntry& entry = list.entries[list.count++];
+    if (g_I2CUUID[0] != '\0') {
+        PP_DEBUG("createPhysicalPackage: I2C uuid=%s", g_I2CUUID);
+        safeStrCpy(entry.tag, g_I2CUUID, sizeof(entry.tag));
+    } else if (g_UUID[0] != '\0') {
+        PP_DEBUG("createPhysicalPackage: g_UUID=%s", g_UUID);
+        const char* colon = std::strchr(g_UUID, ':');
+        if (colon != nullptr)
+            PP_DEBUG("createPhysicalPackage: uuid=%s", colon + 1);
+        if (colon != nullptr && colon[1] != '\0') {
+            safeStrCpy(entry.tag, colon + 1, sizeof(entry.tag));
+        } else {
+            PP_DEBUG("createPhysicalPackage: uuid is NULL");
+            safeStrCpy(entry.tag, serial, sizeof(entry.tag));
+        }
+    } else {
+        safeStrCpy(entry.tag, serial, sizeof(entry.tag));
+    }
+    safeStrCpy(entry.serialNumber, serial, sizeof(entry.serialNumber));
+    copyFieldText(entry.model, device->modelName);
+    entry.adapterType = AdapterTypeOfKind(adapter->adapterKind);
+    entry.isCNA = entry.adapterType == 3 ? 1 : 0;
+    vpdValueInto(g_fruNumberVersion, entry.sku, kFruTexts);
+    vpdValueInto(g_partNumber, entry.partNumber, kPartNumberTexts);
+    entry.valid = 1;
+    PP_DEBUG("Exiting  createPhysicalPackage\n");
+    PP_DEBUG("Done calling createPhysicalPackage() for FC/FCoE device.");
+    ++index;
+}
+
+// One NIC protocol: the board as the NIC adapter list knows it, if it does.
+void createNicPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zorap_adapter_t* adapter,
+                      const char* adapterSerial, int& index)
+{
+    _CNAStruc* cna = nullptr;
+    for (_CNAStruc* c = m_CNAList; c != nullptr; c = c->next) {
+        char cnaSerial[sizeof(c->serialNumber) + 1];
+        copyFieldText(cnaSerial, c->serialNumber);
+        PP_DEBUG("Comparing %s to %s.", cnaSerial, adapterSerial);
+        if (std::strcmp(cnaSerial, adapterSerial) == 0) {
+            cna = c;
+            break;
+        }
+    }
+    if (cna == nullptr || list.count >= capacity)
+        return;
+    PP_DEBUG("Calling createPhysicalPackage() for NIC device.");
+    PhysicalPackageEntry& entry = list.entries[list.count++];
+    calcTag_PhysicalPackage(cna, entry.tag);
+    copyFieldText(entry.serialNumber, cna->serialNumber);
+    copyFieldText(entry.model, cna->modelName);
+    calcSKU_PhysicalPackage(cna, entry.sku);
+    calcPartNumber_PhysicalPackage(cna, entry.partNumber);
+    entry.adapterType = AdapterTypeOfKind(adapter->adapterKind);
+    entry.isCNA = entry.adapterType == 3 ? 1 : 0;
+    entry.valid = 1;
+    PP_DEBUG("Done calling createPhysicalPackage() for NIC device.");
+    ++index;
+}
+
+}  // namespace
+
+void buildPhysicalPackageList()
+{
+    _zorap_adapter_list_t* adapters = ZORAP_GetAdapterList();
+    if (adapters == nullptr)
+        return;
+    int capacity = 0;
+    for (_zorap_adapter_t* a = adapters->firstAdapter; a != nullptr; a = a->next)
+        ++capacity;
+    ClassList<PhysicalPackageEntry>& list = g_PhysicalPackageList;
+    if (!list.allocate(capacity))
+        return;
+    list.count = 0;
+
+    int index = 0;
+    Serial serial = {};   // kept from device to device, as the FC serial rule needs
+    for (_zorap_adapter_t* adapter = adapters->firstAdapter; adapter != nullptr; adapter = adapter->next) {
+        PP_DEBUG("buildPhysicalPackageList(): Processing an adapter entry.");
+        if (adapter->phyPortList == nullptr)
+            continue;
+        char adapterSerial[sizeof(adapter->serialNumber) + 1];
+        copyFieldText(adapterSerial, adapter->serialNumber);
+        for (_zorap_phy_port_t* phy = adapter->phyPortList->firstPhyPort; phy != nullptr; phy = phy->next) {
+            PP_DEBUG("buildPhysicalPackageList(): Processing an phyport entry.");
+            if (phy->protocolList == nullptr)
+                continue;
+            for (_zorap_protocol_t* protocol = phy->protocolList->firstProtocol; protocol != nullptr;
+                 protocol = protocol->next) {
+                PP_DEBUG("buildPhysicalPackageList(): Processing an protocol entry.");
+                if (protocol->protocolType > 2)
+                    continue;
+                const int same = slotWithSerial(list, adapterSerial);
+                if (same >= 0) {
+                    PP_DEBUG("Exiting  createPhysicalPackage: Current device has the same the serial number as a "
+                             "device in the list at index=%d. Skip %s!\n",
+                             same, adapterSerial);
+                    continue;
+                }
+                if (protocol->protocolType < 2)
+                    createFCPackage(list, capacity, adapter, &protocol->fcDevice, serial, index);
+                else
+                    createNicPackage(list, capacity, adapter, adapterSerial, index);
+            }
+        }
+    }
+}
+
+void removePhysicalPackageList()
+{
+    g_PhysicalPackageList.remove();
+}
+
+// ---------------------------------------------------------------------------
+// The instance.
+// ---------------------------------------------------------------------------
+namespace {
+
+const char kClassName[] = "Vexlan_Adapter_PhysicalPackage";
+
+// The stored texts are handed to the identity tests, which take writable
+// text: the 11S test trims the stored serial in place, as it always has. The
+// slots live in the list's own block, so they are writable.
+char* writable(const char* text)
+{
+    return const_cast<char*>(text);
+}
+
+bool is11S(const PhysicalPackageEntry& e)
+{
+    return IsIBM11SProductId(writable(e.serialNumber)) != 0;
+}
+
+bool isIBM(const PhysicalPackageEntry& e)
+{
+    return IsIBMBrandedAdapter(writable(e.model)) != 0 || is11S(e);
+}
+
+PropertyValue serialNumber(const PhysicalPackageEntry& e)
+{
+    if (is11S(e))
+        return CmpiData(GetSerialNumberFromIBM11SProductId(e.serialNumber));
+    return CmpiData(e.serialNumber);
+}
+
+PropertyValue partNumber(const PhysicalPackageEntry& e)
+{
+    if (is11S(e)) {
+        const char* part = GetPartNumberFromIBM11SProductId(writable(e.serialNumber));
+        return part != nullptr ? PropertyValue(CmpiData(part)) : std::nullopt;
+    }
+    if (e.partNumber[0] == '\0')
+        return std::nullopt;
+    return CmpiData(e.partNumber);
+}
+
+// "IBM CNA Adapter <serial>", "Vexlan Fibre Channel Adapter <serial>", ...
+PropertyValue packageName(const PhysicalPackageEntry& e)
+{
+    const char* vendor = isIBM(e) ? "IBM" : "Vexlan";
+    const char* serial = GetSerialNumberFromIBM11SProductId(e.serialNumber);
+    char text[512];
+    std::snprintf(text, sizeof(text), e.isCNA ? "%s CNA Adapter %s" : "%s Fibre Channel Adapter %s", vendor,
+                  serial != nullptr ? serial : "");
+    return CmpiData(text);
+}
+
+const PropertyRow<PhysicalPackageEntry> kProperties[] = {
+    {"Tag", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(e.tag))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(kClassName))},
+    {"Model", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(e.model))},
+    {"Manufacturer", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(isIBM(e) ? "IBM" : "Vexlan Corporation"))},
+    {"SerialNumber", CMPI_string, serialNumber},
+    {"PartNumber", CMPI_string, partNumber},
+    {"SKU", CMPI_string,
+     [](const PhysicalPackageEntry& e) -> PropertyValue {
+         return e.sku[0] != '\0' ? PropertyValue(CmpiData(e.sku)) : std::nullopt;
+     }},
+    {"PackageType", CMPI_uint16, CLASS_VALUE(PhysicalPackageEntry, CmpiData(static_cast<CMPIUint16>(9)))},
+    {"Name", CMPI_string, packageName},
+    {"Description", CMPI_string, packageName},
+    {"AdapterType", CMPI_uint32, CLASS_VALUE(PhysicalPackageEntry, CmpiData(static_cast<CMPIUint32>(e.adapterType)))},
+};
+
+const char* const kKeys[] = {"Tag", "CreationClassName", nullptr};
+
+const ClassModule<PhysicalPackageEntry> kPhysicalPackage =
+    ClassModule<PhysicalPackageEntry>("PhysicalPackage")
+        .list(g_PhysicalPackageList, ListKind::Dense)
+        .key("Tag", [](const PhysicalPackageEntry& e) -> const char* { return e.tag; })
+        .filterKeys(kKeys)
+        .pathKeys(kKeys)
+        .properties(kProperties);
+
+}  // namespace
+
+VEXLAN_LIST_CLASS_OPERATIONS(PhysicalPackage, kPhysicalPackage)
+
+// ---------------------------------------------------------------------------
+// The NIC side's way in.
+// ---------------------------------------------------------------------------
+int findSlot_Nic_PhysicalPackage(_CNAStruc* cna)
+{
+    if (cna == nullptr)
+        return -1;
+    char serial[sizeof(cna->serialNumber) + 1];
+    copyFieldText(serial, cna->serialNumber);
+    for (int i = 0; i < g_PhysicalPackageList.count; ++i)
+        if (strcasecmp(g_PhysicalPackageList.entries[i].serialNumber, serial) == 0)
+            return i;
+    return -1;
+}
+
+CmpiObjectPath makePath_Nic_PhysicalPackage(const char* className, const char* nameSpace, _CNAStruc* cna)
+{
+    PP_DEBUG("Vexlan_NIC_PhysicalPackage makePath_PhysicalPackage was called");
+    const int slot = findSlot_Nic_PhysicalPackage(cna);
+    if (slot < 0)
+        return CmpiObjectPath(static_cast<CMPIObjectPath*>(nullptr));
+    return makePath_PhysicalPackage(className, nameSpace, slot);
+}
+
+CmpiInstance makeInstance_Nic_PhysicalPackage(const char* className, const char* nameSpace, const char** properties,
+                                              _CNAStruc* cna)
+{
+    PP_DEBUG("Vexlan_NIC_PhysicalPackage makeInstance_PhysicalPackage was called");
+    const int slot = findSlot_Nic_PhysicalPackage(cna);
+    if (slot < 0)
+        return CmpiInstance(static_cast<CMPIInstance*>(nullptr));
+    return makeInstance_PhysicalPackage(className, nameSpace, properties, slot);
+}

@@ -1,0 +1,73 @@
+// Vexlan_Adapter_Product as a class module: one slot per adapter, with no
+// test for repeated serials (getInstance then finds the first).
+#include "classes/Vexlan_Adapter_Product_CMPI.h"
+
+#include <cstdio>
+
+#include "classes/Vexlan_Adapter_PhysicalPackage_CMPI.h"
+
+ClassList<ProductEntry> g_ProductList = {0, nullptr};
+
+void buildProductList()
+{
+    _zorap_adapter_list_t* adapters = ZORAP_GetAdapterList();
+    if (adapters == nullptr)
+        return;
+    int capacity = 0;
+    for (_zorap_adapter_t* a = adapters->firstAdapter; a != nullptr; a = a->next)
+        ++capacity;
+    ClassList<ProductEntry>& list = g_ProductList;
+    if (!list.allocate(capacity))
+        return;
+    list.count = 0;
+    for (_zorap_adapter_t* a = adapters->firstAdapter; a != nullptr && list.count < capacity; a = a->next) {
+        classmodule::buildLine(true, "Product", list.count);
+        ProductEntry& entry = list.entries[list.count];
+        copyFieldText(entry.identifyingNumber, a->serialNumber);
+        copyFieldText(entry.name, a->productName);
+        copyFieldText(entry.version, a->productVersion);
+        entry.adapterType = AdapterTypeOfKind(a->adapterKind);
+        entry.valid = 1;
+        ++list.count;
+        classmodule::buildLine(false, "Product", list.count - 1);
+    }
+}
+
+void removeProductList()
+{
+    g_ProductList.remove();
+}
+
+namespace {
+
+const char kVendor[] = "Vexlan Corporation";
+
+PropertyValue elementName(const ProductEntry& e)
+{
+    char text[512];
+    std::snprintf(text, sizeof(text), "%s_%s_%s", kVendor, e.version, e.name);
+    return CmpiData(text);
+}
+
+const PropertyRow<ProductEntry> kProperties[] = {
+    {"Name", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(e.name))},
+    {"IdentifyingNumber", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(e.identifyingNumber))},
+    {"Vendor", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(kVendor))},
+    {"Version", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(e.version))},
+    {"ElementName", CMPI_string, elementName},
+    {"AdapterType", CMPI_uint32, CLASS_VALUE(ProductEntry, CmpiData(static_cast<CMPIUint32>(e.adapterType)))},
+};
+
+const char* const kKeys[] = {"Name", "IdentifyingNumber", "Vendor", "Version", nullptr};
+
+const ClassModule<ProductEntry> kProduct =
+    ClassModule<ProductEntry>("Product")
+        .list(g_ProductList, ListKind::Dense)
+        .key("IdentifyingNumber", [](const ProductEntry& e) -> const char* { return e.identifyingNumber; })
+        .filterKeys(kKeys)
+        .pathKeys(kKeys)
+        .properties(kProperties);
+
+}  // namespace
+
+VEXLAN_LIST_CLASS_OPERATIONS(Product, kProduct)

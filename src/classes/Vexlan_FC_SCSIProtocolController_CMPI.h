@@ -1,0 +1,58 @@
+// Vexlan_FCHBA_SCSIProtocolController: the SCSI view of one FC function, one
+// instance per FC protocol, keyed by the port WWN.
+//
+// The record and the port-name build here serve the two SCSI endpoint classes
+// as well: the HBA endpoint is built exactly like the controller, and the
+// target endpoint keeps the same record with "<local WWN>_<target WWN>" names.
+#ifndef VEXLAN_CLASSES_VEXLAN_FC_SCSIPROTOCOLCONTROLLER_CMPI_H
+#define VEXLAN_CLASSES_VEXLAN_FC_SCSIPROTOCOLCONTROLLER_CMPI_H
+
+#include <cstddef>
+#include <cstdint>
+
+#include "classes/ClassModule.h"
+#include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
+
+// One slot of the controller and both endpoint lists.
+struct SCSIPortNameEntry {
+    unsigned char valid;
+    char name[128];   // DeviceID of the controller, Name of the endpoints
+};
+
+// A WWN in 16 upper-case hex digits; `out` holds kWWNTextSize bytes.
+constexpr std::size_t kWWNTextSize = 17;
+void FormatWWNText(const std::uint8_t wwn[8], char* out);
+
+// Full list of one slot per FC protocol, named by the port WWN; the build of
+// the controller and of the HBA endpoint. No debug lines.
+void buildSCSIPortNameList(ClassList<SCSIPortNameEntry>& list);
+
+extern ClassList<SCSIPortNameEntry> g_SCSIProtocolControllerList;
+
+void buildSCSIProtocolControllerList();
+void removeSCSIProtocolControllerList();
+
+VEXLAN_DECLARE_LIST_CLASS_OPERATIONS(SCSIProtocolController);
+
+// ---------------------------------------------------------------------------
+// The property rows of the two SCSI endpoint classes, which differ only in
+// their class name and their Role (2 for the HBA, 3 for a target).
+// ---------------------------------------------------------------------------
+extern const char* const kSCSIEndpointKeys[];   // SystemCreationClassName, SystemName, CreationClassName, Name
+
+template <const char* ClassName, CMPIUint16 Role>
+inline const PropertyRow<SCSIPortNameEntry> kSCSIEndpointProperties[] = {
+    {"SystemCreationClassName", CMPI_string,
+     CLASS_VALUE(SCSIPortNameEntry, CmpiData("Vexlan_Adapter_ComputerSystem"))},
+    {"SystemName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(hostName_ComputerSystem))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(ClassName))},
+    {"Name", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(e.name))},
+    {"ProtocolIFType", CMPI_uint16, CLASS_VALUE(SCSIPortNameEntry, CmpiData(static_cast<CMPIUint16>(56)))},
+    {"ConnectionType", CMPI_uint16, CLASS_VALUE(SCSIPortNameEntry, CmpiData(static_cast<CMPIUint16>(2)))},
+    {"Role", CMPI_uint16, CLASS_VALUE(SCSIPortNameEntry, CmpiData(Role))},
+    {"ElementName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(e.name))},
+    {"OtherTypeDescription", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(""))},
+    {"OperationalStatus", CMPI_uint16A, CLASS_VALUE(SCSIPortNameEntry, uint16Array({2}))},
+};
+
+#endif

@@ -1,0 +1,61 @@
+// Vexlan_FCHBA_SCSIProtocolEndpointTarget as a class module: a full list of
+// one slot per target that the FC devices report (Role 3).
+#include "classes/Vexlan_FC_SCSIProtocolEndpointTarget_CMPI.h"
+
+#include <cstdint>
+#include <cstdio>
+
+ClassList<SCSIPortNameEntry> g_SCSIProtocolEndpointTargetList = {0, nullptr};
+
+void buildSCSIProtocolEndpointTargetList()
+{
+    // The capacity is what the devices say they have; a sum beyond the
+    // signed count leaves the list empty.
+    std::uint64_t wanted = 0;
+    bool haveAdapters = classmodule::walkProtocols([&](_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* pr) {
+        if (pr->protocolType < 2)
+            wanted += pr->fcDevice.targetCount;
+    });
+    ClassList<SCSIPortNameEntry>& list = g_SCSIProtocolEndpointTargetList;
+    if (!haveAdapters || wanted > INT32_MAX || !list.allocate(static_cast<int>(wanted)))
+        return;
+    const int capacity = static_cast<int>(wanted);
+    int index = 0;
+    classmodule::walkProtocols([&](_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* pr) {
+        if (pr->protocolType >= 2)
+            return;
+        char local[kWWNTextSize];
+        FormatWWNText(pr->fcDevice.portWWN, local);
+        // The chain is followed as the library links it; a chain longer than
+        // the counts gives no slot beyond the capacity.
+        for (_zorap_target_t* target = pr->fcDevice.targetList; target != nullptr && index < capacity;
+             target = target->next) {
+            char remote[kWWNTextSize];
+            FormatWWNText(target->portWWN, remote);
+            SCSIPortNameEntry& entry = list.entries[index++];
+            std::snprintf(entry.name, sizeof(entry.name), "%s_%s", local, remote);
+            entry.valid = 1;
+        }
+    });
+}
+
+void removeSCSIProtocolEndpointTargetList()
+{
+    g_SCSIProtocolEndpointTargetList.remove();
+}
+
+namespace {
+
+constexpr char kClassName[] = "Vexlan_FCHBA_SCSIProtocolEndpointTarget";
+
+const ClassModule<SCSIPortNameEntry> kSCSIProtocolEndpointTarget =
+    ClassModule<SCSIPortNameEntry>("SCSIProtocolEndpointTarget")
+        .list(g_SCSIProtocolEndpointTargetList, ListKind::Full)
+        .key("Name", [](const SCSIPortNameEntry& e) -> const char* { return e.name; })
+        .filterKeys(kSCSIEndpointKeys)
+        .pathKeys(kSCSIEndpointKeys)
+        .properties(kSCSIEndpointProperties<kClassName, 3>);
+
+}  // namespace
+
+VEXLAN_LIST_CLASS_OPERATIONS(SCSIProtocolEndpointTarget, kSCSIProtocolEndpointTarget)
