@@ -4,6 +4,7 @@
 // raises its use count. The last cleanup (through the wrapper's
 // driveBaseCleanup) deletes it, so that factories called after that start a
 // new one.
+#include <deque>
 #include <exception>
 #include <mutex>
 
@@ -16,6 +17,19 @@ CmpiProviderBase baseVexlan_CNA_Provider;
 
 // Two first calls on two threads must not make two providers.
 std::mutex factoryMutex;
+
+// Every factory call hands out an MI object of its own. A server may call one
+// factory many times (sfcb does, once per registered class) and then cleans up
+// every MI it got: as each MI's cleanup lowers the use count once, the count
+// reaches 0 at the last one, which stops the polling thread before the
+// library is unloaded. The objects stay until the library is unloaded.
+template <class MI>
+MI& newMI()
+{
+    static std::deque<MI> handedOut;
+    handedOut.emplace_back();
+    return handedOut.back();
+}
 
 CMPIInstanceMIFT instMIFT = {
     CMPICurrentVersion,
@@ -75,11 +89,13 @@ void setStatus(CMPIStatus* rc, const CMPIBroker* mb, const CmpiStatus& st)
 
 // The body of all four factories.
 template <class MI, class FT>
-MI* createMI(MI& mi, FT* ft, const CMPIBroker* mb, const CMPIContext* ctx, CMPIStatus* rc)
+MI* createMI(FT* ft, const CMPIBroker* mb, const CMPIContext* ctx, CMPIStatus* rc)
 {
     std::lock_guard<std::mutex> serial(factoryMutex);
-    mi.ft = ft;
     try {
+        MI& mi = newMI<MI>();
+        mi.ft = ft;
+        mi.hdl = nullptr;
         CmpiBaseMI* provider = baseVexlan_CNA_Provider.getBaseMI();
         if (provider == nullptr) {
             CmpiBroker broker(mb);
@@ -114,29 +130,25 @@ CMPI_PROVIDER_FACTORY CMPIInstanceMI* Vexlan_CNA_Provider_Create_InstanceMI(cons
                                                                              const CMPIContext* ctx,
                                                                              CMPIStatus* rc)
 {
-    static CMPIInstanceMI mi;
-    return createMI(mi, &instMIFT, mb, ctx, rc);
+    return createMI<CMPIInstanceMI>(&instMIFT, mb, ctx, rc);
 }
 
 CMPI_PROVIDER_FACTORY CMPIAssociationMI* Vexlan_CNA_Provider_Create_AssociationMI(const CMPIBroker* mb,
                                                                                    const CMPIContext* ctx,
                                                                                    CMPIStatus* rc)
 {
-    static CMPIAssociationMI mi;
-    return createMI(mi, &assocMIFT, mb, ctx, rc);
+    return createMI<CMPIAssociationMI>(&assocMIFT, mb, ctx, rc);
 }
 
 CMPI_PROVIDER_FACTORY CMPIMethodMI* Vexlan_CNA_Provider_Create_MethodMI(const CMPIBroker* mb,
                                                                          const CMPIContext* ctx, CMPIStatus* rc)
 {
-    static CMPIMethodMI mi;
-    return createMI(mi, &methMIFT, mb, ctx, rc);
+    return createMI<CMPIMethodMI>(&methMIFT, mb, ctx, rc);
 }
 
 CMPI_PROVIDER_FACTORY CMPIIndicationMI* Vexlan_CNA_Provider_Create_IndicationMI(const CMPIBroker* mb,
                                                                                  const CMPIContext* ctx,
                                                                                  CMPIStatus* rc)
 {
-    static CMPIIndicationMI mi;
-    return createMI(mi, &indMIFT, mb, ctx, rc);
+    return createMI<CMPIIndicationMI>(&indMIFT, mb, ctx, rc);
 }

@@ -1,0 +1,143 @@
+#include "provider_env.h"
+
+#include <dirent.h>
+#include <netdb.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <fstream>
+#include <sstream>
+#include <thread>
+
+namespace provtest {
+
+const char* const kLogPath = "/opt/Vexlan_Corporation/CNAProviders/log/Vexlan_CNA_Provider.log";
+
+void writeFile(const std::string& path, const std::string& text)
+{
+    std::ofstream out(path, std::ios::trunc);
+    out << text;
+}
+
+void writeSettings(const std::string& optSettings, const std::string& cwdSettings)
+{
+    mkdir("/opt/Vexlan_Corporation", 0755);
+    mkdir("/opt/Vexlan_Corporation/CNAProviders", 0755);
+    mkdir("/opt/Vexlan_Corporation/CNAProviders/log", 0755);
+    std::remove("/opt/Vexlan_Corporation/CNAProviders/vexlancna.properties");
+    std::remove("vexlancna.properties");
+    if (!optSettings.empty())
+        writeFile("/opt/Vexlan_Corporation/CNAProviders/vexlancna.properties", optSettings);
+    if (!cwdSettings.empty())
+        writeFile("vexlancna.properties", cwdSettings);
+}
+
+void removeLog()
+{
+    std::remove(kLogPath);
+}
+
+std::vector<std::string> logLines()
+{
+    std::vector<std::string> lines;
+    std::ifstream in(kLogPath);
+    for (std::string line; std::getline(in, line);)
+        lines.push_back(line);
+    return lines;
+}
+
+int countLog(const std::string& text)
+{
+    int n = 0;
+    for (const auto& line : logLines())
+        if (line.find(text) != std::string::npos)
+            ++n;
+    return n;
+}
+
+bool waitForLog(const std::string& text, std::chrono::seconds limit, int occurrences)
+{
+    auto until = std::chrono::steady_clock::now() + limit;
+    while (countLog(text) < occurrences) {
+        if (std::chrono::steady_clock::now() > until)
+            return false;
+        std::this_thread::sleep_for(std::chrono::milliseconds(100));
+    }
+    return true;
+}
+
+void prepareHost(cimhost::Host& host, cimhost::Flavour flavour)
+{
+    host.setStrict(true);
+    host.setFlavour(flavour);
+    host.setDefaultNamespace(kNamespace);
+    cimhost::Status mof = host.loadMof(VEXLAN_MOF_DIR);
+    if (!mof.ok())
+        throw std::runtime_error("class definitions: " + mof.message);
+    cimhost::Status st = host.load(PROVIDER_LIBRARY, kProviderName);
+    if (!st.ok())
+        throw std::runtime_error("provider: " + st.message);
+}
+
+cimhost::ObjectPath classPath(const std::string& className)
+{
+    cimhost::ObjectPath p;
+    p.nameSpace = kNamespace;
+    p.className = className;
+    return p;
+}
+
+cimhost::ObjectPath hostPath(const cimhost::Value& name)
+{
+    cimhost::ObjectPath p = classPath("Vexlan_Adapter_ComputerSystem");
+    p.setKey("CreationClassName", cimhost::Value::fromString("Vexlan_Adapter_ComputerSystem"));
+    p.setKey("Name", name);
+    return p;
+}
+
+ExpectedHost expectedHost()
+{
+    char name[256] = {};
+    gethostname(name, sizeof(name) - 1);
+    struct hostent entry;
+    struct hostent* result = nullptr;
+    std::vector<char> work(65536);
+    int err = 0;
+    gethostbyname_r(name, &entry, work.data(), work.size(), &result, &err);
+    if (result == nullptr || result->h_addr_list[0] == nullptr)
+        return {name, "DNSName"};
+    const auto* a = reinterpret_cast<const unsigned char*>(result->h_addr_list[0]);
+    std::ostringstream text;
+    for (int i = 0; i < result->h_length; ++i)
+        text << (i ? "." : "") << static_cast<unsigned>(a[i]);
+    return {text.str(), "IP"};
+}
+
+int threadCount()
+{
+    int n = 0;
+    if (DIR* d = opendir("/proc/self/task")) {
+        while (dirent* e = readdir(d))
+            if (e->d_name[0] != '.')
+                ++n;
+        closedir(d);
+    }
+    return n;
+}
+
+std::string propertyText(const cimhost::Instance& inst, const std::string& name)
+{
+    const cimhost::Value* v = inst.property(name);
+    return v != nullptr ? v->s : std::string("<absent>");
+}
+
+std::vector<std::string> propertyNames(const cimhost::Instance& inst)
+{
+    std::vector<std::string> names;
+    for (const auto& p : inst.properties)
+        names.push_back(p.first);
+    return names;
+}
+
+}  // namespace provtest
