@@ -7,7 +7,7 @@
 #include <cstring>
 #include <string>
 
-#include "inventory/AdapterFunc_Chip.h"
+#include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "inventory/AdapterFunc_Identity.h"
 #include "inventory/AdapterFunc_VPD.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
@@ -96,22 +96,6 @@ int slotWithSerial(const ClassList<PhysicalPackageEntry>& list, const char* seri
     return -1;
 }
 
-// The serial of an FC device: the library's own serial text for chips of
-// code 7 and below; for newer chips the "SN" value of the VPD just read. When
-// that read failed the serial stays what the device before left in it.
-void selectFCSerial(_tagZORAPSDMDevice* device, int vpdResult, Serial& serial)
-{
-    if (GetRSX4GbOrNewerType(device) == 0) {
-        copyFieldText(serial, device->deviceSerial);
-        return;
-    }
-    if (vpdResult != 0)
-        return;
-    const char* colon = std::strchr(g_serialNumber, ':');
-    if (colon != nullptr)
-        safeStrCpy(serial, colon + 1, sizeof(Serial));
-}
-
 // The debug texts of one VPD-derived field: "<line label><line>",
 // "<value label><value>", and the line for a missing value.
 struct VpdFieldTexts {
@@ -155,7 +139,7 @@ void createFCPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zorap
         PP_DEBUG("Vexlan_FC_PhysicalPackage: createPhysicalPackage: VPD data retrieved successfully.");
     else
         PP_DEBUG("Vexlan_FC_PhysicalPackage: createPhysicalPackage: Unable to retrieve VPD data!");
-    selectFCSerial(device, r, serial);
+    TakeFCSerial(device, r, serial, sizeof(Serial));
 
     const int same = slotWithSerial(list, serial);
     if (same >= 0) {

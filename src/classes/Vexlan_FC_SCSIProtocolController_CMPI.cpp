@@ -2,18 +2,10 @@
 // protocol, DeviceID the port WWN.
 #include "classes/Vexlan_FC_SCSIProtocolController_CMPI.h"
 
-#include <cstdio>
-
 ClassList<SCSIPortNameEntry> g_SCSIProtocolControllerList = {0, nullptr};
 
 const char* const kSCSIEndpointKeys[] = {"SystemCreationClassName", "SystemName", "CreationClassName", "Name",
                                          nullptr};
-
-void FormatWWNText(const std::uint8_t wwn[8], char* out)
-{
-    std::snprintf(out, kWWNTextSize, "%02X%02X%02X%02X%02X%02X%02X%02X", wwn[0], wwn[1], wwn[2], wwn[3], wwn[4],
-                  wwn[5], wwn[6], wwn[7]);
-}
 
 void buildSCSIPortNameList(ClassList<SCSIPortNameEntry>& list)
 {
@@ -34,7 +26,7 @@ void buildSCSIPortNameList(ClassList<SCSIPortNameEntry>& list)
         if (!isFC(a, p, pr) || index >= capacity)
             return;
         SCSIPortNameEntry& entry = list.entries[index++];
-        FormatWWNText(pr->fcDevice.portWWN, entry.name);
+        FormatWWN(pr->fcDevice.portWWN, entry.name, sizeof(entry.name));
         entry.valid = 1;
     });
 }

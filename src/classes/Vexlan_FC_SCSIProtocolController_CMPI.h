@@ -7,21 +7,15 @@
 #ifndef VEXLAN_CLASSES_VEXLAN_FC_SCSIPROTOCOLCONTROLLER_CMPI_H
 #define VEXLAN_CLASSES_VEXLAN_FC_SCSIPROTOCOLCONTROLLER_CMPI_H
 
-#include <cstddef>
-#include <cstdint>
-
 #include "classes/ClassModule.h"
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
+#include "classes/Vexlan_FC_FCPort_CMPI.h"
 
 // One slot of the controller and both endpoint lists.
 struct SCSIPortNameEntry {
     unsigned char valid;
     char name[128];   // DeviceID of the controller, Name of the endpoints
 };
-
-// A WWN in 16 upper-case hex digits; `out` holds kWWNTextSize bytes.
-constexpr std::size_t kWWNTextSize = 17;
-void FormatWWNText(const std::uint8_t wwn[8], char* out);
 
 // Full list of one slot per FC protocol, named by the port WWN; the build of
 // the controller and of the HBA endpoint. No debug lines.

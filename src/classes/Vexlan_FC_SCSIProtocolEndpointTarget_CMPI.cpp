@@ -24,14 +24,14 @@ void buildSCSIProtocolEndpointTargetList()
     classmodule::walkProtocols([&](_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* pr) {
         if (pr->protocolType >= 2)
             return;
-        char local[kWWNTextSize];
-        FormatWWNText(pr->fcDevice.portWWN, local);
+        char local[kFCWWNTextSize];
+        FormatWWN(pr->fcDevice.portWWN, local, sizeof(local));
         // The chain is followed as the library links it; a chain longer than
         // the counts gives no slot beyond the capacity.
         for (_zorap_target_t* target = pr->fcDevice.targetList; target != nullptr && index < capacity;
              target = target->next) {
-            char remote[kWWNTextSize];
-            FormatWWNText(target->portWWN, remote);
+            char remote[kFCWWNTextSize];
+            FormatWWN(target->portWWN, remote, sizeof(remote));
             SCSIPortNameEntry& entry = list.entries[index++];
             std::snprintf(entry.name, sizeof(entry.name), "%s_%s", local, remote);
             entry.valid = 1;

@@ -30,11 +30,11 @@ void buildStorageExtentList()
         if (pr->protocolType >= 2)
             return;
         _tagZORAPSDMDevice* device = &pr->fcDevice;
-        char local[kWWNTextSize];
-        FormatWWNText(device->portWWN, local);
+        char local[kFCWWNTextSize];
+        FormatWWN(device->portWWN, local, sizeof(local));
         for (_zorap_target_t* target = device->targetList; target != nullptr; target = target->next) {
-            char remote[kWWNTextSize];
-            FormatWWNText(target->portWWN, remote);
+            char remote[kFCWWNTextSize];
+            FormatWWN(target->portWWN, remote, sizeof(remote));
             // A LUN chain longer than the counts gives no slot beyond the capacity.
             for (_zorap_lun_t* lun = target->lunList; lun != nullptr && index < capacity; lun = lun->next) {
                 classmodule::buildLine(true, "StorageExtent", index);
