@@ -103,8 +103,8 @@ public:
 
     // Hex bytes with optional ':', '-' or ' ' separators, exactly n of them
     // (or, with allowShort, 8 or 16).
-    std::vector<uint8_t> hexBytes(size_t n, const char* what) const {
-        std::string s = text(256), digits;
+    std::vector<uint8_t> hexBytes(size_t n, const char* what, size_t maxChars = 256) const {
+        std::string s = text(maxChars), digits;
         for (char c : s) {
             if (c == ':' || c == '-' || c == ' ') continue;
             if (!std::isxdigit(static_cast<unsigned char>(c)))
@@ -547,7 +547,8 @@ Adapter readAdapter(const Node& n, size_t index) {
         readVpd(n.at("vpd"), &a.vpdProductId, a.vpd);
     }
     if (n.has("vpdHex")) {
-        a.vpdRaw = n.at("vpdHex").hexBytes(0, "VPD bytes in hex");
+        // 64 KiB of bytes, written with separators at most.
+        a.vpdRaw = n.at("vpdHex").hexBytes(0, "VPD bytes in hex", 3 * 0x10000);
         if (a.vpdRaw->size() > 0x10000) fail(n.path() + ".vpdHex", "longer than 64 KiB");
         a.hasVpd = true;
     }

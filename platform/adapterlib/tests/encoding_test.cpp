@@ -215,6 +215,19 @@ TEST_F(SimTest, VpdRawStreamAndMissingVpdAndSmallBuffer) {
     size = sizeof buf;
     EXPECT_EQ(ZORAP_ERR_NOT_PRESENT, ZORAP_GetVpd(device(1, 0)->deviceHandle, 0, buf, &size));
     EXPECT_EQ(ZORAP_ERR_NOT_FOUND, ZORAP_GetVpd(0xDEAD, 0, buf, &size));
+
+    // A long raw stream (no end tag) is given back whole, within the size.
+    std::string hexText(600, 'a');
+    ASSERT_EQ(0, zorap_sim_load_json((R"({"adapters":[{"model":"R","serialNumber":"S","chip":"RSX-880","vpdHex":")" +
+                                      hexText + R"(","ports":[{"protocols":[{"type":"fc","nodeWWN":"3000000000000001","portWWN":"3100000000000001"}]}]}]})")
+                                         .c_str()));
+    ASSERT_EQ(ZORAP_OK, ZORAP_UpdateBackupAdapterList());
+    ASSERT_EQ(ZORAP_OK, ZORAP_SwapBackupToMainAdapterList());
+    uint8_t big[ZORAP_VPD_BUFFER_SIZE];
+    size = sizeof big;
+    ASSERT_EQ(ZORAP_OK, ZORAP_GetVpd(device(0, 0)->deviceHandle, 0, big, &size));
+    EXPECT_EQ(300u, size);
+    EXPECT_EQ(0xaa, big[299]);
 }
 
 TEST_F(SimTest, TransceiverPagesHoldBlankPaddedTextAtTheFixedOffsets) {
