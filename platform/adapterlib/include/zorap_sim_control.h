@@ -7,7 +7,8 @@
  * failures and count calls.  The provider itself never calls them.
  *
  * All functions are thread-safe.  Functions returning int give 0 on success
- * and -1 on failure (with a message on standard error).
+ * and -1 on failure; a bad argument or description also gives a message on
+ * standard error, a timeout or a dropped alarm does not.
  */
 #ifndef ZORAP_SIM_CONTROL_H
 #define ZORAP_SIM_CONTROL_H
