@@ -1,0 +1,147 @@
+// The helpers of the NIC and interop class modules that need no broker: key
+// texts that the associations compute, the configured server name, the NIC
+// profile chain and the link state mapping.
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include "classes/NicClassModule.h"
+#include "classes/Vexlan_FCHBA_ObjectManager_CMPI.h"
+#include "classes/Vexlan_NIC_EthernetPort.h"
+#include "classes/Vexlan_NIC_IPProtocolEndPoint.h"
+#include "classes/Vexlan_NIC_NetworkPort.h"
+#include "classes/Vexlan_NIC_PortController.h"
+#include "classes/Vexlan_NIC_RegisteredProfile.h"
+
+namespace {
+
+// An adapter record with one port, zero-filled as the adapter list makes them.
+struct Records {
+    _CNAStruc adapter;
+    _CNAPortStruc port;
+
+    Records(const char* serial, std::uint32_t portNumber, std::vector<std::uint8_t> mac)
+    {
+        std::memset(&adapter, 0, sizeof(adapter));
+        std::memset(static_cast<void*>(&port), 0, sizeof(port));
+        std::strncpy(adapter.serialNumber, serial, sizeof(adapter.serialNumber));
+        port.portNumber = portNumber;
+        std::memcpy(port.macAddress.octet, mac.data(), 6);
+        adapter.portList = &port;
+    }
+};
+
+std::string formatted(const char* configured, std::size_t size = 256)
+{
+    std::vector<char> out(size + 1, 'X');
+    formatCIMOMNameVersion(configured, out.data(), size);
+    return out.data();
+}
+
+}  // namespace
+
+TEST(NicKeyTexts, PortKeysFromSerialNumberAndMac)
+{
+    Records r("VXN0001", 3, {0x02, 0xab, 0xcd, 0x0e, 0xf0, 0x01});
+    char text[kNicKeyTextSize];
+
+    EXPECT_STREQ(calcDeviceID_EthernetPort(&r.adapter, &r.port, text), "02ABCD0EF001");
+    EXPECT_STREQ(calcName_IPProtocolEndPoint(&r.port, text), "02ABCD0EF001");
+    EXPECT_STREQ(calcDeviceID_NetworkPort(&r.adapter, &r.port, text), "VXN0001_3");
+    EXPECT_STREQ(calcElementName_NetworkPort(&r.adapter, &r.port, text), "02ABCD0EF001");
+
+    // Without a buffer the text lives in the function's own until its next call.
+    char* first = calcDeviceID_NetworkPort(&r.adapter, &r.port, nullptr);
+    EXPECT_STREQ(first, "VXN0001_3");
+    r.port.portNumber = 4294967295u;
+    EXPECT_EQ(calcDeviceID_NetworkPort(&r.adapter, &r.port, nullptr), first);
+    EXPECT_STREQ(first, "VXN0001_4294967295");
+    EXPECT_STREQ(calcElementName_NetworkPort(&r.adapter, &r.port, nullptr), "02ABCD0EF001");
+}
+
+TEST(NicKeyTexts, PortControllerDeviceIdIsTheSerialWithNicBehind)
+{
+    char serial[] = "VXC2447M0193";
+    char* id = BuildPortControllerDeviceID(serial);
+    EXPECT_STREQ(id, "VXC2447M0193_NIC");
+    char empty[] = "";
+    EXPECT_EQ(BuildPortControllerDeviceID(empty), id) << "one buffer, overwritten by the next call";
+    EXPECT_STREQ(id, "_NIC");
+    EXPECT_STREQ(BuildPortControllerDeviceID(nullptr), "_NIC");
+
+    Records r("VXN0001", 0, {0, 0, 0, 0, 0, 0});
+    char out[kPortControllerDeviceIdSize];
+    EXPECT_STREQ(calcDeviceID_PortController(&r.adapter, out), "VXN0001_NIC");
+
+    // A serial that fills its field to the last byte ends at the field's end.
+    std::memset(r.adapter.serialNumber, 'S', sizeof(r.adapter.serialNumber));
+    r.adapter.versionString[0] = 'V';
+    EXPECT_EQ(std::string(calcDeviceID_PortController(&r.adapter, out)),
+              std::string(sizeof(r.adapter.serialNumber), 'S') + "_NIC");
+
+    // A serial too long for the buffer is cut so that the suffix still fits.
+    std::string longSerial(1000, 'L');
+    std::string cut = BuildPortControllerDeviceID(&longSerial[0]);
+    EXPECT_EQ(cut.size(), kPortControllerDeviceIdSize - 1);
+    EXPECT_EQ(cut.substr(cut.size() - 4), "_NIC");
+}
+
+TEST(NicKeyTexts, LinkStateGivesStatusPair)
+{
+    Records r("S", 0, {0, 0, 0, 0, 0, 0});
+    const struct {
+        std::uint32_t state;
+        CMPIUint16 status;
+        const char* text;
+    } cases[] = {{1, 2, "Link Up"}, {2, 3, "Link Down"}, {3, 1, "Testing"},
+                 {0, 0, "Unknown"}, {4, 0, "Unknown"}, {0xFFFFFFFFu, 0, "Unknown"}};
+    for (const auto& c : cases) {
+        r.port.linkProperties.linkState = c.state;
+        NicLinkStatus s = nicLinkStatus(&r.port);
+        EXPECT_EQ(s.operationalStatus, c.status) << c.state;
+        EXPECT_STREQ(s.description, c.text) << c.state;
+    }
+}
+
+TEST(ObjectManagerName, ConfiguredTextIsNeverReadAsAFormat)
+{
+    EXPECT_EQ(formatted("Pegasus CIM Server"), "Pegasus CIM Server");
+    EXPECT_EQ(formatted("100%% busy"), "100% busy");
+    EXPECT_EQ(formatted("%%%%"), "%%");
+    EXPECT_EQ(formatted("%s %n %d %x"), "%s %n %d %x");
+    EXPECT_EQ(formatted("trailing %"), "trailing %");
+    EXPECT_EQ(formatted("%%s"), "%s");
+    EXPECT_EQ(formatted(""), "");
+    EXPECT_EQ(formatted(nullptr), "");
+    // Cut to the room given, always terminated.
+    EXPECT_EQ(formatted("abcdef", 4), "abc");
+    EXPECT_EQ(formatted("a%%b", 3), "a%");
+}
+
+TEST(NicProfileChain, EightNodesInOrderAndRebuiltWithoutGrowing)
+{
+    InitializeRegisteredProfileList();
+    InitializeRegisteredProfileList();
+    std::vector<std::uint32_t> ids;
+    std::vector<std::string> names;
+    for (_RegisteredProfile* p = m_RegisteredProfileList; p != nullptr; p = p->next) {
+        ids.push_back(p->id);
+        names.push_back(p->name);
+        EXPECT_EQ(std::string(p->description), "Vexlan NIC " + std::string(p->name));
+    }
+    EXPECT_EQ(ids, (std::vector<std::uint32_t>{1, 2, 3, 4, 5, 6, 6, 7}));
+    EXPECT_EQ(names[5], "Software Inventory Profile");
+    EXPECT_EQ(names[6], "Software Update Profile");
+
+    _RegisteredProfile* ipInterface = m_RegisteredProfileList->next->next;
+    EXPECT_STREQ(ipInterface->registeredName, "IP Interface");
+    EXPECT_STREQ(ipInterface->registeredVersion, "1.0.1");
+    EXPECT_EQ(ipInterface->registeredOrganization, 2);
+    EXPECT_EQ(ipInterface->next->registeredOrganization, 11);
+
+    Clear_RegisteredProfile_List();
+    EXPECT_EQ(m_RegisteredProfileList, nullptr);
+    Clear_RegisteredProfile_List();
+}
