@@ -1,0 +1,452 @@
+// The four FC classes through the shipped provider library and the embedded
+// CIM host in strict mode: what a client sees from ei, ein and gi, with the
+// default adapter description and with descriptions written here.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cctype>
+#include <set>
+#include <string>
+#include <vector>
+
+#include "fc_test_support.h"
+#include "provider_env.h"
+#include "zorap_cna.h"
+#include "zorap_sim_control.h"
+
+using namespace provtest;
+using cimhost::Host;
+using cimhost::Instance;
+using cimhost::ObjectPath;
+using cimhost::OpResult;
+using cimhost::Type;
+using cimhost::Value;
+using fctest::json;
+
+namespace {
+
+const char kLogsOn[] = "DebugLog=1\nErrorLog=1\n";
+const char kFCPort[] = "Vexlan_FCHBA_FCPort";
+const char kPortController[] = "Vexlan_FCHBA_PortController";
+const char kLogicalPortGroup[] = "Vexlan_FCHBA_LogicalPortGroup";
+const char kStatistics[] = "Vexlan_FCHBA_FCPortStatistics";
+
+const std::vector<std::string> kDeviceKeys = {"SystemCreationClassName", "SystemName", "CreationClassName",
+                                              "DeviceID"};
+
+std::string lower(std::string s)
+{
+    std::transform(s.begin(), s.end(), s.begin(), [](unsigned char c) { return static_cast<char>(std::tolower(c)); });
+    return s;
+}
+
+ObjectPath devicePath(const char* className, const std::string& deviceId)
+{
+    ObjectPath p = classPath(className);
+    p.setKey("SystemCreationClassName", Value::fromString("Vexlan_Adapter_ComputerSystem"));
+    p.setKey("SystemName", Value::fromString(expectedHost().name));
+    p.setKey("CreationClassName", Value::fromString(className));
+    p.setKey("DeviceID", Value::fromString(deviceId));
+    return p;
+}
+
+ObjectPath instanceIdPath(const char* className, const std::string& id)
+{
+    ObjectPath p = classPath(className);
+    p.setKey("InstanceID", Value::fromString(id));
+    return p;
+}
+
+std::vector<std::string> keyNames(const ObjectPath& p)
+{
+    std::vector<std::string> names;
+    for (const auto& k : p.keys)
+        names.push_back(k.first);
+    return names;
+}
+
+// A scalar property, checked for its CIM type.
+const Value& scalar(const Instance& inst, const std::string& name, Type type)
+{
+    static const Value missing;
+    const Value* v = inst.property(name);
+    EXPECT_NE(v, nullptr) << name;
+    if (v == nullptr)
+        return missing;
+    EXPECT_EQ(v->type, type) << name;
+    EXPECT_FALSE(v->array) << name;
+    return *v;
+}
+
+// The one element of a one-element uint16 array.
+std::uint64_t firstOf(const Instance& inst, const std::string& name)
+{
+    const Value* v = inst.property(name);
+    EXPECT_NE(v, nullptr) << name;
+    if (v == nullptr || !v->array || v->elems.size() != 1)
+        return ~0ull;
+    EXPECT_EQ(v->type, Type::UInt16) << name;
+    return v->elems[0].u;
+}
+
+OpResult enumerate(Host& host, const char* className)
+{
+    OpResult r = host.enumerateInstances(classPath(className));
+    EXPECT_TRUE(r.ok()) << className << ": " << r.message;
+    EXPECT_TRUE(r.strictErrors.empty()) << className << ": " << (r.strictErrors.empty() ? "" : r.strictErrors[0]);
+    return r;
+}
+
+// Starts the provider on a description (null: the default host) and waits
+// for its first build by a first request.
+void start(Host& host, const json* description)
+{
+    writeSettings(kLogsOn, "");
+    removeLog();
+    if (description != nullptr)
+        ASSERT_EQ(0, zorap_sim_load_json(description->dump().c_str()));
+    else
+        ASSERT_EQ(0, zorap_sim_load_default());
+    zorap_sim_reset();
+    prepareHost(host);
+    ASSERT_TRUE(host.enumerateInstanceNames(classPath(kPortController)).ok());
+}
+
+}  // namespace
+
+// ---- The default host ------------------------------------------------------------
+
+class FCDefaultHost : public ::testing::Test {
+protected:
+    static void SetUpTestSuite()
+    {
+        host_ = new Host;
+        start(*host_, nullptr);
+    }
+    static void TearDownTestSuite()
+    {
+        delete host_;
+        host_ = nullptr;
+        zorap_sim_reset();
+    }
+    void TearDown() override { zorap_sim_reset(); }
+    static Host* host_;
+};
+Host* FCDefaultHost::host_ = nullptr;
+
+TEST_F(FCDefaultHost, FCPortsShowTheirPropertiesInOrderWithTheLibraryValues)
+{
+    OpResult r = enumerate(*host_, kFCPort);
+    ASSERT_EQ(r.instances.size(), 5u);
+    const Instance& hba = r.instances[0];
+    EXPECT_EQ(propertyNames(hba),
+              (std::vector<std::string>{"SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID",
+                                        "OperationalStatus", "ActiveFC4Types", "PortType", "Speed", "MaxSpeed",
+                                        "PermanentAddress", "LinkTechnology", "ElementName", "UsageRestriction",
+                                        "SupportedMaximumTransmissionUnit", "VPDData", "OptionROMVersions",
+                                        "SpeedDescription", "DeviceNumber", "DeviceStatus", "Model",
+                                        "ENodeMACAddress"}));
+    EXPECT_EQ(propertyText(hba, "SystemCreationClassName"), "Vexlan_Adapter_ComputerSystem");
+    EXPECT_EQ(propertyText(hba, "SystemName"), expectedHost().name);
+    EXPECT_EQ(propertyText(hba, "CreationClassName"), kFCPort);
+    EXPECT_EQ(propertyText(hba, "DeviceID"), "VXA1631K0042_3000027E5A160042_3100027E5A160042");
+    EXPECT_EQ(propertyText(hba, "ElementName"), "VXA1631K0042_3000027E5A160042_3100027E5A160042");
+    EXPECT_EQ(firstOf(hba, "OperationalStatus"), 2u);
+    EXPECT_EQ(firstOf(hba, "ActiveFC4Types"), 0u);
+    EXPECT_EQ(scalar(hba, "PortType", Type::UInt16).u, 15u);
+    EXPECT_EQ(scalar(hba, "Speed", Type::UInt64).u, 17000000000ull);
+    EXPECT_EQ(scalar(hba, "MaxSpeed", Type::UInt64).u, 17000000000ull);
+    EXPECT_EQ(propertyText(hba, "PermanentAddress"), "3100027E5A160042");
+    EXPECT_EQ(scalar(hba, "LinkTechnology", Type::UInt16).u, 4u);
+    EXPECT_EQ(scalar(hba, "UsageRestriction", Type::UInt16).u, 0u);
+    EXPECT_EQ(scalar(hba, "SupportedMaximumTransmissionUnit", Type::UInt64).u, 0u);
+    EXPECT_EQ(propertyText(hba, "VPDData"),
+              "Product Identifier:Vexlan 16Gb Dual-Port Fibre Channel HBA;Part Number:VXF1622-01;"
+              "Serial Number:VXA1631K0042;FC Code:FC16-2P;Fru Number:VXF1622-FRU;Miscellaneous Information:PCIe "
+              "Gen3 x8;Manufacturing Id:7E5A;EFI Driver Version:7.00;Firmware Version:8.08.204;BIOS Version:3.64;"
+              "FCode Version:4.12.03");
+    EXPECT_EQ(propertyText(hba, "OptionROMVersions"),
+              "OptionROM BIOS Version:3.64;OptionROM EFI Version:7.00;OptionROM FCode Version:4.12;"
+              "OptionROM Firmware Version:8.08.204");
+    EXPECT_EQ(propertyText(hba, "SpeedDescription"), "See Speed");
+    EXPECT_EQ(scalar(hba, "DeviceNumber", Type::UInt16).u, 0u);
+    EXPECT_EQ(scalar(hba, "DeviceStatus", Type::SInt32).i, 0);
+    EXPECT_EQ(propertyText(hba, "Model"), "VXF1622");
+    EXPECT_EQ(propertyText(hba, "ENodeMACAddress"), "Not Available");
+    EXPECT_EQ(scalar(r.instances[1], "DeviceNumber", Type::UInt16).u, 1u);
+
+    const Instance& cna = r.instances[2];
+    EXPECT_EQ(propertyText(cna, "ENodeMACAddress"), "027E5A244701");
+    EXPECT_EQ(scalar(cna, "Speed", Type::UInt64).u, 10625000000ull);
+    EXPECT_EQ(scalar(cna, "MaxSpeed", Type::UInt64).u, 10625000000ull);
+    EXPECT_NE(propertyText(cna, "VPDData").find(";Flash Image Version:4.18.7"), std::string::npos);
+    EXPECT_EQ(propertyText(cna, "OptionROMVersions"),
+              "OptionROM BIOS Version:3.30;OptionROM EFI Version:6.21;OptionROM FCode Version:N/A;"
+              "OptionROM Firmware Version:4.18.07");
+
+    const Instance& fourG = r.instances[4];
+    EXPECT_EQ(propertyText(fourG, "DeviceID"), "11SVXL4G01ZV10C4001234_3000027E5A041234_3100027E5A041234");
+    EXPECT_EQ(scalar(fourG, "Speed", Type::UInt64).u, 4250000000ull);
+    EXPECT_EQ(scalar(fourG, "MaxSpeed", Type::UInt64).u, 4250000000ull);
+
+    OpResult names = host_->enumerateInstanceNames(classPath(kFCPort));
+    ASSERT_TRUE(names.ok()) << names.message;
+    ASSERT_EQ(names.paths.size(), 5u);
+    EXPECT_EQ(keyNames(names.paths[3]), kDeviceKeys);
+    EXPECT_EQ(names.paths[3].keys[3].second.s, "VXC2447M0193_3000027E5A244793_3101027E5A244793");
+}
+
+TEST_F(FCDefaultHost, GetInstanceIgnoresCaseAndAMissNamesTheKey)
+{
+    const std::string id = "VXA1631K0042_3000027E5A160042_3101027E5A160042";
+    OpResult r = host_->getInstance(devicePath(kFCPort, lower(id)));
+    ASSERT_TRUE(r.ok()) << r.message;
+    ASSERT_EQ(r.instances.size(), 1u);
+    EXPECT_EQ(propertyText(r.instances[0], "DeviceID"), id);
+
+    OpResult filtered = host_->getInstance(devicePath(kFCPort, id), std::vector<std::string>{"Model"});
+    ASSERT_TRUE(filtered.ok()) << filtered.message;
+    ASSERT_EQ(filtered.instances.size(), 1u);
+    EXPECT_EQ(propertyNames(filtered.instances[0]),
+              (std::vector<std::string>{"SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID",
+                                        "Model"}));
+
+    for (const char* cls : {kFCPort, kPortController}) {
+        OpResult miss = host_->getInstance(devicePath(cls, "NO_SUCH_DEVICE"));
+        EXPECT_EQ(miss.rc, 6) << cls;
+        EXPECT_EQ(miss.message, "NO_SUCH_DEVICE") << cls;
+        EXPECT_TRUE(miss.instances.empty());
+    }
+    for (const char* cls : {kLogicalPortGroup, kStatistics}) {
+        OpResult miss = host_->getInstance(instanceIdPath(cls, "NO_SUCH_ID"));
+        EXPECT_EQ(miss.rc, 6) << cls;
+        EXPECT_EQ(miss.message, "NO_SUCH_ID") << cls;
+    }
+    EXPECT_GE(countLog("getInstance_FCPort: Error no matching instance found, KeyValue=NO_SUCH_DEVICE!"), 1);
+}
+
+TEST_F(FCDefaultHost, PortControllersOnePerAdapterSerial)
+{
+    OpResult r = enumerate(*host_, kPortController);
+    ASSERT_EQ(r.instances.size(), 3u);
+    const Instance& c = r.instances[1];
+    EXPECT_EQ(propertyNames(c),
+              (std::vector<std::string>{"SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID",
+                                        "OperationalStatus", "StatusDescriptions", "ProtocolSupported",
+                                        "ElementName", "ControllerType", "ENodeMACAddress"}));
+    EXPECT_EQ(propertyText(c, "CreationClassName"), kPortController);
+    EXPECT_EQ(propertyText(c, "DeviceID"), "VXC2447M0193");
+    EXPECT_EQ(propertyText(c, "ElementName"), "VXC2447M0193");
+    EXPECT_EQ(firstOf(c, "OperationalStatus"), 1u);
+    const Value* descriptions = c.property("StatusDescriptions");
+    ASSERT_NE(descriptions, nullptr);
+    ASSERT_EQ(descriptions->elems.size(), 1u);
+    EXPECT_EQ(descriptions->elems[0].s,
+              "Review operational status values for corresponding Vexlan_FCHBA_FCPort instances");
+    EXPECT_EQ(scalar(c, "ProtocolSupported", Type::UInt16).u, 10u);
+    EXPECT_EQ(scalar(c, "ControllerType", Type::UInt16).u, 4u);
+    EXPECT_EQ(propertyText(c, "ENodeMACAddress"), "027E5A244701");
+    EXPECT_EQ(propertyText(r.instances[0], "ENodeMACAddress"), "Not Available");
+    EXPECT_EQ(propertyText(r.instances[2], "DeviceID"), "11SVXL4G01ZV10C4001234");
+
+    OpResult names = host_->enumerateInstanceNames(classPath(kPortController));
+    ASSERT_EQ(names.paths.size(), 3u);
+    EXPECT_EQ(keyNames(names.paths[0]), kDeviceKeys);
+    EXPECT_GE(countLog("Exiting  createPortController: Current device has the same the serial number as a device "
+                       "in the list at index=1. Skip!"),
+              1);
+}
+
+TEST_F(FCDefaultHost, LogicalPortGroupsEnumerateAnUnfilledSlotThatGetInstanceStepsOver)
+{
+    OpResult r = enumerate(*host_, kLogicalPortGroup);
+    ASSERT_EQ(r.instances.size(), 4u);
+    const std::string hostName = expectedHost().name;
+    EXPECT_EQ(propertyNames(r.instances[0]),
+              (std::vector<std::string>{"InstanceID", "ElementName", "Name", "NameFormat"}));
+    EXPECT_EQ(propertyText(r.instances[0], "InstanceID"),
+              hostName + "_VXA1631K0042_3000027E5A160042_3100027E5A160042");
+    EXPECT_EQ(propertyText(r.instances[0], "ElementName"), "3000027E5A160042");
+    EXPECT_EQ(propertyText(r.instances[0], "Name"), "3000027E5A160042");
+    EXPECT_EQ(propertyText(r.instances[0], "NameFormat"), "WWN");
+    EXPECT_EQ(propertyText(r.instances[1], "InstanceID"), "");
+    EXPECT_EQ(propertyText(r.instances[1], "Name"), "");
+    EXPECT_EQ(propertyText(r.instances[3], "InstanceID"),
+              hostName + "_VXC2447M0193_3000027E5A244793_3101027E5A244793");
+
+    OpResult empty = host_->getInstance(instanceIdPath(kLogicalPortGroup, ""));
+    EXPECT_EQ(empty.rc, 6);
+    EXPECT_GE(countLog("getInstance_LogicalPortGroup: Found a device that has the same InstanceID but the entry is "
+                       "invalid.  Move on..."),
+              1);
+
+    OpResult found = host_->getInstance(
+        instanceIdPath(kLogicalPortGroup, lower(hostName + "_VXC2447M0193_3000027E5A244793_3100027E5A244793")));
+    ASSERT_TRUE(found.ok()) << found.message;
+    ASSERT_EQ(found.instances.size(), 1u);
+    EXPECT_EQ(propertyText(found.instances[0], "Name"), "3000027E5A244793");
+
+    OpResult names = host_->enumerateInstanceNames(classPath(kLogicalPortGroup));
+    ASSERT_EQ(names.paths.size(), 4u);
+    EXPECT_EQ(keyNames(names.paths[2]), std::vector<std::string>{"InstanceID"});
+}
+
+TEST_F(FCDefaultHost, StatisticsShowNineCountersAndSeventeenZeros)
+{
+    OpResult r = enumerate(*host_, kStatistics);
+    ASSERT_EQ(r.instances.size(), 5u);
+    const Instance& s = r.instances[0];
+    const std::vector<std::string> counters = {"LIPCount",
+                                               "LinkFailures",
+                                               "LossOfSyncCounter",
+                                               "LossOfSignalCounter",
+                                               "PrimitiveSeqProtocolErrCount",
+                                               "CRCErrors",
+                                               "InvalidTransmissionWords",
+                                               "IOCount",
+                                               "MegabyteCount"};
+    const std::vector<std::string> zeros = {
+        "BytesTransmitted",   "BytesReceived",           "PacketsTransmitted",      "PacketsReceived",
+        "NOSCount",           "ErrorFrames",             "DumpedFrames",            "FramesTooShort",
+        "FramesTooLong",      "AddressErrors",           "BufferCreditNotProvided", "DelimiterErrors",
+        "EncodingDisparityErrors", "LinkResetsReceived", "LinkResetsTransmitted",   "MulticastFramesReceived",
+        "MulticastFramesTransmitted"};
+    std::vector<std::string> order = {"InstanceID", "ElementName"};
+    order.insert(order.end(), counters.begin(), counters.end());
+    order.insert(order.end(), zeros.begin(), zeros.end());
+    EXPECT_EQ(propertyNames(s), order);
+    EXPECT_EQ(propertyText(s, "InstanceID"), "3000027E5A160042_3100027E5A160042");
+    EXPECT_EQ(propertyText(s, "ElementName"), "3100027E5A160042");
+    const unsigned long long expected[] = {2, 1, 3, 1, 0, 0, 14, 18804312, 913220};
+    for (std::size_t i = 0; i < counters.size(); ++i)
+        EXPECT_EQ(scalar(s, counters[i], Type::UInt64).u, expected[i]) << counters[i];
+    for (const auto& name : zeros)
+        EXPECT_EQ(scalar(s, name, Type::UInt64).u, 0u) << name;
+
+    OpResult got = host_->getInstance(instanceIdPath(kStatistics, "3000027e5a041234_3100027e5a041234"));
+    ASSERT_TRUE(got.ok()) << got.message;
+    ASSERT_EQ(got.instances.size(), 1u);
+    EXPECT_EQ(scalar(got.instances[0], "LIPCount", Type::UInt64).u, 7u);
+}
+
+TEST_F(FCDefaultHost, PortsAndStatisticsAreRebuiltForEachRequestControllersAreNot)
+{
+    const char* wwn = "3101027E5A160042";
+    ASSERT_EQ(0, zorap_sim_set_fc_port_state(wwn, ZORAP_PORT_STATE_LOOPDOWN));
+    const std::uint32_t counters[9] = {100, 200, 3, 4, 5, 6, 7, 8, 9};
+    ASSERT_EQ(0, zorap_sim_set_fc_port_stats(wwn, counters));
+
+    OpResult ports = enumerate(*host_, kFCPort);
+    ASSERT_EQ(ports.instances.size(), 5u);
+    EXPECT_EQ(firstOf(ports.instances[1], "OperationalStatus"), 6u);
+    EXPECT_EQ(scalar(ports.instances[1], "DeviceStatus", Type::SInt32).i, 4097);
+    EXPECT_EQ(firstOf(ports.instances[0], "OperationalStatus"), 2u);
+    EXPECT_GE(countLog("Port state - Loopdown..."), 1);
+
+    OpResult stats = host_->getInstance(instanceIdPath(kStatistics, "3000027E5A160042_3101027E5A160042"));
+    ASSERT_TRUE(stats.ok()) << stats.message;
+    ASSERT_EQ(stats.instances.size(), 1u);
+    EXPECT_EQ(scalar(stats.instances[0], "LIPCount", Type::UInt64).u, 3u);
+    EXPECT_EQ(scalar(stats.instances[0], "IOCount", Type::UInt64).u, 100u);
+    EXPECT_EQ(scalar(stats.instances[0], "CRCErrors", Type::UInt64).u, 9u);
+
+    const unsigned long vpdReads = zorap_sim_call_count(ZORAP_FN_GetVpd);
+    enumerate(*host_, kPortController);
+    enumerate(*host_, kLogicalPortGroup);
+    EXPECT_EQ(zorap_sim_call_count(ZORAP_FN_GetVpd), vpdReads);
+    enumerate(*host_, kFCPort);
+    EXPECT_GT(zorap_sim_call_count(ZORAP_FN_GetVpd), vpdReads);
+
+    const std::uint32_t described[9] = {17220931, 880412, 1, 0, 2, 0, 0, 9, 1};
+    ASSERT_EQ(0, zorap_sim_set_fc_port_stats(wwn, described));
+    ASSERT_EQ(0, zorap_sim_set_fc_port_state(wwn, ZORAP_PORT_STATE_ONLINE));
+    EXPECT_EQ(firstOf(enumerate(*host_, kFCPort).instances[1], "OperationalStatus"), 2u);
+}
+
+TEST_F(FCDefaultHost, AFailedLibraryCallForOneDeviceLeavesDefaultsThere)
+{
+    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_GetHbaDevicePortProperty, ZORAP_ERR_FAILED, 1));
+    OpResult ports = enumerate(*host_, kFCPort);
+    ASSERT_EQ(ports.instances.size(), 5u);
+    const Instance& failed = ports.instances[0];
+    EXPECT_EQ(firstOf(failed, "OperationalStatus"), 0u);
+    EXPECT_EQ(scalar(failed, "PortType", Type::UInt16).u, 0u);
+    EXPECT_EQ(scalar(failed, "Speed", Type::UInt64).u, 0u);
+    EXPECT_EQ(propertyText(failed, "SpeedDescription"), "");
+    EXPECT_EQ(scalar(failed, "MaxSpeed", Type::UInt64).u, 17000000000ull);
+    EXPECT_EQ(firstOf(ports.instances[1], "OperationalStatus"), 2u);
+
+    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_RefreshDeviceStats, ZORAP_ERR_FAILED, 1));
+    OpResult stats = enumerate(*host_, kStatistics);
+    ASSERT_EQ(stats.instances.size(), 5u);
+    EXPECT_EQ(scalar(stats.instances[0], "LIPCount", Type::UInt64).u, 0u);
+    EXPECT_EQ(scalar(stats.instances[0], "IOCount", Type::UInt64).u, 0u);
+    EXPECT_EQ(scalar(stats.instances[4], "LIPCount", Type::UInt64).u, 7u);
+    EXPECT_GE(countLog("Vexlan_FC_FCPortStatistics ERROR in getting statistical data..."), 1);
+
+    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_GetVpd, ZORAP_ERR_FAILED, 1));
+    ports = enumerate(*host_, kFCPort);
+    ASSERT_EQ(ports.instances.size(), 5u);
+    EXPECT_EQ(propertyText(ports.instances[0], "VPDData"), "");
+    EXPECT_EQ(propertyText(ports.instances[0], "DeviceID"), "_3000027E5A160042_3100027E5A160042");
+    EXPECT_EQ(propertyText(ports.instances[1], "DeviceID"), "VXA1631K0042_3000027E5A160042_3101027E5A160042");
+}
+
+// ---- Hosts written here ------------------------------------------------------------
+
+TEST(FCHosts, SerialsThatDifferInCaseMakeTwoControllersAndTwoDualPortAdaptersSkewTheGroups)
+{
+    json description =
+        fctest::host(json::array({fctest::fcAdapter(1, "RSX-1620", 2, "abc1"), fctest::fcAdapter(2, "RSX-1620", 2, "ABC1")}));
+    Host host;
+    start(host, &description);
+
+    OpResult controllers = enumerate(host, kPortController);
+    ASSERT_EQ(controllers.instances.size(), 2u);
+    EXPECT_EQ(propertyText(controllers.instances[0], "DeviceID"), "abc1");
+    EXPECT_EQ(propertyText(controllers.instances[1], "DeviceID"), "ABC1");
+    for (const char* key : {"ABC1", "Abc1", "abc1"}) {
+        OpResult got = host.getInstance(devicePath(kPortController, key));
+        ASSERT_TRUE(got.ok()) << key << ": " << got.message;
+        ASSERT_EQ(got.instances.size(), 1u);
+        EXPECT_EQ(propertyText(got.instances[0], "DeviceID"), "abc1") << key;
+    }
+
+    OpResult groups = enumerate(host, kLogicalPortGroup);
+    ASSERT_EQ(groups.instances.size(), 3u);
+    EXPECT_EQ(propertyText(groups.instances[1], "InstanceID"), "");
+    EXPECT_EQ(propertyText(groups.instances[2], "Name"), "3000000000020000");
+    OpResult empty = host.getInstance(instanceIdPath(kLogicalPortGroup, ""));
+    EXPECT_EQ(empty.rc, 6);
+    EXPECT_EQ(empty.message, "");
+    ASSERT_TRUE(host.unload(true).ok());
+}
+
+TEST(FCHosts, SixtyFourAdaptersOfFourFCFunctionsEach)
+{
+    json description = fctest::wideHost();
+    Host host;
+    start(host, &description);
+
+    OpResult names = host.enumerateInstanceNames(classPath(kFCPort));
+    ASSERT_TRUE(names.ok()) << names.message;
+    ASSERT_EQ(names.paths.size(), 256u);
+    std::set<std::string> ids;
+    for (const auto& p : names.paths)
+        ids.insert(p.keys[3].second.s);
+    EXPECT_EQ(ids.size(), 256u);
+
+    EXPECT_EQ(enumerate(host, kFCPort).instances.size(), 256u);
+    EXPECT_EQ(enumerate(host, kStatistics).instances.size(), 256u);
+    EXPECT_EQ(enumerate(host, kPortController).instances.size(), 64u);
+    EXPECT_EQ(enumerate(host, kLogicalPortGroup).instances.size(), 253u);
+
+    OpResult last = host.getInstance(devicePath(kFCPort, "VXW0063_30000000003F0000_31000000003F0300"));
+    ASSERT_TRUE(last.ok()) << last.message;
+    ASSERT_EQ(last.instances.size(), 1u);
+    EXPECT_EQ(scalar(last.instances[0], "DeviceNumber", Type::UInt16).u, 3u);
+    OpResult controller = host.getInstance(devicePath(kPortController, "vxw0063"));
+    ASSERT_TRUE(controller.ok()) << controller.message;
+    EXPECT_EQ(controller.instances.size(), 1u);
+    ASSERT_TRUE(host.unload(true).ok());
+}
