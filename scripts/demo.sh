@@ -38,6 +38,27 @@ run_tour() {
   awk -F'[:.]' '/^root\/vexlan_cmpi:/ { n[$2]++; if (!($2 in first)) { first[$2] = $0; order[++k] = $2 } }
        END { for (i = 1; i <= k; i++) printf "%3d  %s\n     e.g. %s\n", n[order[i]], order[i], first[order[i]] }' tour.out
   grep -v '^Vexlan_NIC_Properties::reload' tour.err || true
+  nic_tour
+}
+
+# The NIC side in full: the ports, their controller and endpoints, the NIC
+# profile that answers to "6", and the object manager with its namespaces.
+nic_tour() {
+  local batch=nic.batch
+  {
+    for cls in Vexlan_NIC_EthernetPort2 Vexlan_NIC_NetworkPort Vexlan_NIC_PortController \
+               Vexlan_NIC_LANEndpoint Vexlan_NIC_IPProtocolEndpoint Vexlan_NIC_IPProtocolEndpointCapabilities; do
+      echo "ei root/vexlan_cmpi:$cls"
+    done
+    echo 'gi root/vexlan_cmpi:Vexlan_NIC_RegisteredProfile.InstanceID="6"'
+    echo "ei root/vexlan_cmpi:Vexlan_FCHBA_ObjectManager"
+    echo "ein root/vexlan_cmpi:Vexlan_FCHBA_Namespace"
+  } > "$batch"
+  echo
+  echo "== the NIC side: ports, controller, endpoints, a profile, the object manager"
+  "$BUILD/bin/cimhost" --strict -p "$BUILD/lib/libVexlan_CNA_Provider.so.1" -n Vexlan_CNA_Provider \
+    -m "$BUILD/share/vexlan-cna/mof" -N root/vexlan_cmpi batch "$batch" 2> nic.err | grep -v '^//' || true
+  grep -v '^Vexlan_NIC_Properties::reload' nic.err || true
 }
 
 if [ "${1:-}" = --inside ]; then
