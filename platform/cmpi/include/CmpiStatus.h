@@ -17,14 +17,17 @@ public:
     // CMPI_RC_OK without a message.
     CmpiStatus();
     CmpiStatus(CMPIrc rc);
-    // A null msg is the same as no message.
+    // A null msg is the same as no message.  (A CmpiData of string type
+    // converts to const char*, so a key value can be given directly.)
     CmpiStatus(CMPIrc rc, const char* msg);
+    CmpiStatus(CMPIrc rc, const std::string& msg);
     // Copies rc and the text of st.msg (if any).
     CmpiStatus(const CMPIStatus& st);
 
     CMPIrc rc() const { return rc_; }
-    // The message text, or nullptr when the status has none.
-    const char* msg() const { return hasMsg_ ? msg_.c_str() : nullptr; }
+    // The message text; "" when the status has none (hasMsg() tells the
+    // two apart), so that it can always be printed.
+    const char* msg() const { return msg_.c_str(); }
     bool hasMsg() const { return hasMsg_; }
 
     // The C form for the server.  The message is created with mb's

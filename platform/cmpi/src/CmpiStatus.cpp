@@ -69,6 +69,8 @@ CmpiStatus::CmpiStatus(CMPIrc rc, const char* msg)
 {
 }
 
+CmpiStatus::CmpiStatus(CMPIrc rc, const std::string& msg) : rc_(rc), hasMsg_(true), msg_(msg) {}
+
 CmpiStatus::CmpiStatus(const CMPIStatus& st) : rc_(st.rc), hasMsg_(false)
 {
     if (st.msg != nullptr && st.msg->ft != nullptr && st.msg->ft->getCharPtr != nullptr) {

@@ -259,10 +259,18 @@ TEST_F(Values, StatusValueAndCForm)
 {
     CmpiStatus ok;
     EXPECT_EQ(ok.rc(), CMPI_RC_OK);
-    EXPECT_EQ(ok.msg(), nullptr);
+    EXPECT_FALSE(ok.hasMsg());
+    EXPECT_STREQ(ok.msg(), "");  // printable even without a message
     CmpiStatus nf(CMPI_RC_ERR_NOT_FOUND, "key-1");
     EXPECT_STREQ(nf.msg(), "key-1");
-    EXPECT_FALSE(CmpiStatus(CMPI_RC_ERR_FAILED, nullptr).hasMsg());
+    EXPECT_TRUE(nf.hasMsg());
+    EXPECT_FALSE(CmpiStatus(CMPI_RC_ERR_FAILED, static_cast<const char*>(nullptr)).hasMsg());
+    CmpiObjectPath op("root/t", "T");
+    op.setKey("K", CmpiData("v1"));
+    EXPECT_STREQ(CmpiStatus(CMPI_RC_ERR_NOT_FOUND, op.getKey("K")).msg(), "v1");
+    EXPECT_STREQ(CmpiStatus(CMPI_RC_ERR_FAILED, std::string("s")).msg(), "s");
+    // An empty text is a message all the same.
+    EXPECT_NE(CmpiStatus(CMPI_RC_ERR_FAILED, "").status(fake::broker()).msg, nullptr);
 
     CMPIStatus c = nf.status(fake::broker());
     EXPECT_EQ(c.rc, CMPI_RC_ERR_NOT_FOUND);
