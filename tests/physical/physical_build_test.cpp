@@ -1,0 +1,533 @@
+// The builds of the SCSI and physical class lists over adapter descriptions
+// written here, the NIC-side look-ups, and the tag texts; linked with the
+// adapter library in the same process. No log or fixed path is written.
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include "classes/Vexlan_Adapter_PhysicalConnector_CMPI.h"
+#include "classes/Vexlan_Adapter_PhysicalPackage_CMPI.h"
+#include "classes/Vexlan_Adapter_PhysicalPort_CMPI.h"
+#include "classes/Vexlan_Adapter_Product_CMPI.h"
+#include "classes/Vexlan_FC_SCSIProtocolController_CMPI.h"
+#include "classes/Vexlan_FC_SCSIProtocolEndpointHBA_CMPI.h"
+#include "classes/Vexlan_FC_SCSIProtocolEndpointTarget_CMPI.h"
+#include "classes/Vexlan_FC_StorageExtent_CMPI.h"
+#include "inventory/AdapterFunc.h"
+#include "inventory/AdapterFunc_VPD.h"
+#include "physical_test_support.h"
+#include "support/Vexlan_FC_Utils_CMPI.h"
+#include "zorap_cna.h"
+#include "zorap_sim_control.h"
+
+using fctest::fcAdapter;
+using fctest::fcFunction;
+using fctest::host;
+using fctest::json;
+using phystest::lun;
+using phystest::nicFunction;
+using phystest::port;
+using phystest::target;
+using phystest::transceiver;
+
+namespace {
+
+void removeAll()
+{
+    removeSCSIProtocolControllerList();
+    removeSCSIProtocolEndpointHBAList();
+    removeSCSIProtocolEndpointTargetList();
+    removeStorageExtentList();
+    removePhysicalPackageList();
+    removeProductList();
+    removePhysicalConnectorList();
+    removePhysicalPortList();
+}
+
+class PhysicalBuild : public ::testing::Test {
+protected:
+    void SetUp() override
+    {
+        g_EnableDebugPrint = false;
+        g_EnableLogError = false;
+        clearVpdBuffers();
+    }
+
+    void TearDown() override
+    {
+        removeAll();
+        Clear_CNA_List();
+        zorap_sim_reset();
+        ZORAP_Uninitialize();
+    }
+
+    // Loads the description, starts the library and, as the polling thread
+    // does at its first build, fills the NIC adapter list first.
+    static void use(const json& description, bool withNicList = true)
+    {
+        ZORAP_Uninitialize();
+        Clear_CNA_List();
+        ASSERT_EQ(0, zorap_sim_load_json(description.dump().c_str()));
+        ASSERT_EQ(ZORAP_OK, ZORAP_Initialize(0, 0));
+        if (withNicList)
+            Initialize_CNA_List();
+    }
+
+    // The process-wide VPD lines carry over from one build to the next, as
+    // they do in the provider; each test starts from empty ones.
+    static void clearVpdBuffers()
+    {
+        for (char* b : {g_productId, g_partNumber, g_serialNumber, g_fruNumberVersion, g_UUID, g_I2CUUID})
+            std::memset(b, 0, kVpdLineSize);
+    }
+
+    static json adapterWithPorts(const std::string& serial, const std::string& chip, json ports)
+    {
+        json a = fcAdapter(1, chip, 0, serial);
+        a["ports"] = ports;
+        return a;
+    }
+};
+
+// ---- SCSI ------------------------------------------------------------------------
+
+TEST_F(PhysicalBuild, ScsiListsNameControllersTargetsAndLuns)
+{
+    json luns0 = json::array({lun(0, 16, "/dev/sdb"), lun(7, 8, "/dev/sdc")});
+    json luns1 = json::array({lun(2, 16, "/dev/sdd")});
+    json f0 = fcFunction(1, 0, {{"targets", json::array({target("3a:00:00:00:00:00:00:01", luns0),
+                                                         target("3a:00:00:00:00:00:00:02", luns1)})}});
+    json f1 = fcFunction(1, 1);   // a port without targets
+    use(host(json::array({adapterWithPorts("SER1", "RSX-1620",
+                                           json::array({port(0, json::array({f0})), port(1, json::array({f1}))}))})));
+
+    buildSCSIProtocolControllerList();
+    buildSCSIProtocolEndpointHBAList();
+    buildSCSIProtocolEndpointTargetList();
+    buildStorageExtentList();
+
+    for (auto* list : {&g_SCSIProtocolControllerList, &g_SCSIProtocolEndpointHBAList}) {
+        ASSERT_EQ(2, list->count);
+        EXPECT_STREQ("3100000000010000", list->entries[0].name);
+        EXPECT_STREQ("3100000000010100", list->entries[1].name);
+        EXPECT_EQ(1, list->entries[1].valid);
+    }
+
+    // Only the port with targets has target endpoints and extents.
+    ASSERT_EQ(2, g_SCSIProtocolEndpointTargetList.count);
+    EXPECT_STREQ("3100000000010000_3A00000000000001", g_SCSIProtocolEndpointTargetList.entries[0].name);
+    EXPECT_STREQ("3100000000010000_3A00000000000002", g_SCSIProtocolEndpointTargetList.entries[1].name);
+
+    ASSERT_EQ(3, g_StorageExtentList.count);
+    const StorageExtentEntry& e0 = g_StorageExtentList.entries[0];
+    // A 16-byte identifier gives 32 hex digits, an 8-byte one 16.
+    EXPECT_STREQ("3100000000010000_3A00000000000001_634E4F52000000000000000000000000_0", e0.deviceId);
+    EXPECT_STREQ("3100000000010000_3A00000000000001_634E4F5200000007_7", g_StorageExtentList.entries[1].deviceId);
+    EXPECT_STREQ("3100000000010000_3A00000000000002_634E4F52000000000000000000000002_2",
+                 g_StorageExtentList.entries[2].deviceId);
+    // The slot keeps the library's records that makeInstance reads through.
+    ASSERT_NE(nullptr, e0.lun);
+    EXPECT_STREQ("/dev/sdb", e0.lun->osDeviceName);
+    EXPECT_EQ(4096u, e0.lun->blockSize);
+    ASSERT_NE(nullptr, g_StorageExtentList.entries[2].target);
+    EXPECT_EQ(0x02, g_StorageExtentList.entries[2].target->portWWN[7]);
+    EXPECT_EQ(&g_StorageExtentList.entries[2].device->portWWN[0],
+              &g_StorageExtentList.entries[0].device->portWWN[0]);
+}
+
+TEST_F(PhysicalBuild, NoAdaptersLeaveEveryListEmpty)
+{
+    use(host(json::array()));
+    buildSCSIProtocolControllerList();
+    buildSCSIProtocolEndpointHBAList();
+    buildSCSIProtocolEndpointTargetList();
+    buildStorageExtentList();
+    buildPhysicalPackageList();
+    buildProductList();
+    buildPhysicalConnectorList();
+    buildPhysicalPortList();
+    for (int count : {g_SCSIProtocolControllerList.count, g_SCSIProtocolEndpointHBAList.count,
+                      g_SCSIProtocolEndpointTargetList.count, g_StorageExtentList.count, g_PhysicalPackageList.count,
+                      g_ProductList.count, g_PhysicalConnectorList.count, g_PhysicalPortList.count})
+        EXPECT_EQ(0, count);
+    EXPECT_EQ(nullptr, g_StorageExtentList.entries);
+    EXPECT_EQ(nullptr, g_PhysicalPackageList.entries);
+
+    // With no adapter list at all the builds return at once, lists empty.
+    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_GetAdapterList, ZORAP_ERR_FAILED, -1));
+    buildStorageExtentList();
+    buildPhysicalConnectorList();
+    EXPECT_EQ(0, g_StorageExtentList.count);
+    EXPECT_EQ(0, g_PhysicalConnectorList.count);
+}
+
+// ---- PhysicalPackage and Product -----------------------------------------------------
+
+TEST_F(PhysicalBuild, PackageTagSkuAndPartNumberComeFromTheVpdOfTheFirstFunction)
+{
+    json hba = fcAdapter(1, "RSX-1620", 2, "HBA1");
+    hba["vpd"]["YU"] = "uuid-of-hba";
+    json cna = fcAdapter(2, "RSX-AB0", 0, "CNA2");
+    cna["kind"] = "cna";
+    cna["i2cUuid"] = "i2c-uuid-of-cna";
+    cna["ports"] = json::array({port(0, json::array({fcFunction(2, 0), nicFunction(1, "eth1")}))});
+    use(host(json::array({hba, cna})));
+
+    buildPhysicalPackageList();
+    ASSERT_EQ(2, g_PhysicalPackageList.count);
+    const PhysicalPackageEntry& a = g_PhysicalPackageList.entries[0];
+    EXPECT_STREQ("uuid-of-hba", a.tag);
+    EXPECT_STREQ("HBA1", a.serialNumber);
+    EXPECT_STREQ("VXT1", a.model);
+    EXPECT_STREQ("FRU-1", a.sku);
+    EXPECT_STREQ("VXT-1", a.partNumber);
+    EXPECT_EQ(0u, a.adapterType);
+    EXPECT_EQ(0, a.isCNA);
+
+    // The I2C UUID comes before the VPD's; kind 4 is a CNA of type 3. The NIC
+    // function of the same board adds nothing.
+    const PhysicalPackageEntry& b = g_PhysicalPackageList.entries[1];
+    EXPECT_STREQ("i2c-uuid-of-cna", b.tag);
+    EXPECT_STREQ("CNA2", b.serialNumber);
+    EXPECT_EQ(3u, b.adapterType);
+    EXPECT_EQ(1, b.isCNA);
+}
+
+TEST_F(PhysicalBuild, ThreeAdaptersWithOneSerialMakeOnePackageAndThreeProducts)
+{
+    json adapters = json::array();
+    const char* kinds[] = {"fc-hba", "fc-mezzanine", "nic"};
+    for (int a = 0; a < 3; ++a) {
+        json ad = fcAdapter(a, "RSX-1620", 1, "SAME");
+        ad["kind"] = kinds[a];
+        ad["productName"] = "Product " + std::to_string(a);
+        ad["productVersion"] = "V" + std::to_string(a);
+        adapters.push_back(ad);
+    }
+    use(host(adapters));
+    buildPhysicalPackageList();
+    buildProductList();
+    EXPECT_EQ(1, g_PhysicalPackageList.count);
+    ASSERT_EQ(3, g_ProductList.count);
+    for (int a = 0; a < 3; ++a) {
+        const ProductEntry& p = g_ProductList.entries[a];
+        EXPECT_STREQ("SAME", p.identifyingNumber);
+        EXPECT_EQ("Product " + std::to_string(a), p.name);
+        EXPECT_EQ("V" + std::to_string(a), p.version);
+        EXPECT_EQ(static_cast<unsigned>(a), p.adapterType);   // kinds 1, 2, 3 give types 0, 1, 2
+    }
+}
+
+TEST_F(PhysicalBuild, PackageOfAnOldChipUsesTheLibrarySerialAndLeftoverVpdLines)
+{
+    json newer = fcAdapter(1, "RSX-1620", 1, "NEW1");
+    newer["vpd"]["YU"] = "uuid-new";
+    json old = fcAdapter(2, "RSX-250", 1, "OLD2");   // code 6: no VPD
+    old["deviceSerial"] = "OLDLIB2";
+    use(host(json::array({newer, old})));
+    buildPhysicalPackageList();
+    ASSERT_EQ(2, g_PhysicalPackageList.count);
+    const PhysicalPackageEntry& e = g_PhysicalPackageList.entries[1];
+    EXPECT_STREQ("OLDLIB2", e.serialNumber);
+    // g_UUID and g_partNumber are not cleared for a device: the newer
+    // adapter's lines stand for the old one; its FRU line was cleared.
+    EXPECT_STREQ("uuid-new", e.tag);
+    EXPECT_STREQ("VXT-1", e.partNumber);
+    EXPECT_STREQ("", e.sku);
+}
+
+TEST_F(PhysicalBuild, AFailedVpdReadReusesTheSerialBeforeAndTheBuildGoesOn)
+{
+    // The old chip reads no VPD, so the first VPD read is the second board's.
+    json old = fcAdapter(1, "RSX-250", 1, "OLD");
+    old["deviceSerial"] = "OLDSER";
+    json failing = fcAdapter(2, "RSX-1620", 1, "NEWA");
+    json whole = fcAdapter(3, "RSX-1620", 1, "NEWB");
+    use(host(json::array({old, failing, whole})));
+    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_GetVpd, ZORAP_ERR_FAILED, 1));
+    buildPhysicalPackageList();
+    // The failed board takes the serial before it and so joins that package.
+    ASSERT_EQ(2, g_PhysicalPackageList.count);
+    EXPECT_STREQ("OLDSER", g_PhysicalPackageList.entries[0].serialNumber);
+    EXPECT_STREQ("NEWB", g_PhysicalPackageList.entries[1].serialNumber);
+    EXPECT_STREQ("VXT-1", g_PhysicalPackageList.entries[1].partNumber);
+    EXPECT_EQ(2u, zorap_sim_call_count(ZORAP_FN_GetVpd));
+}
+
+TEST_F(PhysicalBuild, NicOnlyBoardNeedsTheNicAdapterList)
+{
+    json nic = fcAdapter(5, "RSX-AB0", 0, "NICONLY");
+    nic["kind"] = "nic";
+    nic["partNumber"] = "NIC-PN";
+    nic["vpd"] = {{"PN", "NIC-VPD-PN"}, {"FN", "NIC-FRU"}, {"YU", "nic-uuid"}};
+    nic["ports"] = json::array({port(0, json::array({nicFunction(9, "eth9")}))});
+    use(host(json::array({nic})));
+    buildPhysicalPackageList();
+    ASSERT_EQ(1, g_PhysicalPackageList.count);
+    const PhysicalPackageEntry& e = g_PhysicalPackageList.entries[0];
+    EXPECT_STREQ("nic-uuid", e.tag);
+    EXPECT_STREQ("NICONLY", e.serialNumber);
+    EXPECT_STREQ("NIC-FRU", e.sku);
+    EXPECT_STREQ("NIC-VPD-PN", e.partNumber);
+    EXPECT_EQ(2u, e.adapterType);
+    EXPECT_EQ(0, findSlot_Nic_PhysicalPackage(m_CNAList));
+
+    // On a refresh the NIC list is empty while the lists are built: the board
+    // is missing.
+    removePhysicalPackageList();
+    Clear_CNA_List();
+    buildPhysicalPackageList();
+    EXPECT_EQ(0, g_PhysicalPackageList.count);
+}
+
+TEST_F(PhysicalBuild, CalcFunctionsTakeTheLastMatchingKeywordOfTheFirstPort)
+{
+    _CNAStruc cna{};
+    std::strcpy(cna.serialNumber, "SER");
+    std::strcpy(cna.partNumber, "PN0");
+    char out[kPhysicalPackageTextSize];
+
+    // No port: the defaults.
+    EXPECT_STREQ("SER", calcTag_PhysicalPackage(&cna, out));
+    EXPECT_STREQ("PN0", calcSKU_PhysicalPackage(&cna, out));
+    EXPECT_STREQ("PN0", calcPartNumber_PhysicalPackage(&cna, out));
+
+    _CNAPortStruc first{};
+    _CNAPortStruc second{};
+    first.next = &second;
+    cna.portList = &first;
+    auto add = [](_CNAPortStruc& p, const char* kw, const char* value) {
+        _zorap_vpd_entry_t& e = p.portExtra.vpd[p.portExtra.vpdCount++];
+        std::strcpy(e.keyword, kw);
+        std::strcpy(e.value, value);
+    };
+    add(first, "PN", "PN1");
+    add(first, "PNX", "not an exact keyword");
+    add(first, "YU", "uuid-1");
+    add(first, "PN", "PN2");
+    add(second, "FN", "second port is not read");
+    EXPECT_STREQ("uuid-1", calcTag_PhysicalPackage(&cna, out));
+    EXPECT_STREQ("PN0", calcSKU_PhysicalPackage(&cna, out));
+    EXPECT_STREQ("PN2", calcPartNumber_PhysicalPackage(&cna, out));
+
+    // A count beyond the record's entries is read no further than the record.
+    first.portExtra.vpdCount = 100000;
+    EXPECT_STREQ("PN2", calcPartNumber_PhysicalPackage(&cna, out));
+
+    // A value that fills its field without a terminator is cut, not overrun.
+    std::memset(first.portExtra.vpd[1].value, 'V', sizeof(first.portExtra.vpd[1].value));
+    std::strcpy(first.portExtra.vpd[1].keyword, "FN");
+    first.portExtra.vpdCount = 2;
+    EXPECT_EQ(std::string(kPhysicalPackageTextSize - 1, 'V'), calcSKU_PhysicalPackage(&cna, out));
+
+    EXPECT_STREQ("", calcTag_PhysicalPackage(nullptr, out));
+    EXPECT_EQ(nullptr, calcTag_PhysicalPackage(&cna, nullptr));
+    EXPECT_EQ(-1, findSlot_Nic_PhysicalPackage(nullptr));
+}
+
+// ---- PhysicalConnector and PhysicalPort ---------------------------------------------
+
+TEST_F(PhysicalBuild, ConnectorsComeFromTransceiversWithASerial)
+{
+    json a = adapterWithPorts(
+        "BOARD", "RSX-1620",
+        json::array({port(0, json::array({fcFunction(1, 0)}), transceiver("SFPA", "MAKER", "PART-A")),
+                     port(1, json::array({fcFunction(1, 1)})),                               // empty cage
+                     port(2, json::array({fcFunction(1, 2)}), transceiver("")),              // blank serial
+                     port(3, json::array({fcFunction(1, 3, {{"transceiverState", 2}})}), transceiver("SFPD"))}));
+    use(host(json::array({a})));
+    buildPhysicalConnectorList();
+    buildPhysicalPortList();
+
+    ASSERT_EQ(2, g_PhysicalConnectorList.count);
+    const PhysicalConnectorEntry& c = g_PhysicalConnectorList.entries[0];
+    EXPECT_STREQ("SFPA_BOARD_0", c.tag);
+    EXPECT_STREQ("MAKER", c.sfp.Manufacturer);
+    EXPECT_STREQ("PART-A", c.sfp.PartNumber);
+    EXPECT_STREQ("SFPA", c.sfp.SerialNumber);
+    EXPECT_EQ(1, c.sfp.SFPStatus);
+    // The raw pages are the library's 512 bytes: the vendor name at 20..35.
+    EXPECT_EQ(0, std::memcmp(c.sfp.RawData + 20, "MAKER", 5));
+    // A module state other than 6 on an ordinary board gives status 0.
+    EXPECT_STREQ("SFPD_BOARD_3", g_PhysicalConnectorList.entries[1].tag);
+    EXPECT_EQ(0, g_PhysicalConnectorList.entries[1].sfp.SFPStatus);
+
+    // Every port is a PhysicalPort, with or without a module.
+    ASSERT_EQ(4, g_PhysicalPortList.count);
+    for (int i = 0; i < 4; ++i) {
+        EXPECT_EQ("BOARD_" + std::to_string(i), g_PhysicalPortList.entries[i].tag);
+        EXPECT_EQ(i, g_PhysicalPortList.entries[i].portNumber);
+        EXPECT_STREQ("BOARD", g_PhysicalPortList.entries[i].serialNumber);
+    }
+}
+
+TEST_F(PhysicalBuild, MezzanineBoardsShowAGoodModuleAndCagelessBoardsNone)
+{
+    json mezz = adapterWithPorts("MEZZ", "RSX-1620",
+                                 json::array({port(0, json::array({fcFunction(1, 0, {{"transceiverState", 0}})}),
+                                                   transceiver("SFPM"))}));
+    mezz["subsystemVendorId"] = "0x7E5A";
+    mezz["subsystemDeviceId"] = "0x6101";
+    json cageless = adapterWithPorts("NOCAGE", "RSX-1620",
+                                     json::array({port(0, json::array({fcFunction(2, 0)}), transceiver("SFPN"))}));
+    cageless["transceiverSupport"] = false;
+    use(host(json::array({mezz, cageless})));
+    buildPhysicalConnectorList();
+    ASSERT_EQ(1, g_PhysicalConnectorList.count);
+    EXPECT_STREQ("SFPM_MEZZ_0", g_PhysicalConnectorList.entries[0].tag);
+    EXPECT_EQ(1, g_PhysicalConnectorList.entries[0].sfp.SFPStatus);
+    // Without a cage the module is never asked for.
+    EXPECT_EQ(1u, zorap_sim_call_count(ZORAP_FN_GetSFPData));
+}
+
+TEST_F(PhysicalBuild, AFailedModuleReadForOneDeviceDropsOnlyThatConnector)
+{
+    json a = adapterWithPorts("BOARD", "RSX-1620",
+                              json::array({port(0, json::array({fcFunction(1, 0)}), transceiver("SFP0")),
+                                           port(1, json::array({fcFunction(1, 1)}), transceiver("SFP1"))}));
+    use(host(json::array({a})));
+    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_GetSFPData, ZORAP_ERR_FAILED, 1));
+    buildPhysicalConnectorList();
+    ASSERT_EQ(1, g_PhysicalConnectorList.count);
+    EXPECT_STREQ("SFP1_BOARD_1", g_PhysicalConnectorList.entries[0].tag);
+}
+
+TEST_F(PhysicalBuild, OneModuleSharedByFcAndNicFunctionsIsOneConnector)
+{
+    json cna = adapterWithPorts(
+        "CNA", "RSX-AB0",
+        json::array({port(0, json::array({fcFunction(1, 0, {{"type", "fcoe"}}), nicFunction(1, "eth1")}),
+                          transceiver("SFPC", "NICMAKER", "NIC-PART")),
+                     port(1, json::array({nicFunction(2, "eth2")}), transceiver("SFPN")),
+                     port(2, json::array({nicFunction(3, "eth3")}))}));
+    cna["kind"] = "cna";
+    use(host(json::array({cna})));
+    buildPhysicalConnectorList();
+    ASSERT_EQ(2, g_PhysicalConnectorList.count);
+    EXPECT_STREQ("SFPC_CNA_0", g_PhysicalConnectorList.entries[0].tag);
+
+    // The NIC-only port's connector: texts from the NIC adapter list, no raw
+    // data, status 1.
+    const PhysicalConnectorEntry& n = g_PhysicalConnectorList.entries[1];
+    EXPECT_STREQ("SFPN_CNA_1", n.tag);
+    EXPECT_STREQ("VEXLAN", n.sfp.Manufacturer);
+    EXPECT_STREQ("SFPN", n.sfp.SerialNumber);
+    EXPECT_EQ(1, n.sfp.SFPStatus);
+    for (unsigned char byte : n.sfp.RawData)
+        ASSERT_EQ(0, byte);
+
+    // The NIC side finds the connectors and ports of its own records.
+    ASSERT_NE(nullptr, m_CNAList);
+    buildPhysicalPortList();
+    _CNAPortStruc* p0 = m_CNAList->portList;
+    ASSERT_NE(nullptr, p0);
+    _CNAPortStruc* p1 = p0->next;
+    ASSERT_NE(nullptr, p1);
+    _CNAPortStruc* p2 = p1->next;
+    ASSERT_NE(nullptr, p2);
+    char tag[kPhysicalTagSize];
+    EXPECT_EQ(1, calcTag_PhysicalConnector(m_CNAList, p1, tag));
+    EXPECT_STREQ("SFPN_CNA_1", tag);
+    EXPECT_EQ(1, findSlot_Nic_PhysicalConnector(m_CNAList, p1));
+    EXPECT_EQ(0, findSlot_Nic_PhysicalConnector(m_CNAList, p0));
+    EXPECT_EQ(-1, findSlot_Nic_PhysicalConnector(m_CNAList, p2));   // no module
+    EXPECT_EQ(1, calcTag_PhysicalPort(m_CNAList, p1, tag));
+    EXPECT_STREQ("CNA_1", tag);
+    EXPECT_EQ(2, findSlot_Nic_PhysicalPort(m_CNAList, p2));
+
+    // A port the library does not know gives no tag and no slot.
+    _CNAPortStruc stranger{};
+    stranger.macAddress.octet[0] = 0xEE;
+    std::strcpy(tag, "stale");
+    EXPECT_EQ(0, calcTag_PhysicalPort(m_CNAList, &stranger, tag));
+    EXPECT_STREQ("", tag);
+    EXPECT_EQ(-1, findSlot_Nic_PhysicalPort(m_CNAList, &stranger));
+    _zorap_adapter_t* adapter = nullptr;
+    EXPECT_EQ(0, getZORAPStructs(m_CNAList, &stranger, &adapter, nullptr, nullptr));
+    EXPECT_EQ(nullptr, adapter);
+    EXPECT_EQ(0, getZORAPStructs(m_CNAList, nullptr, &adapter, nullptr, nullptr));
+}
+
+TEST_F(PhysicalBuild, RepeatedPortTagsAreDroppedAndCountOnlyFilledSlots)
+{
+    json a = fcAdapter(1, "RSX-1620", 2, "TWIN");
+    json b = fcAdapter(2, "RSX-1620", 3, "TWIN");   // ports 0 and 1 repeat the tags of a
+    json c = fcAdapter(3, "RSX-1620", 1, "11SVXL4G01ZV10C4001234");
+    use(host(json::array({a, b, c})));
+    buildPhysicalPortList();
+    ASSERT_EQ(4, g_PhysicalPortList.count);
+    EXPECT_STREQ("TWIN_0", g_PhysicalPortList.entries[0].tag);
+    EXPECT_STREQ("TWIN_1", g_PhysicalPortList.entries[1].tag);
+    EXPECT_STREQ("TWIN_2", g_PhysicalPortList.entries[2].tag);
+    EXPECT_STREQ("11SVXL4G01ZV10C4001234_0", g_PhysicalPortList.entries[3].tag);
+    EXPECT_STREQ("11SVXL4G01ZV10C4001234", g_PhysicalPortList.entries[3].serialNumber);
+    // The unused slot of the capacity stays invalid.
+    EXPECT_EQ(0, g_PhysicalPortList.entries[4].valid);
+}
+
+TEST_F(PhysicalBuild, SixtyFourAdaptersOfFourFCFunctionsEach)
+{
+    use(fctest::wideHost());
+    buildSCSIProtocolControllerList();
+    buildSCSIProtocolEndpointHBAList();
+    buildPhysicalPackageList();
+    buildProductList();
+    buildPhysicalPortList();
+    buildPhysicalConnectorList();
+    EXPECT_EQ(256, g_SCSIProtocolControllerList.count);
+    EXPECT_EQ(256, g_SCSIProtocolEndpointHBAList.count);
+    EXPECT_EQ(64, g_PhysicalPackageList.count);
+    EXPECT_EQ(64, g_ProductList.count);
+    EXPECT_EQ(128, g_PhysicalPortList.count);
+    EXPECT_EQ(0, g_PhysicalConnectorList.count);   // no modules in the cages
+    EXPECT_STREQ("VXW0063", g_PhysicalPackageList.entries[63].serialNumber);
+    EXPECT_STREQ("VXW0063_1", g_PhysicalPortList.entries[127].tag);
+}
+
+// ---- Tag texts ---------------------------------------------------------------------------
+
+TEST(PhysicalTags, CreateAndParseRoundTripAndRefuseShortTags)
+{
+    char tag[kPhysicalTagSize];
+    char ts[] = "SFP1";
+    char as[] = "ADAPTER";
+    CreatePhysicalConnectorTag(tag, ts, as, 3);
+    EXPECT_STREQ("SFP1_ADAPTER_3", tag);
+    char a[kPhysicalTagPartSize], b[kPhysicalTagPartSize];
+    int n = -1;
+    EXPECT_EQ(1, ParsePhysicalConnectorTag(tag, a, b, &n));
+    EXPECT_STREQ("SFP1", a);
+    EXPECT_STREQ("ADAPTER", b);
+    EXPECT_EQ(3, n);
+
+    CreatePhysicalPortTag(tag, as, 12);
+    EXPECT_STREQ("ADAPTER_12", tag);
+    EXPECT_EQ(1, ParsePhysicalPortTag(tag, a, &n));
+    EXPECT_STREQ("ADAPTER", a);
+    EXPECT_EQ(12, n);
+
+    // Too few parts.
+    char two[] = "A_B";
+    char one[] = "A";
+    char none[] = "";
+    EXPECT_EQ(0, ParsePhysicalConnectorTag(two, a, b, &n));
+    EXPECT_EQ(0, ParsePhysicalPortTag(one, a, &n));
+    EXPECT_EQ(0, ParsePhysicalPortTag(none, a, &n));
+    // A serial with "_" is split wrongly, as tags of this form only are meant.
+    char underscored[] = "AB_CD_7";
+    EXPECT_EQ(1, ParsePhysicalPortTag(underscored, a, &n));
+    EXPECT_STREQ("AB", a);
+    EXPECT_EQ(0, n);
+
+    // Long texts are cut to the buffers, never written past them.
+    std::string longSerial(400, 'S');
+    CreatePhysicalPortTag(tag, &longSerial[0], 1);
+    EXPECT_EQ(kPhysicalTagSize - 1, std::strlen(tag));
+    std::string longTag = std::string(300, 'X') + "_" + std::string(300, 'Y') + "_5";
+    EXPECT_EQ(0, ParsePhysicalConnectorTag(&longTag[0], a, b, &n));   // the 255 characters read hold one part
+    EXPECT_EQ(255u, std::strlen(a));
+}
+
+}  // namespace
