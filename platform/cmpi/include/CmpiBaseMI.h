@@ -5,14 +5,16 @@
 // driveBaseCleanup is the cleanup entry of every MI function table; it is
 // overloaded for the four table types so that the plain name fits each.
 // Its rules:
-//   - An MI whose handle is null (never made, or already cleaned up) gets
-//     CMPI_RC_OK and nothing happens.
+//   - An MI whose handle is null (never made, or the object already gone)
+//     gets CMPI_RC_OK and nothing happens.
 //   - terminating false and isUnloadable() false: CMPI_RC_DO_NOT_UNLOAD,
 //     nothing else changes.  With terminating true the cleanup goes on.
-//   - Otherwise the use count of the provider base goes down by one and the
-//     MI's handle is cleared.  When the count reaches 0 the base is cleared,
-//     cleanup(ctx) runs, the provider object is deleted and cleanup's status
-//     is returned.
+//   - Otherwise the use count of the provider base goes down by one: every
+//     cleanup counts, also when a server hands the same MI structure (got
+//     from several factory calls) to cleanup several times.  When the count
+//     reaches 0 the base and the handles of all MI structures cleaned up
+//     are cleared, cleanup(ctx) runs, the provider object is deleted and
+//     cleanup's status is returned.
 //   - A provider object that was never linked to a base is left alone.
 // No exception leaves a driver: a thrown CmpiStatus becomes the returned
 // status (its message made by the broker's string factory), anything else
@@ -53,6 +55,9 @@ protected:
     CmpiBroker* broker;
 
 private:
+    static CMPIStatus cleanupMI(void* mi, const void* hdl, const CMPIContext* eCtx,
+                                CMPIBoolean terminating) noexcept;
+
     CmpiProviderBase* providerBase;
 };
 

@@ -22,6 +22,7 @@
 #include "cmpift.h"
 
 #include <mutex>
+#include <vector>
 
 class CmpiBaseMI;
 
@@ -44,9 +45,17 @@ public:
     static void setBroker(const CMPIBroker* mb);
 
 private:
+    friend class CmpiBaseMI;
+    // One cleanup of the MI structure mi: lowers the count like
+    // decUseCount and notes mi; the cleanup that reaches 0 clears the
+    // handle of every MI structure noted in this life, so that none of
+    // them reaches the object about to be deleted.
+    int releaseMI(void* mi);
+
     mutable std::mutex mutex_;
     CmpiBaseMI* baseMI_;
     int useCount_;
+    std::vector<void*> cleanedMIs_;
 };
 
 #endif

@@ -53,44 +53,6 @@ CMPIStatus drive(const void* hdl, Call&& call) noexcept
     }
 }
 
-// Cleanup of one MI; see CmpiBaseMI.h for the rules.
-template <class CMI>
-CMPIStatus baseCleanup(CMI* mi, const CMPIContext* eCtx, CMPIBoolean terminating) noexcept
-{
-    if (mi == nullptr || mi->hdl == nullptr)
-        return cStatus(nullptr, CMPI_RC_OK, nullptr);
-    CmpiBaseMI* base = static_cast<CmpiBaseMI*>(const_cast<void*>(static_cast<const void*>(mi->hdl)));
-    const CMPIBroker* mb = brokerOf(base);
-    try {
-        if (!terminating && !base->isUnloadable())
-            return cStatus(mb, CMPI_RC_DO_NOT_UNLOAD, nullptr);
-        CmpiProviderBase* pb = base->getProviderBase();
-        if (pb == nullptr)
-            return cStatus(mb, CMPI_RC_OK, nullptr);
-        mi->hdl = nullptr;
-        if (pb->decUseCount() > 0)
-            return cStatus(mb, CMPI_RC_OK, nullptr);
-        pb->setBaseMI(nullptr);
-        base->setProviderBase(nullptr);
-        CmpiContext ctx(eCtx);
-        CmpiStatus st;
-        try {
-            st = base->cleanup(ctx);
-        } catch (...) {
-            delete base;
-            throw;
-        }
-        delete base;
-        return st.status(mb);
-    } catch (const CmpiStatus& st) {
-        return st.status(mb);
-    } catch (const std::exception& e) {
-        return cStatus(mb, CMPI_RC_ERR_FAILED, e.what());
-    } catch (...) {
-        return cStatus(mb, CMPI_RC_ERR_FAILED, nullptr);
-    }
-}
-
 } // namespace
 
 // ---- CmpiBaseMI -----------------------------------------------------------
@@ -114,24 +76,61 @@ void CmpiBaseMI::setProviderBase(CmpiProviderBase* base)
         CmpiProviderBase::setBroker(broker->getEnc());
 }
 
+// Cleanup of one MI; see CmpiBaseMI.h for the rules.
+CMPIStatus CmpiBaseMI::cleanupMI(void* mi, const void* hdl, const CMPIContext* eCtx,
+                                 CMPIBoolean terminating) noexcept
+{
+    if (mi == nullptr || hdl == nullptr)
+        return cStatus(nullptr, CMPI_RC_OK, nullptr);
+    CmpiBaseMI* base = static_cast<CmpiBaseMI*>(const_cast<void*>(hdl));
+    const CMPIBroker* mb = brokerOf(base);
+    try {
+        if (!terminating && !base->isUnloadable())
+            return cStatus(mb, CMPI_RC_DO_NOT_UNLOAD, nullptr);
+        CmpiProviderBase* pb = base->providerBase;
+        if (pb == nullptr)
+            return cStatus(mb, CMPI_RC_OK, nullptr);
+        if (pb->releaseMI(mi) > 0)
+            return cStatus(mb, CMPI_RC_OK, nullptr);
+        pb->setBaseMI(nullptr);
+        base->setProviderBase(nullptr);
+        CmpiContext ctx(eCtx);
+        CmpiStatus st;
+        try {
+            st = base->cleanup(ctx);
+        } catch (...) {
+            delete base;
+            throw;
+        }
+        delete base;
+        return st.status(mb);
+    } catch (const CmpiStatus& st) {
+        return st.status(mb);
+    } catch (const std::exception& e) {
+        return cStatus(mb, CMPI_RC_ERR_FAILED, e.what());
+    } catch (...) {
+        return cStatus(mb, CMPI_RC_ERR_FAILED, nullptr);
+    }
+}
+
 CMPIStatus CmpiBaseMI::driveBaseCleanup(CMPIInstanceMI* mi, const CMPIContext* eCtx, CMPIBoolean terminating)
 {
-    return baseCleanup(mi, eCtx, terminating);
+    return cleanupMI(mi, mi != nullptr ? mi->hdl : nullptr, eCtx, terminating);
 }
 
 CMPIStatus CmpiBaseMI::driveBaseCleanup(CMPIAssociationMI* mi, const CMPIContext* eCtx, CMPIBoolean terminating)
 {
-    return baseCleanup(mi, eCtx, terminating);
+    return cleanupMI(mi, mi != nullptr ? mi->hdl : nullptr, eCtx, terminating);
 }
 
 CMPIStatus CmpiBaseMI::driveBaseCleanup(CMPIMethodMI* mi, const CMPIContext* eCtx, CMPIBoolean terminating)
 {
-    return baseCleanup(mi, eCtx, terminating);
+    return cleanupMI(mi, mi != nullptr ? mi->hdl : nullptr, eCtx, terminating);
 }
 
 CMPIStatus CmpiBaseMI::driveBaseCleanup(CMPIIndicationMI* mi, const CMPIContext* eCtx, CMPIBoolean terminating)
 {
-    return baseCleanup(mi, eCtx, terminating);
+    return cleanupMI(mi, mi != nullptr ? mi->hdl : nullptr, eCtx, terminating);
 }
 
 CmpiStatus CmpiBaseMI::initialize(const CmpiContext&)

@@ -40,6 +40,26 @@ int CmpiProviderBase::decUseCount()
     return useCount_;
 }
 
+int CmpiProviderBase::releaseMI(void* mi)
+{
+    std::lock_guard<std::mutex> lock(mutex_);
+    if (useCount_ > 0)
+        --useCount_;
+    bool noted = false;
+    for (void* m : cleanedMIs_)
+        noted = noted || m == mi;
+    if (!noted)
+        cleanedMIs_.push_back(mi);
+    if (useCount_ == 0) {
+        // Every MI structure starts with its handle (CMPIInstanceMI's is a
+        // const void*, the others' a void*).
+        for (void* m : cleanedMIs_)
+            *static_cast<const void**>(m) = nullptr;
+        cleanedMIs_.clear();
+    }
+    return useCount_;
+}
+
 int CmpiProviderBase::getUseCount() const
 {
     std::lock_guard<std::mutex> lock(mutex_);

@@ -73,13 +73,17 @@ TEST_F(Drivers, LastCleanupDeletesAndASecondLifeStartsClean)
     EXPECT_EQ(ind.ft->cleanup(&ind, ctx, 0).rc, CMPI_RC_OK);
     EXPECT_EQ(TestProvider::live, 1);
     EXPECT_EQ(TestProvider::cleanups, 0);
-    EXPECT_EQ(inst.hdl, nullptr);  // a cleaned-up MI no longer reaches the object
     EXPECT_EQ(meth.ft->cleanup(&meth, ctx, 0).rc, CMPI_RC_OK);
     EXPECT_EQ(TestProvider::live, 0);
     EXPECT_EQ(TestProvider::cleanups, 1);
     EXPECT_EQ(testProviderBase.getBaseMI(), nullptr);
+    // No cleaned-up MI reaches the deleted object any more.
+    EXPECT_EQ(inst.hdl, nullptr);
+    EXPECT_EQ(assoc.hdl, nullptr);
+    EXPECT_EQ(ind.hdl, nullptr);
+    EXPECT_EQ(meth.hdl, nullptr);
 
-    // A second cleanup of the same MI does nothing.
+    // A further cleanup of that MI does nothing.
     EXPECT_EQ(meth.ft->cleanup(&meth, ctx, 1).rc, CMPI_RC_OK);
     EXPECT_EQ(TestProvider::cleanups, 1);
 
@@ -88,6 +92,25 @@ TEST_F(Drivers, LastCleanupDeletesAndASecondLifeStartsClean)
     EXPECT_EQ(TestProvider::live, 1);
     EXPECT_EQ(testProviderBase.getUseCount(), 4);
     EXPECT_EQ(getInstance("w1").rc, CMPI_RC_OK);
+}
+
+// sfcb calls a factory once per registered class: the same static MI
+// structure comes back each time, and is cleaned up as often.
+TEST_F(Drivers, OneMiStructureFromManyFactoryCalls)
+{
+    for (int i = 0; i < 3; ++i)
+        testFactory(inst, &testInstFT, fake::broker(), ctx);
+    testFactory(assoc, &testAssocFT, fake::broker(), ctx);
+    EXPECT_EQ(testProviderBase.getUseCount(), 4);
+    EXPECT_EQ(TestProvider::live, 1);
+    for (int i = 0; i < 3; ++i) {
+        EXPECT_EQ(inst.ft->cleanup(&inst, ctx, 0).rc, CMPI_RC_OK);
+        EXPECT_EQ(TestProvider::live, 1);
+    }
+    EXPECT_EQ(assoc.ft->cleanup(&assoc, ctx, 0).rc, CMPI_RC_OK);
+    EXPECT_EQ(TestProvider::live, 0);
+    EXPECT_EQ(TestProvider::cleanups, 1);
+    EXPECT_EQ(inst.hdl, nullptr);
 }
 
 TEST_F(Drivers, UnloadVetoUnlessTerminating)
@@ -100,6 +123,10 @@ TEST_F(Drivers, UnloadVetoUnlessTerminating)
     // Server shutdown: cleanup goes on regardless.
     EXPECT_EQ(inst.ft->cleanup(&inst, ctx, 1).rc, CMPI_RC_OK);
     EXPECT_EQ(testProviderBase.getUseCount(), 3);
+    EXPECT_EQ(assoc.ft->cleanup(&assoc, ctx, 1).rc, CMPI_RC_OK);
+    EXPECT_EQ(meth.ft->cleanup(&meth, ctx, 1).rc, CMPI_RC_OK);
+    EXPECT_EQ(ind.ft->cleanup(&ind, ctx, 1).rc, CMPI_RC_OK);
+    EXPECT_EQ(TestProvider::live, 0);
 }
 
 TEST_F(Drivers, ThrownStatusesBecomeTheReturnedStatus)
