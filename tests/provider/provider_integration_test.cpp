@@ -366,7 +366,7 @@ TEST(Polling, AChangedDescriptionIsPickedUpAtTheNextPollAndTheListsAreRebuilt)
         Host host;
         prepareHost(host);
         ASSERT_TRUE(enumerateHost(host).ok());
-        EXPECT_EQ(countLog("No Transceiver on portID 7"), 1);
+        EXPECT_GE(countLog("No Transceiver on portID 7"), 1);
         // Let the first polls settle (loading a description counts as a change).
         std::this_thread::sleep_for(seconds(3));
         const int rebuildsBefore = countLog("gNeedRefresh flag is ON");
@@ -376,7 +376,12 @@ TEST(Polling, AChangedDescriptionIsPickedUpAtTheNextPollAndTheListsAreRebuilt)
         writeFile(file, nicDescription("VXN0000002", "enp7s1", true));
         ASSERT_TRUE(waitForLog("gNeedRefresh flag is ON", seconds(15), rebuildsBefore + 1));
         ASSERT_TRUE(waitForLog("After the call to buildFCPortList()", seconds(5), rebuildsBefore + 1));
-        EXPECT_TRUE(waitForLog("Transceiver on portID 7", seconds(5), 1));
+        // The new description's port has a transceiver: the rebuilt list read it.
+        int withTransceiver = 0;
+        for (const auto& line : logLines())
+            if (line.find("Transceiver on portID 7") != std::string::npos && line.find("No Transceiver") == std::string::npos)
+                ++withTransceiver;
+        EXPECT_GE(withTransceiver, 1);
         EXPECT_GE(calls(ZORAP_FN_UpdateBackupAdapterList), 1u);
         EXPECT_GE(calls(ZORAP_FN_SwapBackupToMainAdapterList), 1u);
         EXPECT_GE(countLog("After the call to ZORAP_SwapBackupToMainAdapterList()"), 1);
