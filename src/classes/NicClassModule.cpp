@@ -132,14 +132,6 @@ void NicClassModule::forEach(const std::function<bool(const NicRecord&)>& visit)
     }
 }
 
-std::string NicClassModule::keyText(const NicRecord& record) const
-{
-    char text[kNicKeyTextSize] = {};
-    keyText_(record, text);
-    text[sizeof(text) - 1] = '\0';
-    return text;
-}
-
 CmpiObjectPath NicClassModule::makePath(const char* className, const char* nameSpace,
                                         const NicRecord& record) const
 {

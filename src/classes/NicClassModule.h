@@ -156,9 +156,6 @@ public:
     // visit returns false.
     void forEach(const std::function<bool(const NicRecord&)>& visit) const;
 
-    // The key text of a record, as getInstance compares it.
-    std::string keyText(const NicRecord& record) const;
-
     CmpiObjectPath makePath(const char* className, const char* nameSpace, const NicRecord& record) const;
     CmpiInstance makeInstance(const char* className, const char* nameSpace, const char** properties,
                               const NicRecord& record) const;
