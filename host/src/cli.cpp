@@ -36,6 +36,9 @@ const char kUsage[] =
     "  -n, --name NAME          provider name, the prefix of NAME_Create_InstanceMI ...;\n"
     "                           default: the library file name without lib and .so\n"
     "  -m, --mof PATH           MOF file, or directory of *.mof files; repeatable\n"
+    "      --reg FILE           sfcb registration file ([Class] sections with type:\n"
+    "                           lines): the sfcb flavour then creates one MI per\n"
+    "                           section and provider type, as sfcb does; repeatable\n"
     "  -N, --namespace NS       namespace of paths that name none (default root/cimv2)\n"
     "  -s, --strict             check every returned instance, path, return value and\n"
     "                           output argument against its MOF class (unknown\n"
@@ -97,6 +100,7 @@ struct OpOptions {
 struct Session {
     std::string provider, name;
     std::vector<std::string> mofs;
+    std::vector<std::string> regs;
     bool strict = false;
     Flavour flavour = Flavour::Pegasus;
     bool json = false;
@@ -202,6 +206,55 @@ int fail(Session& s, const Status& st, int code = kExitFailed) {
 }
 
 int usage(Session& s, const std::string& what) { return fail(s, Status{kRcInvalidParameter, what}, kExitUsage); }
+
+// Reads the sections of an sfcb registration file: "[Class]" starts a
+// section, its "type:" line names the provider types; the other keys
+// (provider, location, namespace, unload, ...) do not change what the host
+// does. Appends to `regs`; a fault is a status naming the file and line.
+Status readRegistrations(const std::string& file, std::vector<Registration>& regs) {
+    std::ifstream in(file);
+    if (!in) return Status{kRcFailed, "cannot read registration file " + file};
+    static const struct {
+        const char* word;
+        MiType type;
+    } kTypes[] = {{"instance", MiType::Instance},
+                  {"association", MiType::Association},
+                  {"method", MiType::Method},
+                  {"indication", MiType::Indication}};
+    std::string line;
+    int n = 0;
+    bool inSection = false;
+    while (std::getline(in, line)) {
+        ++n;
+        const std::string where = file + ":" + std::to_string(n) + ": ";
+        const size_t b = line.find_first_not_of(" \t\r");
+        if (b == std::string::npos || line[b] == '#') continue;
+        const size_t e = line.find_last_not_of(" \t\r");
+        const std::string t = line.substr(b, e - b + 1);
+        if (t.front() == '[') {
+            if (t.back() != ']' || t.size() < 3) return Status{kRcFailed, where + "bad section header"};
+            regs.push_back(Registration{t.substr(1, t.size() - 2), {}});
+            inSection = true;
+            continue;
+        }
+        const size_t colon = t.find(':');
+        if (colon == std::string::npos || !inSection)
+            return Status{kRcFailed, where + "expected [Class] or key: value"};
+        if (t.compare(0, colon, "type") != 0) continue;
+        std::istringstream words(t.substr(colon + 1));
+        std::string w;
+        while (words >> w) {
+            bool known = false;
+            for (const auto& k : kTypes)
+                if (w == k.word) {
+                    regs.back().types.push_back(k.type);
+                    known = true;
+                }
+            if (!known) return Status{kRcFailed, where + "unknown provider type '" + w + "'"};
+        }
+    }
+    return Status{};
+}
 
 void printInstances(Session& s, const std::vector<Instance>& insts) {
     if (s.json) {
@@ -601,6 +654,9 @@ int runCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
         } else if (a == "-m" || a == "--mof") {
             if (!value(v)) return usage(s, "option " + a + " needs a value");
             s.mofs.push_back(v);
+        } else if (a == "--reg") {
+            if (!value(v)) return usage(s, "option " + a + " needs a value");
+            s.regs.push_back(v);
         } else if (a == "-s" || a == "--strict") {
             s.strict = true;
         } else if (a == "--no-strict") {
@@ -635,6 +691,14 @@ int runCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
     for (const auto& m : s.mofs) {
         const Status st = s.host.loadMof(m);
         if (!st.ok()) return fail(s, st);
+    }
+    if (!s.regs.empty()) {
+        std::vector<Registration> regs;
+        for (const auto& f : s.regs) {
+            const Status st = readRegistrations(f, regs);
+            if (!st.ok()) return fail(s, st);
+        }
+        s.host.setRegistrations(std::move(regs));
     }
     if (!s.provider.empty()) {
         if (s.name.empty()) s.name = defaultName(s.provider);
