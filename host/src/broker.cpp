@@ -1012,8 +1012,19 @@ CMPIStatus rsData(const CMPIResult* r, const CMPIValue* value, CMPIType type) {
         if (rc != CMPI_RC_OK) return mkStatus(rc);
         std::lock_guard<std::mutex> g(e->m);
         if (e->kind == ResultKind::Instances && v.type == Type::Instance && !v.array && v.inst) {
-            e->sink->instances.push_back(*v.inst);   // returnData of an instance
+            // returnData of an instance counts as returnInstance.
+            Instance copy = *v.inst;
+            copy.path = instancePath(e->core, copy);
+            if (e->core->strict) {
+                const std::string err = checkInstance(e->core->repo, copy);
+                if (!err.empty()) e->sink->strictErrors.push_back(err);
+            }
+            e->sink->instances.push_back(std::move(copy));
         } else if (e->kind == ResultKind::Paths && v.type == Type::Reference && !v.array && v.ref) {
+            if (e->core->strict) {
+                const std::string err = checkPath(e->core->repo, *v.ref);
+                if (!err.empty()) e->sink->strictErrors.push_back(err);
+            }
             e->sink->paths.push_back(*v.ref);
         } else {
             if (e->kind != ResultKind::Method && e->kind != ResultKind::Data)
