@@ -8,6 +8,8 @@
 #include <vector>
 
 #include "classes/NicClassModule.h"
+#include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
+#include "classes/Vexlan_FCHBA_RegisteredSubProfile_CMPI.h"
 #include "classes/Vexlan_FCHBA_ObjectManager_CMPI.h"
 #include "classes/Vexlan_NIC_EthernetPort.h"
 #include "classes/Vexlan_NIC_IPProtocolEndPoint.h"
@@ -144,4 +146,34 @@ TEST(NicProfileChain, EightNodesInOrderAndRebuiltWithoutGrowing)
     Clear_RegisteredProfile_List();
     EXPECT_EQ(m_RegisteredProfileList, nullptr);
     Clear_RegisteredProfile_List();
+}
+
+TEST(FcProfileRows, ConstantRowsNamedAfterTheHost)
+{
+    std::strcpy(hostName_ComputerSystem, "10.0.0.7");
+    buildRegisteredProfileList();
+    buildRegisteredSubProfileList();
+    ASSERT_EQ(g_RegisteredProfileList.count, 4);
+    ASSERT_EQ(g_RegisteredSubProfileList.count, 2);
+    const RegisteredProfileEntry& update = g_RegisteredProfileList.entries[3];
+    EXPECT_EQ(update.valid, 1);
+    EXPECT_STREQ(update.instanceId, "Vexlan_SofwareUpdateProfile_10.0.0.7");
+    EXPECT_STREQ(update.caption, "DMTF Software Update Profile");
+    EXPECT_EQ(update.registeredOrganization, 2);
+    EXPECT_STREQ(update.registeredVersion, "1.0.0");
+    EXPECT_STREQ(update.otherOrganization, "");
+    EXPECT_STREQ(g_RegisteredSubProfileList.entries[1].instanceId, "Vexlan_IndicationsSubProfile_10.0.0.7");
+    EXPECT_STREQ(g_RegisteredSubProfileList.entries[1].registeredName, "Indication");
+
+    // A rebuild follows the host name; a long one is cut to the field.
+    removeRegisteredProfileList();
+    EXPECT_EQ(g_RegisteredProfileList.entries, nullptr);
+    std::memset(hostName_ComputerSystem, 'h', sizeof(hostName_ComputerSystem) - 1);
+    buildRegisteredProfileList();
+    const std::string id = g_RegisteredProfileList.entries[0].instanceId;
+    EXPECT_EQ(id.size(), sizeof(RegisteredProfileEntry::instanceId) - 1);
+    EXPECT_EQ(id.rfind("Vexlan_FCHBAProfile_hhh", 0), 0u);
+    removeRegisteredProfileList();
+    removeRegisteredSubProfileList();
+    hostName_ComputerSystem[0] = '\0';
 }
