@@ -15,47 +15,52 @@
 
 #define CMReturn(rc_)                                                        \
     do {                                                                     \
-        CMPIStatus stat_ = {(rc_), NULL};                                    \
+        CMPIStatus stat_ = {(CMPIrc)(rc_), NULL};                                    \
         return stat_;                                                        \
     } while (0)
 
 #define CMReturnWithString(rc_, str_)                                        \
     do {                                                                     \
-        CMPIStatus stat_ = {(rc_), (str_)};                                  \
+        CMPIStatus stat_ = {(CMPIrc)(rc_), (str_)};                                  \
         return stat_;                                                        \
     } while (0)
 
 #define CMReturnWithChars(mb_, rc_, chars_)                                  \
     do {                                                                     \
+        const CMPIBroker* mbp_ = (mb_);                                      \
         CMPIStatus stat_;                                                    \
-        stat_.rc = (rc_);                                                    \
-        stat_.msg = (mb_) ? (mb_)->eft->newString((mb_), (chars_), NULL)     \
-                          : NULL;                                            \
+        stat_.rc = (CMPIrc)(rc_);                                                    \
+        stat_.msg = mbp_ ? mbp_->eft->newString(mbp_, (chars_), NULL) : NULL; \
         return stat_;                                                        \
     } while (0)
 
+/* The status pointer may be NULL; it is copied first so that passing the
+ * address of a local draws no "always true" warning. */
 #define CMSetStatus(st_, rc_)                                                \
     do {                                                                     \
-        if (st_) {                                                           \
-            (st_)->rc = (rc_);                                               \
-            (st_)->msg = NULL;                                               \
+        CMPIStatus* stp_ = (st_);                                            \
+        if (stp_) {                                                          \
+            stp_->rc = (CMPIrc)(rc_);                                                \
+            stp_->msg = NULL;                                                \
         }                                                                    \
     } while (0)
 
 #define CMSetStatusWithString(st_, rc_, str_)                                \
     do {                                                                     \
-        if (st_) {                                                           \
-            (st_)->rc = (rc_);                                               \
-            (st_)->msg = (str_);                                             \
+        CMPIStatus* stp_ = (st_);                                            \
+        if (stp_) {                                                          \
+            stp_->rc = (CMPIrc)(rc_);                                                \
+            stp_->msg = (str_);                                              \
         }                                                                    \
     } while (0)
 
 #define CMSetStatusWithChars(mb_, st_, rc_, chars_)                          \
     do {                                                                     \
-        if (st_) {                                                           \
-            (st_)->rc = (rc_);                                               \
-            (st_)->msg = (mb_) ? (mb_)->eft->newString((mb_), (chars_), NULL) \
-                               : NULL;                                       \
+        CMPIStatus* stp_ = (st_);                                            \
+        const CMPIBroker* mbp_ = (mb_);                                      \
+        if (stp_) {                                                          \
+            stp_->rc = (CMPIrc)(rc_);                                                \
+            stp_->msg = mbp_ ? mbp_->eft->newString(mbp_, (chars_), NULL) : NULL; \
         }                                                                    \
     } while (0)
 
