@@ -276,6 +276,7 @@ TEST_F(FCDefaultHost, LogicalPortGroupsEnumerateAnUnfilledSlotThatGetInstanceSte
 
     OpResult empty = host_->getInstance(instanceIdPath(kLogicalPortGroup, ""));
     EXPECT_EQ(empty.rc, 6);
+    EXPECT_EQ(empty.message, "");
     EXPECT_GE(countLog("getInstance_LogicalPortGroup: Found a device that has the same InstanceID but the entry is "
                        "invalid.  Move on..."),
               1);
@@ -394,7 +395,7 @@ TEST_F(FCDefaultHost, AFailedLibraryCallForOneDeviceLeavesDefaultsThere)
 
 // ---- Hosts written here ------------------------------------------------------------
 
-TEST(FCHosts, SerialsThatDifferInCaseMakeTwoControllersAndTwoDualPortAdaptersSkewTheGroups)
+TEST(FCHosts, SerialsThatDifferInCaseMakeTwoControllersFoundByEitherForm)
 {
     json description =
         fctest::host(json::array({fctest::fcAdapter(1, "RSX-1620", 2, "abc1"), fctest::fcAdapter(2, "RSX-1620", 2, "ABC1")}));
@@ -412,13 +413,6 @@ TEST(FCHosts, SerialsThatDifferInCaseMakeTwoControllersAndTwoDualPortAdaptersSke
         EXPECT_EQ(propertyText(got.instances[0], "DeviceID"), "abc1") << key;
     }
 
-    OpResult groups = enumerate(host, kLogicalPortGroup);
-    ASSERT_EQ(groups.instances.size(), 3u);
-    EXPECT_EQ(propertyText(groups.instances[1], "InstanceID"), "");
-    EXPECT_EQ(propertyText(groups.instances[2], "Name"), "3000000000020000");
-    OpResult empty = host.getInstance(instanceIdPath(kLogicalPortGroup, ""));
-    EXPECT_EQ(empty.rc, 6);
-    EXPECT_EQ(empty.message, "");
     ASSERT_TRUE(host.unload(true).ok());
 }
 
