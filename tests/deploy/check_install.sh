@@ -1,0 +1,171 @@
+#!/usr/bin/env bash
+# What `make install` lays down, checked from a fresh install of the build
+# tree into a temporary directory.
+#
+#   check_install.sh tree BUILD SOURCE BINDIR LIBDIR DATADIR MANDIR
+#       DESTDIR install under prefix /usr/local: the exact file list, the
+#       library links, the installed library's exports and run path, and the
+#       installed class and registration files against the class table.
+#   check_install.sh load BUILD SOURCE BINDIR LIBDIR DATADIR MANDIR
+#       install into a prefix and run the installed cimhost on the installed
+#       provider (through its unversioned link, as a CIM server loads it) with
+#       the installed class files and sfcb registration, in both server
+#       flavours: every registered class answers, and the default adapter
+#       description beside the installed adapter library is the one read.
+#       Run it under tests/isolate.sh (the provider writes under /opt).
+set -euo pipefail
+mode=$1 build=$2 src=$3 bindir=$4 libdir=$5 datadir=$6 mandir=$7
+tmp=$(mktemp -d /tmp/vexlan-deploy.XXXXXX)
+trap 'rm -rf "$tmp"' EXIT
+failures=0
+fail() { echo "FAIL: $*"; failures=$((failures + 1)); }
+
+install_to() {   # install_to DESTDIR PREFIX
+  if ! DESTDIR=$1 cmake --install "$build" --prefix "$2" > "$tmp/install.log" 2>&1; then
+    cat "$tmp/install.log"; echo "FAIL: cmake --install"; exit 1
+  fi
+}
+
+# The registered classes of the table ("class<TAB>types<TAB>namespaces").
+registered_rows() {
+  awk -F'\t' '!/^#/ && NF == 6 && $4 != "-" { print $1 "\t" $4 "\t" $2 }' "$1"
+}
+
+check_tree() {
+  local stage=$tmp/stage prefix=/usr/local
+  install_to "$stage" "$prefix"
+  local root=$stage$prefix share=$stage$prefix/$datadir/vexlan-cna
+
+  # Nothing lands outside the prefix.
+  local outside
+  outside=$(cd "$stage" && find . -mindepth 1 \( -type f -o -type l \) | grep -v "^\.$prefix/" || true)
+  [ -z "$outside" ] || fail "installed outside $prefix: $outside"
+
+  # The exact file list; the class files are checked against the table below.
+  local want=(
+    "$bindir/cimhost"
+    "$libdir/libVexlan_CNA_Provider.so"
+    "$libdir/libVexlan_CNA_Provider.so.1"
+    "$libdir/libzorap_cna_provider.so"
+    "$libdir/libzorap_cna_provider.so.1"
+    "$libdir/libzorap_cna_provider.so.1.0.0"
+    "$libdir/zorap_sim_adapters.json"
+    "$datadir/vexlan-cna/classes.tsv"
+    "$datadir/vexlan-cna/Vexlan_CNA_Provider.mof"
+    "$datadir/vexlan-cna/Vexlan_CNA_Provider_Interop.mof"
+    "$datadir/vexlan-cna/Vexlan_CNA_Provider_Registration.mof"
+    "$datadir/vexlan-cna/Vexlan_CNA_Provider.reg"
+    "$datadir/doc/vexlan-cna/deploy.md"
+    "$mandir/man8/vexlan-cna.8")
+  local got extra missing
+  got=$(cd "$root" && find . -mindepth 1 \( -type f -o -type l \) | sed 's|^\./||' |
+        grep -v "^$datadir/vexlan-cna/mof/" | sort)
+  missing=$(comm -13 <(echo "$got") <(printf '%s\n' "${want[@]}" | sort))
+  extra=$(comm -23 <(echo "$got") <(printf '%s\n' "${want[@]}" | sort))
+  [ -z "$missing" ] || fail "not installed: $missing"
+  [ -z "$extra" ] || fail "installed but not expected: $extra"
+
+  # Servers load lib<Location>.so: the unversioned names are links to the
+  # versioned libraries, and the provider needs the adapter library's soname.
+  [ "$(readlink "$root/$libdir/libVexlan_CNA_Provider.so")" = libVexlan_CNA_Provider.so.1 ] ||
+    fail "libVexlan_CNA_Provider.so is not a link to libVexlan_CNA_Provider.so.1"
+  [ -f "$root/$libdir/libVexlan_CNA_Provider.so.1" ] && [ ! -L "$root/$libdir/libVexlan_CNA_Provider.so.1" ] ||
+    fail "libVexlan_CNA_Provider.so.1 is not a file"
+  [ -e "$root/$libdir/libzorap_cna_provider.so.1" ] || fail "libzorap_cna_provider.so.1 does not resolve"
+  [ -x "$root/$bindir/cimhost" ] || fail "cimhost is not executable"
+
+  # The installed library exports the four factories and nothing else.
+  "$src/tests/provider/check_exports.sh" "$root/$libdir/libVexlan_CNA_Provider.so.1" ||
+    fail "exports of the installed library"
+
+  # The build tree's run path is gone; the installed one looks beside the
+  # library first, then in the installed library directory.
+  local runpath
+  runpath=$(readelf -d "$root/$libdir/libVexlan_CNA_Provider.so.1" | sed -n 's/.*(RUNPATH).*\[\(.*\)\]/\1/p')
+  case "$runpath" in
+    "\$ORIGIN:"*) ;;
+    *) fail "run path of the installed provider is '$runpath', expected \$ORIGIN first" ;;
+  esac
+  case "$runpath" in *"$build"*) fail "run path names the build tree: $runpath" ;; esac
+
+  # The installed class and registration files follow the table, and every
+  # class file that the table names is installed.
+  python3 "$src/mof/check_mof.py" "$src/mof" --generated "$share" || fail "installed class and registration files"
+  cmp -s "$src/mof/classes.tsv" "$share/classes.tsv" || fail "installed classes.tsv differs from the source table"
+  local f
+  for f in $(awk -F'\t' '!/^#/ && NF == 6 { print $6 }' "$src/mof/classes.tsv") "$src"/mof/dmtf/*.mof; do
+    [ -f "$share/mof/$(basename "$f")" ] || fail "class file $(basename "$f") is not installed"
+  done
+
+  # One registration per registered class in each server's file, none else.
+  local n_table n_reg n_pg
+  n_table=$(registered_rows "$src/mof/classes.tsv" | wc -l)
+  n_reg=$(grep -c '^\[' "$share/Vexlan_CNA_Provider.reg")
+  n_pg=$(grep -c '^instance of PG_ProviderCapabilities' "$share/Vexlan_CNA_Provider_Registration.mof")
+  [ "$n_reg" = "$n_table" ] || fail "sfcb registration has $n_reg sections, the table registers $n_table classes"
+  [ "$n_pg" = "$n_table" ] || fail "OpenPegasus registration has $n_pg capabilities, the table registers $n_table classes"
+
+  # The man page is well-formed and names the commands of both servers.
+  if command -v man > /dev/null 2>&1; then
+    MANWIDTH=80 man -l "$root/$mandir/man8/vexlan-cna.8" > "$tmp/man.txt" 2> "$tmp/man.err" ||
+      fail "man page does not format: $(cat "$tmp/man.err")"
+    [ ! -s "$tmp/man.err" ] || fail "man page warnings: $(cat "$tmp/man.err")"
+  else
+    cp "$root/$mandir/man8/vexlan-cna.8" "$tmp/man.txt"
+  fi
+  local word
+  for word in cimmof sfcbstage sfcbrepos cimcli wbemcli cimhost root/PG_InterOp root/vexlan_cmpi; do
+    grep -q -- "$word" "$tmp/man.txt" || fail "man page does not mention $word"
+  done
+}
+
+check_load() {
+  local prefix=$tmp/prefix
+  install_to "" "$prefix"
+  local share=$prefix/$datadir/vexlan-cna batch=$tmp/all.batch
+  unset ZORAP_SIM_ADAPTERS
+  # Every registered class in every namespace of its row, by the class of its
+  # provider type: instance classes enumerate, indication classes are only
+  # registered.
+  {
+    echo "ei root/vexlan_cmpi:Vexlan_Adapter_ComputerSystem"
+    registered_rows "$src/mof/classes.tsv" | while IFS=$'\t' read -r cls types nss; do
+      case " $types " in *" instance "*) ;; *) continue ;; esac
+      for ns in $nss; do
+        [ "$ns" = interop ] && ns=root/PG_InterOp
+        echo "ein $ns:$cls"
+      done
+    done
+  } > "$batch"
+  local flavour out err
+  for flavour in pegasus sfcb; do
+    out=$tmp/$flavour.out err=$tmp/$flavour.err
+    if ! "$prefix/$bindir/cimhost" -f "$flavour" --strict --reg "$share/Vexlan_CNA_Provider.reg" -m "$share/mof" \
+         -p "$prefix/$libdir/libVexlan_CNA_Provider.so" -n Vexlan_CNA_Provider batch "$batch" > "$out" 2> "$err"; then
+      fail "$flavour: cimhost failed"; cat "$err"
+    fi
+    if grep -q '^CMPI_RC_' "$err"; then
+      fail "$flavour: a registered class failed:"; grep '^CMPI_RC_' "$err"
+    fi
+    grep -q '^instance of Vexlan_Adapter_ComputerSystem' "$out" || fail "$flavour: no computer system"
+    # The default description installed beside the adapter library: its FC
+    # HBA and its CNA's NIC functions.
+    grep -q 'Vexlan_FCHBA_FCPort\..*DeviceID="VXA1631K0042_' "$out" ||
+      fail "$flavour: the FC ports of the default adapter description are missing"
+    grep -q 'Vexlan_NIC_EthernetPort2\.' "$out" || fail "$flavour: the NIC ports of the default adapter description are missing"
+  done
+  # Both flavours see the same objects.
+  cmp -s "$tmp/pegasus.out" "$tmp/sfcb.out" || fail "the two flavours answer differently"
+  "$prefix/$bindir/cimhost" --help | grep -q -- '--reg FILE' || fail "cimhost --help does not describe --reg"
+}
+
+case "$mode" in
+  tree) check_tree ;;
+  load) check_load ;;
+  *) echo "usage: $0 tree|load BUILD SOURCE BINDIR LIBDIR DATADIR MANDIR" >&2; exit 2 ;;
+esac
+if [ "$failures" -gt 0 ]; then
+  echo "$failures check(s) failed"
+  exit 1
+fi
+echo "deploy $mode: ok"
