@@ -1,0 +1,576 @@
+// The SCSI and physical classes through the shipped provider library and the
+// embedded CIM host in strict mode: what a client sees from ei, ein and gi,
+// with the default adapter description and with descriptions written here.
+#include <gtest/gtest.h>
+
+#include <cstdio>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "physical_test_support.h"
+#include "provider_env.h"
+#include "zorap_cna.h"
+#include "zorap_sim_control.h"
+
+using namespace provtest;
+using cimhost::Host;
+using cimhost::Instance;
+using cimhost::ObjectPath;
+using cimhost::OpResult;
+using cimhost::Type;
+using cimhost::Value;
+using fctest::json;
+
+namespace {
+
+const char kLogsOn[] = "DebugLog=1\nErrorLog=1\n";
+const char kController[] = "Vexlan_FCHBA_SCSIProtocolController";
+const char kEndpointHBA[] = "Vexlan_FCHBA_SCSIProtocolEndpointHBA";
+const char kEndpointTarget[] = "Vexlan_FCHBA_SCSIProtocolEndpointTarget";
+const char kExtent[] = "Vexlan_FCHBA_StorageExtent";
+const char kPackage[] = "Vexlan_Adapter_PhysicalPackage";
+const char kProduct[] = "Vexlan_Adapter_Product";
+const char kConnector[] = "Vexlan_Adapter_PhysicalConnector";
+const char kPort[] = "Vexlan_Adapter_PhysicalPort";
+
+using Names = std::vector<std::string>;
+
+// A path of the class with the given keys, in order.
+ObjectPath pathWith(const char* className, const std::vector<std::pair<std::string, std::string>>& keys)
+{
+    ObjectPath p = classPath(className);
+    for (const auto& k : keys)
+        p.setKey(k.first, Value::fromString(k.second));
+    return p;
+}
+
+ObjectPath systemPath(const char* className, const char* keyName, const std::string& key)
+{
+    return pathWith(className, {{"SystemCreationClassName", "Vexlan_Adapter_ComputerSystem"},
+                                {"SystemName", expectedHost().name},
+                                {"CreationClassName", className},
+                                {keyName, key}});
+}
+
+Names keyNames(const ObjectPath& p)
+{
+    Names names;
+    for (const auto& k : p.keys)
+        names.push_back(k.first);
+    return names;
+}
+
+const Value& scalar(const Instance& inst, const std::string& name, Type type)
+{
+    static const Value missing;
+    const Value* v = inst.property(name);
+    EXPECT_NE(v, nullptr) << name;
+    if (v == nullptr)
+        return missing;
+    EXPECT_EQ(v->type, type) << name;
+    EXPECT_FALSE(v->array) << name;
+    return *v;
+}
+
+// The elements of an array property of the given element type.
+std::vector<Value> elements(const Instance& inst, const std::string& name, Type type)
+{
+    const Value* v = inst.property(name);
+    EXPECT_NE(v, nullptr) << name;
+    if (v == nullptr)
+        return {};
+    EXPECT_TRUE(v->array) << name;
+    EXPECT_EQ(v->type, type) << name;
+    return v->elems;
+}
+
+OpResult enumerate(Host& host, const char* className)
+{
+    OpResult r = host.enumerateInstances(classPath(className));
+    EXPECT_TRUE(r.ok()) << className << ": " << r.message;
+    EXPECT_TRUE(r.strictErrors.empty()) << className << ": " << (r.strictErrors.empty() ? "" : r.strictErrors[0]);
+    return r;
+}
+
+std::vector<std::string> texts(const OpResult& r, const std::string& name)
+{
+    std::vector<std::string> out;
+    for (const auto& inst : r.instances)
+        out.push_back(propertyText(inst, name));
+    return out;
+}
+
+void start(Host& host, const json* description)
+{
+    writeSettings(kLogsOn, "");
+    removeLog();
+    if (description != nullptr)
+        ASSERT_EQ(0, zorap_sim_load_json(description->dump().c_str()));
+    else
+        ASSERT_EQ(0, zorap_sim_load_default());
+    zorap_sim_reset();
+    prepareHost(host);
+    ASSERT_TRUE(host.enumerateInstanceNames(classPath(kController)).ok());
+}
+
+}  // namespace
+
+// ---- The default host ------------------------------------------------------------
+
+class PhysicalDefaultHost : public ::testing::Test {
+protected:
+    static void SetUpTestSuite()
+    {
+        host_ = new Host;
+        start(*host_, nullptr);
+    }
+    static void TearDownTestSuite()
+    {
+        delete host_;
+        host_ = nullptr;
+        zorap_sim_reset();
+    }
+    void TearDown() override { zorap_sim_reset(); }
+    static Host* host_;
+};
+Host* PhysicalDefaultHost::host_ = nullptr;
+
+TEST_F(PhysicalDefaultHost, ControllerAndEndpointsOnePerFCFunction)
+{
+    const Names wwns = {"3100027E5A160042", "3101027E5A160042", "3100027E5A244793", "3101027E5A244793",
+                        "3100027E5A041234"};
+    OpResult controllers = enumerate(*host_, kController);
+    EXPECT_EQ(texts(controllers, "DeviceID"), wwns);
+    ASSERT_FALSE(controllers.instances.empty());
+    const Instance& c = controllers.instances[0];
+    EXPECT_EQ(propertyNames(c),
+              (Names{"SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID", "MaxUnitsControlled"}));
+    EXPECT_EQ(propertyText(c, "SystemCreationClassName"), "Vexlan_Adapter_ComputerSystem");
+    EXPECT_EQ(propertyText(c, "SystemName"), expectedHost().name);
+    EXPECT_EQ(propertyText(c, "CreationClassName"), kController);
+    EXPECT_EQ(scalar(c, "MaxUnitsControlled", Type::UInt32).u, 0u);
+
+    OpResult hbas = enumerate(*host_, kEndpointHBA);
+    EXPECT_EQ(texts(hbas, "Name"), wwns);
+    OpResult targets = enumerate(*host_, kEndpointTarget);
+    EXPECT_EQ(texts(targets, "Name"), (Names{"3100027E5A160042_3A00004E4F52A001", "3101027E5A160042_3A00004E4F52B001",
+                                             "3100027E5A244793_3A00004E4F52C001"}));
+    const Names endpointOrder = {"SystemCreationClassName", "SystemName", "CreationClassName", "Name",
+                                 "ProtocolIFType",          "ConnectionType", "Role",           "ElementName",
+                                 "OtherTypeDescription",    "OperationalStatus"};
+    for (auto* r : {&hbas, &targets}) {
+        ASSERT_FALSE(r->instances.empty());
+        const Instance& e = r->instances[0];
+        const bool isTarget = r == &targets;
+        EXPECT_EQ(propertyNames(e), endpointOrder);
+        EXPECT_EQ(propertyText(e, "CreationClassName"), isTarget ? kEndpointTarget : kEndpointHBA);
+        EXPECT_EQ(scalar(e, "ProtocolIFType", Type::UInt16).u, 56u);
+        EXPECT_EQ(scalar(e, "ConnectionType", Type::UInt16).u, 2u);
+        EXPECT_EQ(scalar(e, "Role", Type::UInt16).u, isTarget ? 3u : 2u);
+        EXPECT_EQ(propertyText(e, "ElementName"), propertyText(e, "Name"));
+        EXPECT_EQ(propertyText(e, "OtherTypeDescription"), "");
+        auto status = elements(e, "OperationalStatus", Type::UInt16);
+        ASSERT_EQ(status.size(), 1u);
+        EXPECT_EQ(status[0].u, 2u);
+    }
+
+    OpResult names = host_->enumerateInstanceNames(classPath(kEndpointTarget));
+    ASSERT_TRUE(names.ok()) << names.message;
+    ASSERT_EQ(names.paths.size(), 3u);
+    EXPECT_EQ(keyNames(names.paths[2]), (Names{"SystemCreationClassName", "SystemName", "CreationClassName", "Name"}));
+    names = host_->enumerateInstanceNames(classPath(kController));
+    ASSERT_EQ(names.paths.size(), 5u);
+    EXPECT_EQ(keyNames(names.paths[4]),
+              (Names{"SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID"}));
+    EXPECT_EQ(names.paths[4].keys[3].second.s, "3100027E5A041234");
+}
+
+TEST_F(PhysicalDefaultHost, StorageExtentsReadTheirLunRecords)
+{
+    OpResult r = enumerate(*host_, kExtent);
+    EXPECT_EQ(texts(r, "DeviceID"),
+              (Names{"3100027E5A160042_3A00004E4F52A001_634E4F5244415252000000000000A000_0",
+                     "3100027E5A160042_3A00004E4F52A001_634E4F5244415252000000000000A001_1",
+                     "3100027E5A160042_3A00004E4F52A001_634E4F5244415252000000000000A002_2",
+                     "3101027E5A160042_3A00004E4F52B001_634E4F5244415252000000000000B000_0",
+                     "3101027E5A160042_3A00004E4F52B001_344E4F520000B003_3",
+                     "3100027E5A244793_3A00004E4F52C001_634E4F5244415252000000000000C000_0"}));
+    ASSERT_EQ(r.instances.size(), 6u);
+    const Instance& e = r.instances[2];
+    EXPECT_EQ(propertyNames(e),
+              (Names{"SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID", "ElementName", "Name",
+                     "Access", "BlockSize", "LunID", "VendorID", "ProductID", "Revision", "RaidType",
+                     "NumberOfPartitions", "OperationalStatus", "OtherIdentifyingInfo", "IdentifyingDescriptions"}));
+    EXPECT_EQ(propertyText(e, "CreationClassName"), kExtent);
+    EXPECT_EQ(propertyText(e, "ElementName"), " ");
+    EXPECT_EQ(propertyText(e, "Name"), "/dev/sdd");
+    EXPECT_EQ(scalar(e, "Access", Type::UInt16).u, 3u);
+    EXPECT_EQ(scalar(e, "BlockSize", Type::UInt64).u, 4096u);
+    EXPECT_EQ(scalar(e, "LunID", Type::UInt16).u, 2u);
+    EXPECT_EQ(propertyText(e, "VendorID"), "NORDARR");
+    EXPECT_EQ(propertyText(e, "ProductID"), "FlashGrid 5000");
+    EXPECT_EQ(propertyText(e, "Revision"), "0421");
+    EXPECT_EQ(propertyText(e, "RaidType"), "N/A");
+    EXPECT_EQ(propertyText(e, "NumberOfPartitions"), "N/A");
+    auto info = elements(e, "OtherIdentifyingInfo", Type::String);
+    ASSERT_EQ(info.size(), 1u);
+    EXPECT_EQ(info[0].s, "2");
+    auto descriptions = elements(e, "IdentifyingDescriptions", Type::String);
+    ASSERT_EQ(descriptions.size(), 1u);
+    EXPECT_EQ(descriptions[0].s, "Lun ID");
+    EXPECT_EQ(propertyText(r.instances[4], "Name"), "/dev/sg4");
+    EXPECT_EQ(propertyText(r.instances[4], "ProductID"), "TapeVault 8");
+
+    // Extents and target endpoints are built again for every request; the
+    // controller and the HBA endpoints answer from the polling thread's lists.
+    unsigned long walks = zorap_sim_call_count(ZORAP_FN_GetAdapterList);
+    enumerate(*host_, kController);
+    enumerate(*host_, kEndpointHBA);
+    enumerate(*host_, kPackage);
+    enumerate(*host_, kConnector);
+    EXPECT_EQ(zorap_sim_call_count(ZORAP_FN_GetAdapterList), walks);
+    enumerate(*host_, kExtent);
+    EXPECT_GT(zorap_sim_call_count(ZORAP_FN_GetAdapterList), walks);
+    walks = zorap_sim_call_count(ZORAP_FN_GetAdapterList);
+    enumerate(*host_, kEndpointTarget);
+    EXPECT_GT(zorap_sim_call_count(ZORAP_FN_GetAdapterList), walks);
+    EXPECT_GE(countLog("Entering createStorageExtent, index = 5"), 1);
+}
+
+TEST_F(PhysicalDefaultHost, PackagesCarryBrandingUuidsAndVpdTexts)
+{
+    OpResult r = enumerate(*host_, kPackage);
+    ASSERT_EQ(r.instances.size(), 3u);
+    const Names order = {"Tag",      "CreationClassName", "Model", "Manufacturer", "SerialNumber", "PartNumber",
+                         "SKU",      "PackageType",       "Name",  "Description",  "AdapterType"};
+    struct Expected {
+        const char* tag;
+        const char* model;
+        const char* manufacturer;
+        const char* serial;
+        const char* part;
+        const char* sku;
+        const char* name;
+        unsigned adapterType;
+    };
+    const Expected expected[3] = {
+        {"3f2a9c1e-7d44-4b0a-9e51-0c7e5a160042", "VXF1622", "Vexlan Corporation", "VXA1631K0042", "VXF1622-01",
+         "VXF1622-FRU", "Vexlan Fibre Channel Adapter VXA1631K0042", 0},
+        // The I2C UUID comes before the VPD's.
+        {"8d1e5c40-2b6f-4e19-a3c7-7e5a24470193", "VXC2402", "Vexlan Corporation", "VXC2447M0193", "VXC2402-10",
+         "VXC2402-FRU", "Vexlan CNA Adapter VXC2447M0193", 3},
+        // The 11S serial: branded, shortened serial, part number from the ID;
+        // with no UUID of its own the VPD UUID line of the board before stands.
+        {"5b7c2e91-0a3d-4f62-8c15-7e5a24470193", "KMX3102", "IBM", "ZV10C4001234", "VXL4G01", "VXL4G01-FRU",
+         "IBM Fibre Channel Adapter ZV10C4001234", 0},
+    };
+    for (int i = 0; i < 3; ++i) {
+        const Instance& p = r.instances[i];
+        const Expected& x = expected[i];
+        EXPECT_EQ(propertyNames(p), order) << i;
+        EXPECT_EQ(propertyText(p, "Tag"), x.tag);
+        EXPECT_EQ(propertyText(p, "CreationClassName"), kPackage);
+        EXPECT_EQ(propertyText(p, "Model"), x.model);
+        EXPECT_EQ(propertyText(p, "Manufacturer"), x.manufacturer);
+        EXPECT_EQ(propertyText(p, "SerialNumber"), x.serial);
+        EXPECT_EQ(propertyText(p, "PartNumber"), x.part);
+        EXPECT_EQ(propertyText(p, "SKU"), x.sku);
+        EXPECT_EQ(scalar(p, "PackageType", Type::UInt16).u, 9u);
+        EXPECT_EQ(propertyText(p, "Name"), x.name);
+        EXPECT_EQ(propertyText(p, "Description"), x.name);
+        EXPECT_EQ(scalar(p, "AdapterType", Type::UInt32).u, x.adapterType);
+    }
+
+    OpResult names = host_->enumerateInstanceNames(classPath(kPackage));
+    ASSERT_TRUE(names.ok()) << names.message;
+    ASSERT_EQ(names.paths.size(), 3u);
+    EXPECT_EQ(keyNames(names.paths[1]), (Names{"Tag", "CreationClassName"}));
+    EXPECT_EQ(names.paths[1].keys[0].second.s, "8d1e5c40-2b6f-4e19-a3c7-7e5a24470193");
+
+    // A property list keeps both keys.
+    OpResult filtered = host_->getInstance(
+        pathWith(kPackage, {{"Tag", "8D1E5C40-2B6F-4E19-A3C7-7E5A24470193"}, {"CreationClassName", kPackage}}),
+        Names{"Model"});
+    ASSERT_TRUE(filtered.ok()) << filtered.message;
+    ASSERT_EQ(filtered.instances.size(), 1u);
+    EXPECT_EQ(propertyNames(filtered.instances[0]), (Names{"Tag", "CreationClassName", "Model"}));
+}
+
+TEST_F(PhysicalDefaultHost, ProductsOnePerAdapter)
+{
+    OpResult r = enumerate(*host_, kProduct);
+    ASSERT_EQ(r.instances.size(), 3u);
+    const Instance& p = r.instances[1];
+    EXPECT_EQ(propertyNames(p), (Names{"Name", "IdentifyingNumber", "Vendor", "Version", "ElementName", "AdapterType"}));
+    EXPECT_EQ(propertyText(p, "Name"), "Vexlan 10Gb Dual-Port Converged Network Adapter");
+    EXPECT_EQ(propertyText(p, "IdentifyingNumber"), "VXC2447M0193");
+    EXPECT_EQ(propertyText(p, "Vendor"), "Vexlan Corporation");
+    EXPECT_EQ(propertyText(p, "Version"), "B1");
+    EXPECT_EQ(propertyText(p, "ElementName"), "Vexlan Corporation_B1_Vexlan 10Gb Dual-Port Converged Network Adapter");
+    EXPECT_EQ(scalar(p, "AdapterType", Type::UInt32).u, 3u);
+    EXPECT_EQ(texts(r, "IdentifyingNumber"), (Names{"VXA1631K0042", "VXC2447M0193", "11SVXL4G01ZV10C4001234"}));
+
+    OpResult names = host_->enumerateInstanceNames(classPath(kProduct));
+    ASSERT_TRUE(names.ok()) << names.message;
+    ASSERT_EQ(names.paths.size(), 3u);
+    EXPECT_EQ(keyNames(names.paths[0]), (Names{"Name", "IdentifyingNumber", "Vendor", "Version"}));
+    EXPECT_EQ(names.paths[0].keys[2].second.s, "Vexlan Corporation");
+    EXPECT_EQ(names.paths[0].keys[3].second.s, "A2");
+}
+
+TEST_F(PhysicalDefaultHost, ConnectorsShowTransceiverFieldsAndRawPages)
+{
+    OpResult r = enumerate(*host_, kConnector);
+    // The NIC functions of the CNA share the FCoE functions' modules.
+    EXPECT_EQ(texts(r, "Tag"), (Names{"VXS1A2B3C4D_VXA1631K0042_0", "VXS1A2B3C4E_VXA1631K0042_1",
+                                      "VXS2C3D4E5F_VXC2447M0193_0", "VXS2C3D4E60_VXC2447M0193_1",
+                                      "VXS0F1E2D3C_11SVXL4G01ZV10C4001234_0"}));
+    ASSERT_EQ(r.instances.size(), 5u);
+    const Instance& c = r.instances[0];
+    EXPECT_EQ(propertyNames(c),
+              (Names{"CreationClassName", "Tag", "Name", "ElementName", "ConnectorLayout", "ConnectorDescription",
+                     "Manufacturer", "SerialNumber", "PartNumber", "SFPDataA0", "SFPDataA2", "SFPStatus"}));
+    EXPECT_EQ(propertyText(c, "CreationClassName"), kConnector);
+    EXPECT_EQ(propertyText(c, "Name"), kConnector);
+    EXPECT_EQ(propertyText(c, "ElementName"), "Physical Port Connector");
+    EXPECT_EQ(scalar(c, "ConnectorLayout", Type::UInt16).u, 1u);
+    EXPECT_EQ(propertyText(c, "ConnectorDescription"), "SFP");
+    EXPECT_EQ(propertyText(c, "Manufacturer"), "VEXLAN");
+    EXPECT_EQ(propertyText(c, "SerialNumber"), "VXS1A2B3C4D");
+    EXPECT_EQ(propertyText(c, "PartNumber"), "VXS-16G-SR");
+    EXPECT_EQ(scalar(c, "SFPStatus", Type::UInt16).u, 1u);
+    auto a0 = elements(c, "SFPDataA0", Type::UInt8);
+    auto a2 = elements(c, "SFPDataA2", Type::UInt8);
+    ASSERT_EQ(a0.size(), 256u);
+    ASSERT_EQ(a2.size(), 256u);
+    std::string vendor;
+    for (int i = 20; i < 26; ++i)
+        vendor += static_cast<char>(a0[i].u);
+    EXPECT_EQ(vendor, "VEXLAN");
+    EXPECT_GE(countLog("Exiting  createPhysicalConnector: Current device has the same the serial number as a device "
+                       "in the list at index=2. Skip!"),
+              1);
+
+    OpResult names = host_->enumerateInstanceNames(classPath(kConnector));
+    ASSERT_TRUE(names.ok()) << names.message;
+    ASSERT_EQ(names.paths.size(), 5u);
+    EXPECT_EQ(keyNames(names.paths[0]), (Names{"CreationClassName", "Tag"}));
+    // The property filter keeps Tag alone, so a property list drops the
+    // path's other key, CreationClassName, from the instance; the strict host
+    // refuses such an instance, so this one request is checked leniently.
+    host_->setStrict(false);
+    OpResult filtered = host_->getInstance(
+        pathWith(kConnector, {{"CreationClassName", kConnector}, {"Tag", "vxs2c3d4e60_vxc2447m0193_1"}}),
+        Names{"SFPStatus"});
+    host_->setStrict(true);
+    ASSERT_TRUE(filtered.ok()) << filtered.message;
+    ASSERT_EQ(filtered.instances.size(), 1u);
+    EXPECT_EQ(propertyNames(filtered.instances[0]), (Names{"Tag", "SFPStatus"}));
+    EXPECT_EQ(propertyText(filtered.instances[0], "Tag"), "VXS2C3D4E60_VXC2447M0193_1");
+}
+
+TEST_F(PhysicalDefaultHost, PhysicalPortsOnePerBoardPort)
+{
+    OpResult r = enumerate(*host_, kPort);
+    EXPECT_EQ(texts(r, "Tag"), (Names{"VXA1631K0042_0", "VXA1631K0042_1", "VXC2447M0193_0", "VXC2447M0193_1",
+                                      "11SVXL4G01ZV10C4001234_0"}));
+    ASSERT_EQ(r.instances.size(), 5u);
+    const Instance& p = r.instances[3];
+    EXPECT_EQ(propertyNames(p), (Names{"CreationClassName", "Tag", "Name", "ElementName", "ConnectorLayout",
+                                       "ConnectorDescription", "Manufacturer", "SerialNumber", "PortNumber"}));
+    EXPECT_EQ(propertyText(p, "Name"), kPort);
+    EXPECT_EQ(propertyText(p, "ElementName"), "Physical Port");
+    EXPECT_EQ(scalar(p, "ConnectorLayout", Type::UInt16).u, 1u);
+    EXPECT_EQ(propertyText(p, "ConnectorDescription"), "Physical Port");
+    EXPECT_EQ(propertyText(p, "Manufacturer"), "Vexlan Corporation");
+    EXPECT_EQ(propertyText(p, "SerialNumber"), "VXC2447M0193");
+    EXPECT_EQ(scalar(p, "PortNumber", Type::UInt16).u, 1u);
+    // An 11S serial stays whole here and makes the port IBM's.
+    EXPECT_EQ(propertyText(r.instances[4], "SerialNumber"), "11SVXL4G01ZV10C4001234");
+    EXPECT_EQ(propertyText(r.instances[4], "Manufacturer"), "IBM");
+}
+
+TEST_F(PhysicalDefaultHost, GetInstanceIgnoresCaseAndAMissNamesTheKey)
+{
+    struct Case {
+        ObjectPath hit;
+        ObjectPath miss;
+        const char* keyName;
+        std::string keyValue;
+    };
+    const std::vector<Case> cases = {
+        {systemPath(kController, "DeviceID", "3101027e5a244793"), systemPath(kController, "DeviceID", "NOPE1"),
+         "DeviceID", "3101027E5A244793"},
+        {systemPath(kEndpointHBA, "Name", "3100027e5a041234"), systemPath(kEndpointHBA, "Name", "NOPE2"), "Name",
+         "3100027E5A041234"},
+        {systemPath(kEndpointTarget, "Name", "3100027e5a244793_3a00004e4f52c001"),
+         systemPath(kEndpointTarget, "Name", "NOPE3"), "Name", "3100027E5A244793_3A00004E4F52C001"},
+        {systemPath(kExtent, "DeviceID", "3101027e5a160042_3a00004e4f52b001_344e4f520000b003_3"),
+         systemPath(kExtent, "DeviceID", "NOPE4"), "DeviceID", "3101027E5A160042_3A00004E4F52B001_344E4F520000B003_3"},
+        {pathWith(kPackage, {{"Tag", "3F2A9C1E-7D44-4B0A-9E51-0C7E5A160042"}, {"CreationClassName", kPackage}}),
+         pathWith(kPackage, {{"Tag", "NOPE5"}, {"CreationClassName", kPackage}}), "Tag",
+         "3f2a9c1e-7d44-4b0a-9e51-0c7e5a160042"},
+        {pathWith(kProduct, {{"Name", "x"}, {"IdentifyingNumber", "11svxl4g01zv10c4001234"}, {"Vendor", "x"},
+                             {"Version", "x"}}),
+         pathWith(kProduct, {{"Name", "x"}, {"IdentifyingNumber", "NOPE6"}, {"Vendor", "x"}, {"Version", "x"}}),
+         "IdentifyingNumber", "11SVXL4G01ZV10C4001234"},
+        {pathWith(kConnector, {{"CreationClassName", kConnector}, {"Tag", "vxs0f1e2d3c_11svxl4g01zv10c4001234_0"}}),
+         pathWith(kConnector, {{"CreationClassName", kConnector}, {"Tag", "NOPE7"}}), "Tag",
+         "VXS0F1E2D3C_11SVXL4G01ZV10C4001234_0"},
+        {pathWith(kPort, {{"CreationClassName", kPort}, {"Tag", "vxc2447m0193_0"}}),
+         pathWith(kPort, {{"CreationClassName", kPort}, {"Tag", "NOPE8"}}), "Tag", "VXC2447M0193_0"},
+    };
+    for (const Case& c : cases) {
+        OpResult hit = host_->getInstance(c.hit);
+        ASSERT_TRUE(hit.ok()) << c.hit.className << ": " << hit.message;
+        EXPECT_TRUE(hit.strictErrors.empty()) << c.hit.className;
+        ASSERT_EQ(hit.instances.size(), 1u) << c.hit.className;
+        EXPECT_EQ(propertyText(hit.instances[0], c.keyName), c.keyValue) << c.hit.className;
+
+        OpResult miss = host_->getInstance(c.miss);
+        EXPECT_EQ(miss.rc, 6) << c.miss.className;
+        const Value* missKey = nullptr;
+        for (const auto& k : c.miss.keys)
+            if (k.first == c.keyName)
+                missKey = &k.second;
+        ASSERT_NE(missKey, nullptr);
+        EXPECT_EQ(miss.message, missKey->s) << c.miss.className;
+        EXPECT_TRUE(miss.instances.empty());
+    }
+    EXPECT_GE(countLog("getInstance_PhysicalConnector: Error no matching instance found, KeyValue=NOPE7!"), 1);
+    EXPECT_GE(countLog("getInstance_StorageExtent: Error no matching instance found, KeyValue=NOPE4!"), 1);
+
+    // A key that is not a string delivers nothing, with success.
+    ObjectPath numeric = classPath(kPort);
+    numeric.setKey("CreationClassName", Value::fromString(kPort));
+    Value number;
+    number.type = Type::UInt16;
+    number.null = false;
+    number.u = 7;
+    numeric.setKey("Tag", number);
+    OpResult odd = host_->getInstance(numeric);
+    EXPECT_TRUE(odd.ok()) << odd.message;
+    EXPECT_TRUE(odd.instances.empty());
+}
+
+// ---- Hosts written here ------------------------------------------------------------
+
+namespace {
+
+// A VPD stream in hex: identifier, read-only section, the given keywords.
+std::string vpdHex(const std::vector<std::pair<std::string, std::string>>& keywords, bool endTag)
+{
+    auto hexOf = [](const std::string& s) {
+        std::string out;
+        char b[4];
+        for (unsigned char c : s) {
+            std::snprintf(b, sizeof(b), "%02x", c);
+            out += b;
+        }
+        return out;
+    };
+    std::string stream = "820300" + hexOf("HBA") + "900000";
+    for (const auto& kw : keywords) {
+        char len[16];
+        std::snprintf(len, sizeof(len), "%02x", static_cast<unsigned>(kw.second.size() & 0xFF));
+        stream += hexOf(kw.first) + len + hexOf(kw.second);
+    }
+    if (endTag)
+        stream += "78";
+    return stream;
+}
+
+}  // namespace
+
+TEST(PhysicalHosts, BadVpdEmptySerialsAndFailingCallsLeaveTheDescribedDefaults)
+{
+    using phystest::port;
+    using phystest::transceiver;
+    // An adapter without a serial and without an "SN" keyword, first, so that
+    // no serial of a board before it stands in; it has no cages.
+    json blank = fctest::fcAdapter(2, "RSX-1620", 1, "");
+    blank["vpd"].erase("SN");
+    blank["transceiverSupport"] = false;
+    // Two modules, of which the first read fails (the first read of the build).
+    json flaky = fctest::fcAdapter(3, "RSX-1620", 0, "FLAKY");
+    flaky["ports"] = json::array({port(0, json::array({fctest::fcFunction(3, 0)}), transceiver("SFPF0")),
+                                  port(1, json::array({fctest::fcFunction(3, 1)}), transceiver("SFPF1"))});
+    // A VPD stream without an end tag, whose last keyword claims more bytes
+    // than follow.
+    json runaway = fctest::fcAdapter(1, "RSX-1620", 0, "RUNAWAY");
+    runaway.erase("vpd");
+    runaway["vpdHex"] = vpdHex({{"SN", "RUNAWAY"}, {"PN", "RUN-PN"}}, false) + "464eff414243";
+    runaway["ports"] = json::array({port(0, json::array({fctest::fcFunction(1, 0)}), transceiver("SFPR"))});
+    // A board without a serial or "SN" keyword after others takes the serial
+    // of the board before it and so adds no package; its module has no serial.
+    json late = fctest::fcAdapter(4, "RSX-1620", 0, "");
+    late["vpd"].erase("SN");
+    late["ports"] = json::array({port(0, json::array({fctest::fcFunction(4, 0)}), transceiver(""))});
+    json description = fctest::host(json::array({blank, flaky, runaway, late}));
+
+    Host host;
+    writeSettings(kLogsOn, "");
+    removeLog();
+    ASSERT_EQ(0, zorap_sim_load_json(description.dump().c_str()));
+    zorap_sim_reset();
+    // The provider's first build runs on its polling thread at the first
+    // request: the first module read of that build fails.
+    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_GetSFPData, ZORAP_ERR_FAILED, 1));
+    prepareHost(host);
+
+    OpResult packages = enumerate(host, kPackage);
+    EXPECT_EQ(texts(packages, "SerialNumber"), (Names{"", "FLAKY", "RUNAWAY"}));
+    ASSERT_EQ(packages.instances.size(), 3u);
+    // The blank board: its tag is its empty serial.
+    EXPECT_EQ(propertyText(packages.instances[0], "Tag"), "");
+    EXPECT_EQ(propertyText(packages.instances[0], "Name"), "Vexlan Fibre Channel Adapter ");
+    EXPECT_EQ(propertyText(packages.instances[0], "PartNumber"), "VXT-1");
+    // The runaway stream gave all its keywords, the last one cut at the end
+    // of the data.
+    EXPECT_EQ(propertyText(packages.instances[2], "Tag"), "RUNAWAY");
+    EXPECT_EQ(propertyText(packages.instances[2], "PartNumber"), "RUN-PN");
+    EXPECT_EQ(propertyText(packages.instances[2], "SKU"), "ABC");
+    OpResult blankPackage = host.getInstance(pathWith(kPackage, {{"Tag", ""}, {"CreationClassName", kPackage}}));
+    ASSERT_TRUE(blankPackage.ok()) << blankPackage.message;
+    EXPECT_EQ(blankPackage.instances.size(), 1u);
+
+    // The failed read drops the first connector, the blank module gives none.
+    OpResult connectors = enumerate(host, kConnector);
+    EXPECT_EQ(texts(connectors, "Tag"), (Names{"SFPF1_FLAKY_1", "SFPR_RUNAWAY_0"}));
+    EXPECT_GE(countLog("No Transceiver on DeviceNumber 0"), 1);
+    EXPECT_GE(countLog("Empty SerialNumber for the Transceiver on DeviceNumber 0"), 1);
+    EXPECT_EQ(zorap_sim_call_count(ZORAP_FN_GetSFPData), 4u);
+
+    // The two boards without a serial have one port tag between them.
+    OpResult ports = enumerate(host, kPort);
+    EXPECT_EQ(texts(ports, "Tag"), (Names{"_0", "FLAKY_0", "FLAKY_1", "RUNAWAY_0"}));
+    EXPECT_GE(countLog("Exiting  createPhysicalPort: Current device has the same the serial number as a device in "
+                       "the list at index=0. Skip!"),
+              1);
+    OpResult blankPort = host.getInstance(pathWith(kPort, {{"CreationClassName", kPort}, {"Tag", "_0"}}));
+    ASSERT_TRUE(blankPort.ok()) << blankPort.message;
+    EXPECT_EQ(blankPort.instances.size(), 1u);
+
+    OpResult products = enumerate(host, kProduct);
+    EXPECT_EQ(texts(products, "IdentifyingNumber"), (Names{"", "FLAKY", "RUNAWAY", ""}));
+    ASSERT_TRUE(host.unload(true).ok());
+}
+
+TEST(PhysicalHosts, SixtyFourAdaptersOfFourFCFunctionsEach)
+{
+    json description = fctest::wideHost();
+    Host host;
+    start(host, &description);
+    EXPECT_EQ(enumerate(host, kController).instances.size(), 256u);
+    EXPECT_EQ(enumerate(host, kEndpointHBA).instances.size(), 256u);
+    EXPECT_EQ(enumerate(host, kPackage).instances.size(), 64u);
+    EXPECT_EQ(enumerate(host, kProduct).instances.size(), 64u);
+    EXPECT_EQ(enumerate(host, kPort).instances.size(), 128u);
+    EXPECT_TRUE(enumerate(host, kConnector).instances.empty());
+    EXPECT_TRUE(enumerate(host, kExtent).instances.empty());
+    OpResult last = host.getInstance(systemPath(kController, "DeviceID", "31000000003F0300"));
+    ASSERT_TRUE(last.ok()) << last.message;
+    EXPECT_EQ(last.instances.size(), 1u);
+    ASSERT_TRUE(host.unload(true).ok());
+}
