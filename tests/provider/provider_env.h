@@ -47,7 +47,7 @@ struct ExpectedHost {
 };
 ExpectedHost expectedHost();
 
-// Threads of this process.
+// Threads of this process (sanitizer helper threads included from the start).
 int threadCount();
 
 std::string propertyText(const cimhost::Instance& inst, const std::string& name);
