@@ -122,15 +122,16 @@ int getPropertyFilePath(char* buffer, unsigned int size) {
 
 Vexlan_NIC_Properties* Vexlan_NIC_Properties::singleton = nullptr;
 
-namespace {
-std::once_flag singletonOnce;
-}
-
 Vexlan_NIC_Properties* Vexlan_NIC_Properties::instance() {
     // The first callers may be the polling thread and a request thread at
-    // once: the object is created exactly once.
-    std::call_once(singletonOnce, [] { singleton = new Vexlan_NIC_Properties(); });
-    return singleton;
+    // once: a function-local static is created exactly once, and it is
+    // destroyed when the server unloads the library, so nothing is left behind.
+    static Vexlan_NIC_Properties* const created = [] {
+        static Vexlan_NIC_Properties object;
+        singleton = &object;
+        return &object;
+    }();
+    return created;
 }
 
 Vexlan_NIC_Properties::Vexlan_NIC_Properties()
