@@ -187,8 +187,9 @@ struct Host::Impl {
     ~Impl();
 
     CMPIBroker broker{};
-    Flavour flavour = Flavour::Pegasus;
-    bool strict = false;
+    // Read by provider threads (newInstance, deliverIndication) too.
+    std::atomic<Flavour> flavour{Flavour::Pegasus};
+    std::atomic<bool> strict{false};
     std::string defaultNs = "root/cimv2";
     ClassRepository repo;
     std::vector<Registration> registrations;

@@ -176,6 +176,17 @@ TEST_F(HostTest, InvokeMethodPassesTypedArgumentsBothWays) {
     EXPECT_EQ(h.invokeMethod(alpha, "Echo", {}).rc, 4);
 }
 
+TEST_F(HostTest, BrokerServesAProviderWrittenInC) {
+    // The provider checks strings, datetimes, arrays, paths, instances with
+    // filters, memory, threads and the up-calls against the broker.
+    const OpResult r = h.invokeMethod(p("Tiny_Thing.Name=\"alpha\",Id=1"), "Probe", {});
+    ASSERT_TRUE(r.ok()) << statusLine(r);
+    ASSERT_EQ(r.outArgs.size(), 1u);
+    EXPECT_EQ(r.data[0].u, 0u) << "first failed check: " << r.outArgs[0].second.s;
+    const auto log = h.logLines();
+    EXPECT_NE(std::find(log.begin(), log.end(), "log[1] tiny: probe done"), log.end());
+}
+
 // ---------------------------------------------------------------- strict mode
 
 TEST_F(HostTest, StrictModeRejectsWhatDisagreesWithTheMof) {

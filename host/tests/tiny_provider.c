@@ -10,6 +10,7 @@
  */
 #include <cmpift.h>
 #include <pthread.h>
+#include <stdio.h>
 #include <string.h>
 #include <strings.h>
 #include <time.h>
@@ -327,6 +328,179 @@ __attribute__((unused))
 static CMPIAssociationMIFT assocFT = {200, 200, "associationTiny", assocCleanup, associators, associatorNames,
                                       references, referenceNames};
 
+
+/* ------------------------------------------------------------ broker probe */
+
+/* Exercises the broker's encapsulated types and service tables from C the
+ * way a provider uses them; each failed check is named in `log`. Returns the
+ * number of failures. */
+static void *probeThread(void *arg) {
+    int *flag = (int *)arg;
+    *flag = 1;
+    return NULL;
+}
+
+static int once;
+static int onceRuns;
+static void onceInit(void) { ++onceRuns; }
+
+static unsigned probe(const CMPIContext *ctx, char *log, size_t logSize) {
+    unsigned failures = 0;
+    CMPIStatus rc;
+    CMPIValue v;
+    CMPIData d;
+    CMPIString *s;
+#define CHECK(cond, what)                                                      \
+    do {                                                                       \
+        if (!(cond)) {                                                         \
+            if (failures++ == 0) snprintf(log, logSize, "%s", what);           \
+        }                                                                      \
+    } while (0)
+
+    /* Context entries of the request. */
+    d = ctx->ft->getEntry(ctx, CMPIInitNameSpace, &rc);
+    CHECK(rc.rc == CMPI_RC_OK && d.type == CMPI_string &&
+              strcmp(d.value.string->ft->getCharPtr(d.value.string, NULL), NS) == 0,
+          "context namespace");
+    v.uint32 = 7;
+    CHECK(ctx->ft->addEntry(ctx, "Mine", &v, CMPI_uint32).rc == CMPI_RC_OK, "addEntry");
+    d = ctx->ft->getEntry(ctx, "mine", &rc);
+    CHECK(d.type == CMPI_uint32 && d.value.uint32 == 7, "getEntry after addEntry");
+    ctx->ft->getEntry(ctx, "Absent", &rc);
+    CHECK(rc.rc == CMPI_RC_ERR_NOT_FOUND, "absent context entry");
+
+    /* Date-times: binary, text, interval, bad text. */
+    {
+        CMPIDateTime *dt = tb->eft->newDateTimeFromBinary(tb, 3000000000ULL, 1, &rc);
+        s = dt->ft->getStringFormat(dt, NULL);
+        CHECK(strcmp(s->ft->getCharPtr(s, NULL), "00000000005000.000000:000") == 0, "interval text");
+        CHECK(dt->ft->isInterval(dt, NULL), "isInterval");
+        dt = tb->eft->newDateTimeFromChars(tb, "19700102000000.000001+000", &rc);
+        CHECK(rc.rc == CMPI_RC_OK && dt->ft->getBinaryFormat(dt, NULL) == 86400000001ULL, "absolute binary");
+        CHECK(!dt->ft->isInterval(dt, NULL), "absolute is no interval");
+        tb->eft->newDateTimeFromChars(tb, "yesterday", &rc);
+        CHECK(rc.rc == CMPI_RC_ERR_INVALID_PARAMETER, "bad datetime text refused");
+        dt = tb->eft->newDateTime(tb, &rc);
+        CHECK(dt->ft->getBinaryFormat(dt, NULL) > 1600000000000000ULL, "newDateTime is now");
+    }
+
+    /* Arrays: typed elements, bounds, clone and release. */
+    {
+        CMPIArray *a = tb->eft->newArray(tb, 2, CMPI_uint16, &rc), *c;
+        v.uint16 = 5;
+        CHECK(a->ft->setElementAt(a, 1, &v, CMPI_uint16).rc == CMPI_RC_OK, "setElementAt");
+        CHECK(a->ft->setElementAt(a, 2, &v, CMPI_uint16).rc == CMPI_RC_ERR_NO_SUCH_PROPERTY, "setElementAt bound");
+        CHECK(a->ft->setElementAt(a, 0, (const CMPIValue *)"x", CMPI_chars).rc == CMPI_RC_ERR_TYPE_MISMATCH,
+              "setElementAt type");
+        d = a->ft->getElementAt(a, 0, NULL);
+        CHECK(d.state & CMPI_nullValue, "unset element is null");
+        c = a->ft->clone(a, &rc);
+        d = c->ft->getElementAt(c, 1, NULL);
+        CHECK(d.type == CMPI_uint16 && d.value.uint16 == 5 && c->ft->getSize(c, NULL) == 2, "array clone");
+        CHECK(c->ft->getSimpleType(c, NULL) == CMPI_uint16, "getSimpleType");
+        c->ft->release(c);
+        c = tb->eft->newArray(tb, 1, CMPI_ptr, &rc);
+        CHECK(c == NULL && rc.rc == CMPI_RC_ERR_INVALID_DATA_TYPE, "array of an unsupported type");
+    }
+
+    /* Object paths: keys, namespace, toString, classPathIsA. */
+    {
+        CMPIObjectPath *p = tb->eft->newObjectPath(tb, NS, "Tiny_BadType", &rc), *q;
+        v.string = tb->eft->newString(tb, "a\"b", NULL);
+        p->ft->addKey(p, "Name", &v, CMPI_string);
+        v.uint16 = 3;
+        p->ft->addKey(p, "Id", &v, CMPI_uint16);
+        s = p->ft->toString(p, NULL);
+        CHECK(strcmp(s->ft->getCharPtr(s, NULL), "root/tiny:Tiny_BadType.Name=\"a\\\"b\",Id=3") == 0, "path text");
+        CHECK(tb->eft->classPathIsA(tb, p, "Tiny_Base", NULL), "classPathIsA superclass");
+        CHECK(!tb->eft->classPathIsA(tb, p, "Tiny_Link", NULL), "classPathIsA other");
+        d = p->ft->getKey(p, "id", &rc);
+        CHECK(rc.rc == CMPI_RC_OK && (d.state & CMPI_keyValue) && d.value.uint16 == 3, "getKey");
+        CHECK(p->ft->getKeyCount(p, NULL) == 2, "getKeyCount");
+        q = tb->eft->newObjectPath(tb, "root/else", "X", NULL);
+        q->ft->setNameSpaceFromObjectPath(q, p);
+        s = q->ft->getNameSpace(q, NULL);
+        CHECK(strcmp(s->ft->getCharPtr(s, NULL), NS) == 0, "setNameSpaceFromObjectPath");
+        CHECK(tb->eft->isOfType(tb, p, "CMPIObjectPath", NULL), "isOfType");
+        s = tb->eft->getType(tb, s, NULL);
+        CHECK(strcmp(s->ft->getCharPtr(s, NULL), "CMPIString") == 0, "getType");
+    }
+
+    /* Instances: property filter, getObjectPath. */
+    {
+        static const char *props[] = {"Count", NULL};
+        static const char *keys[] = {"Name", "Id", NULL};
+        CMPIObjectPath *p = tb->eft->newObjectPath(tb, NS, "Tiny_Thing", NULL), *op;
+        CMPIInstance *ci = tb->eft->newInstance(tb, p, NULL);
+        v.uint32 = 1;
+        ci->ft->setProperty(ci, "Flag", &v, CMPI_uint32);
+        ci->ft->setPropertyFilter(ci, props, keys);
+        CHECK(ci->ft->getPropertyCount(ci, NULL) == 0, "filter drops what was set");
+        ci->ft->setProperty(ci, "Name", (const CMPIValue *)"n", CMPI_chars);
+        v.uint16 = 4;
+        ci->ft->setProperty(ci, "Id", &v, CMPI_uint16);
+        ci->ft->setProperty(ci, "Count", &v, CMPI_uint16);
+        ci->ft->setProperty(ci, "Big", &v, CMPI_uint16);
+        CHECK(ci->ft->getPropertyCount(ci, NULL) == 3, "filter keeps listed and keys");
+        ci->ft->getProperty(ci, "Big", &rc);
+        CHECK(rc.rc == CMPI_RC_ERR_NO_SUCH_PROPERTY, "filtered property absent");
+        op = ci->ft->getObjectPath(ci, NULL);
+        s = op->ft->toString(op, NULL);
+        CHECK(strcmp(s->ft->getCharPtr(s, NULL), "root/tiny:Tiny_Thing.Name=\"n\",Id=4") == 0,
+              "instance path from key properties");
+    }
+
+    /* Memory: mark/release, cmpiMalloc/free, explicit free of objects. */
+    {
+        CMPIGcStat *gc = tb->mft->mark(tb, &rc);
+        char *m;
+        CHECK(rc.rc == CMPI_RC_OK && gc != NULL, "mark");
+        tb->eft->newString(tb, "released with the mark", NULL);
+        CHECK(tb->mft->release(tb, gc).rc == CMPI_RC_OK, "release");
+        m = (char *)tb->mft->cmpiMalloc(tb, 16);
+        m = (char *)tb->mft->cmpiRealloc(tb, m, 64);
+        CHECK(m != NULL, "cmpiRealloc");
+        tb->mft->cmpiFree(tb, m);
+        m = tb->mft->cmpiStrDup(tb, "kept until unload");
+        CHECK(m && strcmp(m, "kept until unload") == 0, "cmpiStrDup");
+        tb->mft->freeString(tb, tb->eft->newString(tb, "gone now", NULL));
+    }
+
+    /* Services: threads, mutexes, conditions, keys, once. */
+    {
+        int flag = 0;
+        void *ret = NULL;
+        CMPI_THREAD_TYPE t = tb->xft->newThread(probeThread, &flag, 0);
+        CMPI_MUTEX_TYPE mx = tb->xft->newMutex(0);
+        CMPI_COND_TYPE cv = tb->xft->newCondition(0);
+        CMPI_THREAD_KEY_TYPE key;
+        struct timespec ts;
+        CHECK(t != NULL && tb->xft->joinThread(t, &ret) == 0 && flag == 1, "newThread/joinThread");
+        tb->xft->lockMutex(mx);
+        clock_gettime(CLOCK_REALTIME, &ts);
+        CHECK(tb->xft->timedCondWait(cv, mx, &ts) != 0, "timedCondWait times out");
+        tb->xft->unlockMutex(mx);
+        CHECK(tb->xft->signalCondition(cv) == 0, "signalCondition");
+        tb->xft->destroyCondition(cv);
+        tb->xft->destroyMutex(mx);
+        CHECK(tb->xft->createThreadKey(&key, NULL) == 0, "createThreadKey");
+        tb->xft->setThreadSpecific(key, &flag);
+        CHECK(tb->xft->getThreadSpecific(key) == &flag, "thread specific");
+        tb->xft->destroyThreadKey(key);
+        tb->xft->threadOnce(&once, onceInit);
+        tb->xft->threadOnce(&once, onceInit);
+        CHECK(onceRuns == 1, "threadOnce");
+        CHECK(tb->xft->threadSleep(1) == 0, "threadSleep");
+    }
+
+    /* Up-calls are not offered; logging reaches the host. */
+    tb->bft->enumerateInstanceNames(tb, ctx, tb->eft->newObjectPath(tb, NS, "Tiny_Thing", NULL), &rc);
+    CHECK(rc.rc == CMPI_RC_ERR_NOT_SUPPORTED, "up-call not supported");
+    CHECK(tb->eft->logMessage(tb, 1, "tiny", "probe done", NULL).rc == CMPI_RC_OK, "logMessage");
+#undef CHECK
+    return failures;
+}
+
 /* ------------------------------------------------------------ method MI */
 
 static CMPIStatus methCleanup(CMPIMethodMI *mi, const CMPIContext *ctx, CMPIBoolean t) {
@@ -371,6 +545,11 @@ static CMPIStatus invokeMethod(CMPIMethodMI *mi, const CMPIContext *ctx, const C
     } else if (strcmp(method, "BadOut") == 0) {
         v.uint32 = 1;
         out->ft->addArg(out, "Reply", &v, CMPI_uint32);
+        rslt->ft->returnData(rslt, &v, CMPI_uint32);
+    } else if (strcmp(method, "Probe") == 0) {
+        char log[256] = "";
+        v.uint32 = probe(ctx, log, sizeof log);
+        out->ft->addArg(out, "Log", (const CMPIValue *)log, CMPI_chars);
         rslt->ft->returnData(rslt, &v, CMPI_uint32);
     } else if (strcmp(method, "Fail") == 0) {
         return err(CMPI_RC_ERR_FAILED, "Fail was asked to fail");
