@@ -89,10 +89,31 @@ CMPIData store(const CMPIValue* value, CMPIType type)
     d.type = type;
     d.state = CMPI_goodValue;
     d.value.uint64 = 0;
-    if (value == nullptr)
+    if (value == nullptr) {
         d.state = CMPI_nullValue;
-    else
-        d.value = *value;
+        return d;
+    }
+    // Read only the member of the type: the caller's object may be as
+    // small as that member (a CMPIUint16 passed by address).
+    if (type & CMPI_ARRAY) {
+        d.value.array = value->array;
+        return d;
+    }
+    switch (type) {
+    case CMPI_boolean: d.value.boolean = value->boolean; break;
+    case CMPI_char16: d.value.char16 = value->char16; break;
+    case CMPI_real32: d.value.real32 = value->real32; break;
+    case CMPI_real64: d.value.real64 = value->real64; break;
+    case CMPI_uint8: d.value.uint8 = value->uint8; break;
+    case CMPI_sint8: d.value.sint8 = value->sint8; break;
+    case CMPI_uint16: d.value.uint16 = value->uint16; break;
+    case CMPI_sint16: d.value.sint16 = value->sint16; break;
+    case CMPI_uint32: d.value.uint32 = value->uint32; break;
+    case CMPI_sint32: d.value.sint32 = value->sint32; break;
+    case CMPI_uint64: d.value.uint64 = value->uint64; break;
+    case CMPI_sint64: d.value.sint64 = value->sint64; break;
+    default: d.value.inst = value->inst; break;  // every handle type
+    }
     return d;
 }
 
