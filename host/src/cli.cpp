@@ -377,6 +377,7 @@ int doListen(Session& s, const std::vector<std::string>& words, const OpOptions&
         if (s.json) {
             Json j;
             j["namespace"] = ind.nameSpace;
+            j["deliveredTo"] = ind.deliveredTo;
             j["indication"] = instanceJson(ind.instance);
             *s.out << j.dump() << "\n";
         } else {
@@ -631,6 +632,7 @@ bool splitWords(const std::string& line, std::vector<std::string>& words, std::s
 }
 
 int runCli(const std::vector<std::string>& args, std::ostream& out, std::ostream& err) {
+    std::mutex errLock;   // log lines come from provider threads too; outlives the host
     Session s;
     s.out = &out;
     s.err = &err;
@@ -682,7 +684,6 @@ int runCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
     s.host.setStrict(s.strict);
     s.host.setFlavour(s.flavour);
     if (!s.defaultNs.empty()) s.host.setDefaultNamespace(s.defaultNs);
-    std::mutex errLock;   // log lines come from provider threads too
     if (s.verbose)
         s.host.setLogSink([&err, &errLock](const std::string& line) {
             std::lock_guard<std::mutex> g(errLock);

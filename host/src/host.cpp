@@ -238,6 +238,7 @@ void Host::Impl::deliver(const std::string& ns, Instance inst) {
         flavour == Flavour::Pegasus && !inst.path.nameSpace.empty() ? inst.path.nameSpace : ns;
     Indication ind;
     ind.nameSpace = target;
+    ind.deliveredTo = ns;
     ind.instance = std::move(inst);
     ind.instance.path = instancePath(this, ind.instance);
     if (strict) ind.error = checkInstance(repo, ind.instance);

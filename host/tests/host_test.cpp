@@ -324,6 +324,7 @@ TEST_F(HostTest, PegasusDeliversFromTheProviderThreadByThePathsNamespace) {
         Indication ind;
         ASSERT_TRUE(h.waitIndication(ind, 5s)) << seq;
         EXPECT_EQ(ind.nameSpace, "root/tiny");
+        EXPECT_EQ(ind.deliveredTo, "root/tiny");
         EXPECT_EQ(ind.instance.className(), "Tiny_Event");
         EXPECT_EQ(*ind.instance.property("Seq"), Value::fromUnsigned(Type::UInt32, seq));
         EXPECT_TRUE(ind.error.empty()) << ind.error;

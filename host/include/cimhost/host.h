@@ -71,9 +71,12 @@ struct AssocParams {
     std::string resultRole;    // associators, associatorNames
 };
 
-// One delivered indication. `error` is set when strict checking failed.
+// One delivered indication. `nameSpace` is the namespace the flavour matched
+// filters with; `deliveredTo` the namespace argument of deliverIndication.
+// `error` is set when strict checking failed.
 struct Indication {
     std::string nameSpace;
+    std::string deliveredTo;
     Instance instance;
     std::string error;
 };
