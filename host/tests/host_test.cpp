@@ -243,6 +243,14 @@ TEST(HostLoad, RefusesWhatAServerWouldRefuse) {
     EXPECT_EQ(statusLine(r), "CMPI_RC_ERR_FAILED: no provider is loaded");
 }
 
+TEST(HostLoad, ProviderCannotReachHostFunctionsOutsideTheBroker) {
+    Host h;
+    EXPECT_EQ(rcName(0), std::string("CMPI_RC_OK"));   // the function is linked here...
+    const Status s = h.load(TINY_LEAKY_PROVIDER, "Tiny");   // ...but not exported
+    EXPECT_EQ(s.rc, 1);
+    EXPECT_NE(s.message.find("undefined symbol: _ZN7cimhost6rcNameEi"), std::string::npos) << s.message;
+}
+
 TEST(HostLoad, MissingFactoryIsNotSupported) {
     Host h;
     ASSERT_TRUE(h.load(TINY_NOASSOC_PROVIDER, "Tiny").ok());

@@ -6,7 +6,8 @@
  * Built three times: libTiny_Provider.so; with TINY_GENERIC defined
  * libTinyGeneric_Provider.so, which also exports _Generic_Create_InstanceMI;
  * with TINY_NO_ASSOC defined libTinyNoAssoc_Provider.so, which lacks the
- * association factory.
+ * association factory; with TINY_USES_HOST_SYMBOL libTinyLeaky_Provider.so,
+ * which calls a function of the host directly.
  */
 #include <cmpift.h>
 #include <pthread.h>
@@ -679,9 +680,18 @@ static CMPIIndicationMIFT indFT = {200, 200, "indicationTiny", indCleanup, autho
 
 /* ------------------------------------------------------------ factories */
 
+#ifdef TINY_USES_HOST_SYMBOL
+/* cimhost::rcName(int): a server function reached other than through the
+ * broker. The host exports nothing, so this library must fail to load. */
+extern const char *_ZN7cimhost6rcNameEi(int);
+#endif
+
 static void start(const CMPIBroker *b) {
     if (!tb) ++generation;
     tb = b;
+#ifdef TINY_USES_HOST_SYMBOL
+    (void)_ZN7cimhost6rcNameEi(0);
+#endif
 }
 
 CMPIInstanceMI *Tiny_Create_InstanceMI(const CMPIBroker *b, const CMPIContext *ctx, CMPIStatus *rc) {
