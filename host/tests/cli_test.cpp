@@ -185,14 +185,14 @@ TEST(CliErrors, OneLineAndAnExitCodeNeverACrash) {
 }
 
 TEST(CliListen, PrintsTheIndicationsThatArriveInTime) {
-    CliRun r = cli({"listen", "root/tiny:Tiny_Event", "0.5"});
+    CliRun r = cli({"listen", "root/tiny:Tiny_Event", "2"});
     ASSERT_EQ(r.code, 0) << r.err;
     EXPECT_NE(r.out.find("// indication for root/tiny\ninstance of Tiny_Event {\n    Message = \"tick\";\n    Seq = 1;\n"),
               std::string::npos)
         << r.out;
     EXPECT_NE(r.out.find("Seq = 3;"), std::string::npos);
     EXPECT_EQ(r.out.find("Seq = 99;"), std::string::npos);
-    r = cli({"-f", "sfcb", "--json", "listen", "root/tiny:Tiny_Event", "0.5"});
+    r = cli({"-f", "sfcb", "--json", "listen", "root/tiny:Tiny_Event", "1.5"});
     ASSERT_EQ(r.code, 0) << r.err;
     std::istringstream lines(r.out);
     std::string line;
@@ -200,6 +200,7 @@ TEST(CliListen, PrintsTheIndicationsThatArriveInTime) {
     while (std::getline(lines, line)) {
         const auto j = nlohmann::json::parse(line);
         EXPECT_EQ(j["indication"]["className"], "Tiny_Event");
+        EXPECT_EQ(j["deliveredTo"], "root/tiny");
         ++count;
     }
     EXPECT_EQ(count, 4);
