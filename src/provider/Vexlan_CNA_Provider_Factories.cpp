@@ -10,21 +10,10 @@
 
 #include "CmpiImpl.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
-#include "support/Vexlan_NIC_Properties.h"
 
 namespace {
 
 CmpiProviderBase baseVexlan_CNA_Provider;
-
-// The settings object is made once per load of the library and lives as long
-// as the library: it is released when the server unloads it.
-struct SettingsRelease {
-    ~SettingsRelease()
-    {
-        delete Vexlan_NIC_Properties::singleton;
-        Vexlan_NIC_Properties::singleton = nullptr;
-    }
-} settingsRelease;
 
 // Two first calls on two threads must not make two providers.
 std::mutex factoryMutex;
