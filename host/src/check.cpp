@@ -1,9 +1,10 @@
 // Strict checking of what a provider returns against the classes read from
 // MOF: unknown class or property, wrong CIM type, missing key.
-#include "internal.h"
+#include <algorithm>
+
+#include "cimhost/check.h"
 
 namespace cimhost {
-namespace detail {
 
 namespace {
 
@@ -44,22 +45,25 @@ std::string checkPath(const ClassRepository& repo, const ObjectPath& p) {
     const std::string& cls = p.className;
     if (!repo.find(cls)) return "class " + cls + " is not declared in the MOF";
     const bool complete = repo.chainComplete(cls);
+    const std::vector<std::string> keys = repo.keyNames(cls);
     for (const auto& k : p.keys) {
         const PropertyDecl* decl = repo.findProperty(cls, k.first);
         if (!decl) {
             if (complete) return "object path of " + cls + " has key " + k.first + ", which the class does not declare";
             continue;
         }
-        if (!decl->key) return "object path of " + cls + " has key " + k.first + ", which is not a Key property";
+        const bool isKey = std::any_of(keys.begin(), keys.end(), [&](const std::string& n) { return namesEqual(n, k.first); });
+        // A superclass outside the MOF may declare it Key.
+        if (!isKey && complete)
+            return "object path of " + cls + " has key " + k.first + ", which is not a Key property";
         std::string err = checkValueType("key " + cls + "." + k.first, decl->type, decl->array, false, k.second);
         if (!err.empty()) return err;
     }
-    for (const auto& k : repo.keyNames(cls)) {
+    for (const auto& k : keys) {
         const Value* v = p.key(k);
         if (!v || v->null) return "object path of " + cls + " lacks its key " + k;
     }
     return std::string();
 }
 
-}  // namespace detail
 }  // namespace cimhost

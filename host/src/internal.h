@@ -14,6 +14,7 @@
 #include <unordered_map>
 #include <unordered_set>
 
+#include "cimhost/check.h"
 #include "cimhost/host.h"
 
 namespace cimhost {
@@ -160,10 +161,6 @@ ObjectPath instancePath(const Host::Impl* core, const Instance& inst);
 // The class after FROM in "SELECT ... FROM Class ..."; false if none.
 bool queryClass(const std::string& query, std::string& cls);
 
-// Strict checks against the class repository; empty when fine.
-std::string checkInstance(const ClassRepository& repo, const Instance& inst);
-std::string checkPath(const ClassRepository& repo, const ObjectPath& p);
-std::string checkValueType(const std::string& what, Type declared, bool declArray, bool embedded, const Value& v);
 
 }  // namespace detail
 
