@@ -209,7 +209,9 @@ CmpiStatus Vexlan_CNA_Provider::initialize(const CmpiContext& ctx)
         sleep(2);
         return CmpiStatus(CMPI_RC_OK);
     }
-    threadArgs.context = prepareThreadContext(ctx);
+    // The running thread keeps the context it attached with until it ends.
+    if (!pollingEnabled)
+        threadArgs.context = prepareThreadContext(ctx);
     startPollingLoop(ctx);
     // Gives the new thread time to take provider_lock, so that a request that
     // follows waits for the first build instead of seeing empty lists.
