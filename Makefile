@@ -37,7 +37,11 @@ test-tsan: deps
 	cmake --build $(TSAN_BUILD) -j $(JOBS)
 	cd $(TSAN_BUILD) && ctest --output-on-failure -L threaded -j $(JOBS)
 
+# The installed provider's run path names the prefix's library directory, so
+# the build tree learns the prefix before installing.
 install: build
+	cmake -DCMAKE_INSTALL_PREFIX=$(PREFIX) $(BUILD) > /dev/null
+	cmake --build $(BUILD) -j $(JOBS)
 	cmake --install $(BUILD) --prefix $(PREFIX)
 
 clean:
