@@ -7,6 +7,7 @@
 
 #include <gtest/gtest.h>
 
+#include "CmpiProviderBase.h"
 #include "classes/Vexlan_Adapter_PhysicalConnector_CMPI.h"
 #include "classes/Vexlan_Adapter_PhysicalPackage_CMPI.h"
 #include "classes/Vexlan_Adapter_PhysicalPort_CMPI.h"
@@ -15,6 +16,7 @@
 #include "classes/Vexlan_FC_SCSIProtocolEndpointHBA_CMPI.h"
 #include "classes/Vexlan_FC_SCSIProtocolEndpointTarget_CMPI.h"
 #include "classes/Vexlan_FC_StorageExtent_CMPI.h"
+#include "fake_broker.h"
 #include "inventory/AdapterFunc.h"
 #include "inventory/AdapterFunc_VPD.h"
 #include "physical_test_support.h"
@@ -448,6 +450,49 @@ TEST_F(PhysicalBuild, OneModuleSharedByFcAndNicFunctionsIsOneConnector)
     EXPECT_EQ(0, getZORAPStructs(m_CNAList, &stranger, &adapter, nullptr, nullptr));
     EXPECT_EQ(nullptr, adapter);
     EXPECT_EQ(0, getZORAPStructs(m_CNAList, nullptr, &adapter, nullptr, nullptr));
+}
+
+TEST_F(PhysicalBuild, NicOperationsMakeThePortsSlotOrANullHandle)
+{
+    fake::reset();
+    CmpiProviderBase::setBroker(fake::broker());
+    json cna = adapterWithPorts(
+        "CNA", "RSX-AB0",
+        json::array({port(0, json::array({nicFunction(1, "eth1")}), transceiver("SFPN")),
+                     port(1, json::array({nicFunction(2, "eth2")}))}));
+    cna["kind"] = "cna";
+    use(host(json::array({cna})));
+    buildPhysicalPackageList();
+    buildPhysicalConnectorList();
+    buildPhysicalPortList();
+    ASSERT_NE(nullptr, m_CNAList);
+    _CNAPortStruc* p0 = m_CNAList->portList;
+    ASSERT_NE(nullptr, p0);
+    _CNAPortStruc* p1 = p0->next;
+    ASSERT_NE(nullptr, p1);
+    const char* ns = "root/vexlan_cmpi";
+
+    CmpiObjectPath portPath = makePath_Nic_PhysicalPort("Vexlan_Adapter_PhysicalPort", ns, m_CNAList, p1);
+    ASSERT_FALSE(portPath.isNull());
+    EXPECT_STREQ("CNA_1", static_cast<const char*>(portPath.getKey("Tag")));
+    EXPECT_STREQ("Vexlan_Adapter_PhysicalPort", static_cast<const char*>(portPath.getKey("CreationClassName")));
+
+    CmpiInstance connector =
+        makeInstance_Nic_PhysicalConnector("Vexlan_Adapter_PhysicalConnector", ns, nullptr, m_CNAList, p0);
+    ASSERT_FALSE(connector.isNull());
+    EXPECT_STREQ("SFPN_CNA_0", static_cast<const char*>(connector.getProperty("Tag")));
+    EXPECT_EQ(1, static_cast<unsigned short>(connector.getProperty("SFPStatus")));
+
+    CmpiInstance package = makeInstance_Nic_PhysicalPackage("Vexlan_Adapter_PhysicalPackage", ns, nullptr, m_CNAList);
+    ASSERT_FALSE(package.isNull());
+    EXPECT_STREQ("CNA", static_cast<const char*>(package.getProperty("SerialNumber")));
+    EXPECT_STREQ("Vexlan CNA Adapter CNA", static_cast<const char*>(package.getProperty("Name")));
+
+    // No slot for the port without a module, nor for no adapter: nothing is built.
+    EXPECT_TRUE(makePath_Nic_PhysicalConnector("Vexlan_Adapter_PhysicalConnector", ns, m_CNAList, p1).isNull());
+    EXPECT_TRUE(makeInstance_Nic_PhysicalPort("Vexlan_Adapter_PhysicalPort", ns, nullptr, m_CNAList, nullptr).isNull());
+    EXPECT_TRUE(makePath_Nic_PhysicalPackage("Vexlan_Adapter_PhysicalPackage", ns, nullptr).isNull());
+    fake::reset();
 }
 
 TEST_F(PhysicalBuild, RepeatedPortTagsAreDroppedAndCountOnlyFilledSlots)
