@@ -13,6 +13,8 @@
 #include <cstdlib>
 #include <cstring>
 #include <ctime>
+#include <memory>
+#include <type_traits>
 
 #include "cimhost/text.h"
 #include "internal.h"
@@ -54,7 +56,6 @@ void setFt(EncArray* o) { o->enc.ft = &tables().arrayFT; }
 void setFt(EncInstance* o) { o->enc.ft = &tables().instanceFT; }
 void setFt(EncArgs* o) { o->enc.ft = &tables().argsFT; }
 void setFt(EncContext* o) { o->enc.ft = &tables().contextFT; }
-void setFt(EncEnum* o) { o->enc.ft = &tables().enumFT; }
 void setFt(EncResult* o) { o->enc.ft = &tables().resultFT; }
 void setFt(EncSelectExp* o) { o->enc.ft = &tables().selectFT; }
 
@@ -194,6 +195,56 @@ CMPIrc scalarToValue(const CMPIValue& v, CMPIType t, Value& out) {
 // CMPIString** out-parameter helpers.
 void putName(Host::Impl* core, CMPIString** name, const std::string& s) {
     if (name) *name = &newString(core, s)->enc;
+}
+
+// What a function returns to the provider when it fails.
+template <class R>
+R failValue() {
+    if constexpr (std::is_same_v<R, CMPIData>) return nullData();
+    else return R{};
+}
+
+// The frame of the broker functions that report through a CMPIStatus*:
+// handles that are not ours give CMPI_RC_ERR_INVALID_HANDLE, an exception
+// gives CMPI_RC_ERR_FAILED, each with the failure value; otherwise rc is
+// CMPI_RC_OK unless the body sets another code.
+template <class R, class F>
+R guarded(CMPIStatus* rc, bool handlesOk, F&& body) {
+    try {
+        if (!handlesOk) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), failValue<R>();
+        setRc(rc, CMPI_RC_OK);
+        return body();
+    } catch (...) {
+        setRc(rc, CMPI_RC_ERR_FAILED);
+        return failValue<R>();
+    }
+}
+
+// The same frame for the functions that return a status: the body returns
+// the code.
+template <class F>
+CMPIStatus guardedStatus(bool handlesOk, F&& body) {
+    try {
+        if (!handlesOk) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        return mkStatus(body());
+    } catch (...) {
+        return mkStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
+// A clone copies the whole object and lives until the provider is
+// unloaded, not with the request.
+template <class Enc>
+auto cloneOf(const Enc* e, CMPIStatus* rc) {
+    using C = decltype(e->enc);
+    return guarded<C*>(rc, e != nullptr, [&] {
+        auto o = std::make_unique<Enc>(*e);
+        o->arena = nullptr;
+        o->enc.hdl = o.get();
+        std::lock_guard<std::mutex> g(e->core->arenaLock);
+        e->core->lifeArena->adopt(o.get());
+        return &o.release()->enc;
+    });
 }
 
 }  // namespace
@@ -401,26 +452,11 @@ CMPIStatus strRelease(CMPIString* s) {
     return mkStatus(CMPI_RC_OK);
 }
 
-CMPIString* strClone(const CMPIString* s, CMPIStatus* rc) {
-    try {
-        EncString* e = asString(s);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        auto* o = makeLife<EncString>(e->core);
-        o->s = e->s;
-        o->null = e->null;
-        setRc(rc, CMPI_RC_OK);
-        return &o->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
-}
+CMPIString* strClone(const CMPIString* s, CMPIStatus* rc) { return cloneOf(asString(s), rc); }
 
 const char* strChars(const CMPIString* s, CMPIStatus* rc) {
     EncString* e = asString(s);
-    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-    setRc(rc, CMPI_RC_OK);
-    return e->null ? nullptr : e->s.c_str();
+    return guarded<const char*>(rc, e, [&] { return e->null ? nullptr : e->s.c_str(); });
 }
 
 // ---------------------------------------------------------------- CMPIDateTime
@@ -430,44 +466,21 @@ CMPIStatus dtRelease(CMPIDateTime* d) {
     return mkStatus(CMPI_RC_OK);
 }
 
-CMPIDateTime* dtClone(const CMPIDateTime* d, CMPIStatus* rc) {
-    try {
-        EncDateTime* e = asDateTime(d);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        auto* o = makeLife<EncDateTime>(e->core);
-        o->dt = e->dt;
-        setRc(rc, CMPI_RC_OK);
-        return &o->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
-}
+CMPIDateTime* dtClone(const CMPIDateTime* d, CMPIStatus* rc) { return cloneOf(asDateTime(d), rc); }
 
 CMPIUint64 dtBinary(const CMPIDateTime* d, CMPIStatus* rc) {
     EncDateTime* e = asDateTime(d);
-    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
-    setRc(rc, CMPI_RC_OK);
-    return e->dt.usec;
+    return guarded<CMPIUint64>(rc, e, [&] { return e->dt.usec; });
 }
 
 CMPIString* dtText(const CMPIDateTime* d, CMPIStatus* rc) {
-    try {
-        EncDateTime* e = asDateTime(d);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        setRc(rc, CMPI_RC_OK);
-        return &newString(e->core, e->dt.toText())->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    EncDateTime* e = asDateTime(d);
+    return guarded<CMPIString*>(rc, e, [&] { return &newString(e->core, e->dt.toText())->enc; });
 }
 
 CMPIBoolean dtIsInterval(const CMPIDateTime* d, CMPIStatus* rc) {
     EncDateTime* e = asDateTime(d);
-    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
-    setRc(rc, CMPI_RC_OK);
-    return e->dt.interval ? 1 : 0;
+    return guarded<CMPIBoolean>(rc, e, [&] { return CMPIBoolean(e->dt.interval ? 1 : 0); });
 }
 
 // ---------------------------------------------------------------- CMPIObjectPath
@@ -477,122 +490,82 @@ CMPIStatus opRelease(CMPIObjectPath* op) {
     return mkStatus(CMPI_RC_OK);
 }
 
-CMPIObjectPath* opClone(const CMPIObjectPath* op, CMPIStatus* rc) {
-    try {
-        EncPath* e = asPath(op);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        auto* o = makeLife<EncPath>(e->core);
-        o->p = e->p;
-        setRc(rc, CMPI_RC_OK);
-        return &o->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
-}
+CMPIObjectPath* opClone(const CMPIObjectPath* op, CMPIStatus* rc) { return cloneOf(asPath(op), rc); }
 
 template <std::string ObjectPath::*Field>
 CMPIStatus opSetText(CMPIObjectPath* op, const char* text) {
-    try {
-        EncPath* e = asPath(op);
-        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    EncPath* e = asPath(op);
+    return guardedStatus(e, [&] {
         e->p.*Field = text ? text : "";
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 template <std::string ObjectPath::*Field>
 CMPIString* opGetText(const CMPIObjectPath* op, CMPIStatus* rc) {
-    try {
-        EncPath* e = asPath(op);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        setRc(rc, CMPI_RC_OK);
-        return &newString(e->core, e->p.*Field)->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    EncPath* e = asPath(op);
+    return guarded<CMPIString*>(rc, e, [&] { return &newString(e->core, e->p.*Field)->enc; });
 }
 
 CMPIStatus opAddKey(CMPIObjectPath* op, const char* name, const CMPIValue* value, CMPIType type) {
-    try {
-        EncPath* e = asPath(op);
-        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
-        if (!name || !*name) return mkStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+    EncPath* e = asPath(op);
+    return guardedStatus(e, [&] {
+        if (!name || !*name) return CMPI_RC_ERR_INVALID_PARAMETER;
         Value v;
         const CMPIrc r = toValue(value, type, v);
-        if (r != CMPI_RC_OK) return mkStatus(r);
+        if (r != CMPI_RC_OK) return r;
         e->p.setKey(name, std::move(v));
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
+}
+
+// A key's data carries CMPI_keyValue in its state.
+CMPIData keyData(Host::Impl* core, const Value& v) {
+    CMPIData d = toData(core, v);
+    d.state = static_cast<CMPIValueState>(d.state | CMPI_keyValue);
+    return d;
 }
 
 CMPIData opGetKey(const CMPIObjectPath* op, const char* name, CMPIStatus* rc) {
-    try {
-        EncPath* e = asPath(op);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+    EncPath* e = asPath(op);
+    return guarded<CMPIData>(rc, e, [&] {
         const Value* v = name ? e->p.key(name) : nullptr;
         if (!v) return setRc(rc, CMPI_RC_ERR_NOT_FOUND), nullData(CMPI_notFound);
-        CMPIData d = toData(e->core, *v);
-        d.state = static_cast<CMPIValueState>(d.state | CMPI_keyValue);
-        setRc(rc, CMPI_RC_OK);
-        return d;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullData();
-    }
+        return keyData(e->core, *v);
+    });
 }
 
 CMPIData opGetKeyAt(const CMPIObjectPath* op, CMPICount index, CMPIString** name, CMPIStatus* rc) {
-    try {
-        EncPath* e = asPath(op);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+    EncPath* e = asPath(op);
+    return guarded<CMPIData>(rc, e, [&] {
         if (index >= e->p.keys.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
         putName(e->core, name, e->p.keys[index].first);
-        CMPIData d = toData(e->core, e->p.keys[index].second);
-        d.state = static_cast<CMPIValueState>(d.state | CMPI_keyValue);
-        setRc(rc, CMPI_RC_OK);
-        return d;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullData();
-    }
+        return keyData(e->core, e->p.keys[index].second);
+    });
 }
 
 CMPICount opKeyCount(const CMPIObjectPath* op, CMPIStatus* rc) {
     EncPath* e = asPath(op);
-    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
-    setRc(rc, CMPI_RC_OK);
-    return static_cast<CMPICount>(e->p.keys.size());
+    return guarded<CMPICount>(rc, e, [&] { return static_cast<CMPICount>(e->p.keys.size()); });
 }
 
 CMPIStatus opSetNsFrom(CMPIObjectPath* op, const CMPIObjectPath* src) {
-    try {
-        EncPath* e = asPath(op);
-        EncPath* s = asPath(src);
-        if (!e || !s) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    EncPath* e = asPath(op);
+    EncPath* s = asPath(src);
+    return guardedStatus(e && s, [&] {
         e->p.nameSpace = s->p.nameSpace;
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 CMPIStatus opSetHostNsFrom(CMPIObjectPath* op, const CMPIObjectPath* src) {
-    try {
-        EncPath* e = asPath(op);
-        EncPath* s = asPath(src);
-        if (!e || !s) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    EncPath* e = asPath(op);
+    EncPath* s = asPath(src);
+    return guardedStatus(e && s, [&] {
         e->p.nameSpace = s->p.nameSpace;
         e->p.host = s->p.host;
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 CMPIData opClassQual(const CMPIObjectPath*, const char*, CMPIStatus* rc) {
@@ -613,15 +586,8 @@ CMPIData opParamQual(const CMPIObjectPath*, const char*, const char*, const char
 }
 
 CMPIString* opToString(const CMPIObjectPath* op, CMPIStatus* rc) {
-    try {
-        EncPath* e = asPath(op);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        setRc(rc, CMPI_RC_OK);
-        return &newString(e->core, formatPath(e->p))->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    EncPath* e = asPath(op);
+    return guarded<CMPIString*>(rc, e, [&] { return &newString(e->core, formatPath(e->p))->enc; });
 }
 
 // ---------------------------------------------------------------- CMPIArray
@@ -631,66 +597,41 @@ CMPIStatus arRelease(CMPIArray* a) {
     return mkStatus(CMPI_RC_OK);
 }
 
-CMPIArray* arClone(const CMPIArray* a, CMPIStatus* rc) {
-    try {
-        EncArray* e = asArray(a);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        auto* o = makeLife<EncArray>(e->core);
-        o->elemType = e->elemType;
-        o->elems = e->elems;
-        setRc(rc, CMPI_RC_OK);
-        return &o->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
-}
+CMPIArray* arClone(const CMPIArray* a, CMPIStatus* rc) { return cloneOf(asArray(a), rc); }
 
 CMPICount arSize(const CMPIArray* a, CMPIStatus* rc) {
     EncArray* e = asArray(a);
-    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
-    setRc(rc, CMPI_RC_OK);
-    return static_cast<CMPICount>(e->elems.size());
+    return guarded<CMPICount>(rc, e, [&] { return static_cast<CMPICount>(e->elems.size()); });
 }
 
 CMPIType arType(const CMPIArray* a, CMPIStatus* rc) {
     EncArray* e = asArray(a);
-    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), CMPI_null;
-    setRc(rc, CMPI_RC_OK);
-    return static_cast<CMPIType>(e->elemType);
+    return guarded<CMPIType>(rc, e, [&] { return static_cast<CMPIType>(e->elemType); });
 }
 
 CMPIData arGet(const CMPIArray* a, CMPICount index, CMPIStatus* rc) {
-    try {
-        EncArray* e = asArray(a);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+    EncArray* e = asArray(a);
+    return guarded<CMPIData>(rc, e, [&] {
         if (index >= e->elems.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_badValue);
-        setRc(rc, CMPI_RC_OK);
         CMPIData d = toData(e->core, e->elems[index]);
         d.type = static_cast<CMPIType>(e->elemType);
         return d;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullData();
-    }
+    });
 }
 
 CMPIStatus arSet(CMPIArray* a, CMPICount index, const CMPIValue* value, CMPIType type) {
-    try {
-        EncArray* e = asArray(a);
-        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
-        if (index >= e->elems.size()) return mkStatus(CMPI_RC_ERR_NO_SUCH_PROPERTY);
-        if (type & CMPI_ARRAY) return mkStatus(CMPI_RC_ERR_TYPE_MISMATCH);
+    EncArray* e = asArray(a);
+    return guardedStatus(e, [&] {
+        if (index >= e->elems.size()) return CMPI_RC_ERR_NO_SUCH_PROPERTY;
+        if (type & CMPI_ARRAY) return CMPI_RC_ERR_TYPE_MISMATCH;
         Value v;
         const CMPIrc r = toValue(value, type, v);
-        if (r != CMPI_RC_OK) return mkStatus(r);
-        if (type != CMPI_null && v.type != e->elemType) return mkStatus(CMPI_RC_ERR_TYPE_MISMATCH);
+        if (r != CMPI_RC_OK) return r;
+        if (type != CMPI_null && v.type != e->elemType) return CMPI_RC_ERR_TYPE_MISMATCH;
         v.type = e->elemType;
         e->elems[index] = std::move(v);
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 // ---------------------------------------------------------------- CMPIInstance
@@ -700,73 +641,43 @@ CMPIStatus inRelease(CMPIInstance* i) {
     return mkStatus(CMPI_RC_OK);
 }
 
-CMPIInstance* inClone(const CMPIInstance* i, CMPIStatus* rc) {
-    try {
-        EncInstance* e = asInstance(i);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        auto* o = makeLife<EncInstance>(e->core);
-        o->inst = e->inst;
-        o->filtered = e->filtered;
-        o->filter = e->filter;
-        o->filterKeys = e->filterKeys;
-        setRc(rc, CMPI_RC_OK);
-        return &o->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
-}
+CMPIInstance* inClone(const CMPIInstance* i, CMPIStatus* rc) { return cloneOf(asInstance(i), rc); }
 
 CMPIData inGet(const CMPIInstance* i, const char* name, CMPIStatus* rc) {
-    try {
-        EncInstance* e = asInstance(i);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+    EncInstance* e = asInstance(i);
+    return guarded<CMPIData>(rc, e, [&] {
         const Value* v = name ? e->inst.property(name) : nullptr;
         if (!v) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
-        setRc(rc, CMPI_RC_OK);
         return toData(e->core, *v);
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullData();
-    }
+    });
 }
 
 CMPIData inGetAt(const CMPIInstance* i, CMPICount index, CMPIString** name, CMPIStatus* rc) {
-    try {
-        EncInstance* e = asInstance(i);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+    EncInstance* e = asInstance(i);
+    return guarded<CMPIData>(rc, e, [&] {
         if (index >= e->inst.properties.size())
             return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
         putName(e->core, name, e->inst.properties[index].first);
-        setRc(rc, CMPI_RC_OK);
         return toData(e->core, e->inst.properties[index].second);
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullData();
-    }
+    });
 }
 
 CMPICount inCount(const CMPIInstance* i, CMPIStatus* rc) {
     EncInstance* e = asInstance(i);
-    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
-    setRc(rc, CMPI_RC_OK);
-    return static_cast<CMPICount>(e->inst.properties.size());
+    return guarded<CMPICount>(rc, e, [&] { return static_cast<CMPICount>(e->inst.properties.size()); });
 }
 
 CMPIStatus inSet(const CMPIInstance* i, const char* name, const CMPIValue* value, CMPIType type) {
-    try {
-        EncInstance* e = asInstance(i);
-        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
-        if (!name || !*name) return mkStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+    EncInstance* e = asInstance(i);
+    return guardedStatus(e, [&] {
+        if (!name || !*name) return CMPI_RC_ERR_INVALID_PARAMETER;
         Value v;
         const CMPIrc r = toValue(value, type, v);
-        if (r != CMPI_RC_OK) return mkStatus(r);
-        if (!e->wanted(name)) return mkStatus(CMPI_RC_OK);   // filtered out
+        if (r != CMPI_RC_OK) return r;
+        if (!e->wanted(name)) return CMPI_RC_OK;   // filtered out
         e->inst.setProperty(name, std::move(v));
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 CMPIStatus inSetWithOrigin(const CMPIInstance* i, const char* name, const CMPIValue* value, CMPIType type,
@@ -775,15 +686,8 @@ CMPIStatus inSetWithOrigin(const CMPIInstance* i, const char* name, const CMPIVa
 }
 
 CMPIObjectPath* inPath(const CMPIInstance* i, CMPIStatus* rc) {
-    try {
-        EncInstance* e = asInstance(i);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        setRc(rc, CMPI_RC_OK);
-        return &newPath(e->core, instancePath(e->core, e->inst))->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    EncInstance* e = asInstance(i);
+    return guarded<CMPIObjectPath*>(rc, e, [&] { return &newPath(e->core, instancePath(e->core, e->inst))->enc; });
 }
 
 std::vector<std::string> nameList(const char** list) {
@@ -793,14 +697,13 @@ std::vector<std::string> nameList(const char** list) {
 }
 
 CMPIStatus inSetFilter(CMPIInstance* i, const char** props, const char** keys) {
-    try {
-        EncInstance* e = asInstance(i);
-        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    EncInstance* e = asInstance(i);
+    return guardedStatus(e, [&] {
         if (!props) {
             e->filtered = false;
             e->filter.clear();
             e->filterKeys.clear();
-            return mkStatus(CMPI_RC_OK);
+            return CMPI_RC_OK;
         }
         e->filtered = true;
         e->filter = nameList(props);
@@ -808,22 +711,17 @@ CMPIStatus inSetFilter(CMPIInstance* i, const char** props, const char** keys) {
         auto& ps = e->inst.properties;
         ps.erase(std::remove_if(ps.begin(), ps.end(), [&](const NamedValue& p) { return !e->wanted(p.first); }),
                  ps.end());
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 CMPIStatus inSetPath(CMPIInstance* i, const CMPIObjectPath* op) {
-    try {
-        EncInstance* e = asInstance(i);
-        EncPath* p = asPath(op);
-        if (!e || !p) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    EncInstance* e = asInstance(i);
+    EncPath* p = asPath(op);
+    return guardedStatus(e && p, [&] {
         e->inst.path = p->p;
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 // ---------------------------------------------------------------- CMPIArgs and CMPIContext
@@ -853,83 +751,56 @@ CMPIStatus nlRelease(C* c) {
 
 template <class Enc, class C>
 C* nlClone(const C* c, CMPIStatus* rc) {
-    try {
-        Enc* e = asNamed<Enc, C>(c);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        auto* o = makeLife<Enc>(e->core);
-        *NamedList<Enc, C>::list(o) = *NamedList<Enc, C>::list(e);
-        setRc(rc, CMPI_RC_OK);
-        return &o->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    return cloneOf(asNamed<Enc, C>(c), rc);
 }
 
 template <class Enc, class C>
 CMPIStatus nlAdd(const C* c, const char* name, const CMPIValue* value, CMPIType type) {
-    try {
-        Enc* e = asNamed<Enc, C>(c);
-        if (!e) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
-        if (!name || !*name) return mkStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+    Enc* e = asNamed<Enc, C>(c);
+    return guardedStatus(e, [&] {
+        if (!name || !*name) return CMPI_RC_ERR_INVALID_PARAMETER;
         Value v;
         const CMPIrc r = toValue(value, type, v);
-        if (r != CMPI_RC_OK) return mkStatus(r);
+        if (r != CMPI_RC_OK) return r;
         auto& l = *NamedList<Enc, C>::list(e);
         for (auto& nv : l) {
             if (namesEqual(nv.first, name)) {
                 nv.second = std::move(v);
-                return mkStatus(CMPI_RC_OK);
+                return CMPI_RC_OK;
             }
         }
         l.emplace_back(name, std::move(v));
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 template <class Enc, class C>
 CMPIData nlGet(const C* c, const char* name, CMPIStatus* rc) {
-    try {
-        Enc* e = asNamed<Enc, C>(c);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+    Enc* e = asNamed<Enc, C>(c);
+    return guarded<CMPIData>(rc, e, [&] {
         for (const auto& nv : *NamedList<Enc, C>::list(e)) {
-            if (name && namesEqual(nv.first, name)) {
-                setRc(rc, CMPI_RC_OK);
-                return toData(e->core, nv.second);
-            }
+            if (name && namesEqual(nv.first, name)) return toData(e->core, nv.second);
         }
         setRc(rc, CMPI_RC_ERR_NOT_FOUND);
         return nullData(CMPI_notFound);
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullData();
-    }
+    });
 }
 
 template <class Enc, class C>
 CMPIData nlGetAt(const C* c, CMPICount index, CMPIString** name, CMPIStatus* rc) {
-    try {
-        Enc* e = asNamed<Enc, C>(c);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+    Enc* e = asNamed<Enc, C>(c);
+    return guarded<CMPIData>(rc, e, [&] {
         const auto& l = *NamedList<Enc, C>::list(e);
         if (index >= l.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
         putName(e->core, name, l[index].first);
-        setRc(rc, CMPI_RC_OK);
         return toData(e->core, l[index].second);
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullData();
-    }
+    });
 }
 
 template <class Enc, class C>
 CMPICount nlCount(const C* c, CMPIStatus* rc) {
     Enc* e = asNamed<Enc, C>(c);
-    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
-    setRc(rc, CMPI_RC_OK);
-    return static_cast<CMPICount>(NamedList<Enc, C>::list(e)->size());
+    return guarded<CMPICount>(rc, e, [&] { return static_cast<CMPICount>(NamedList<Enc, C>::list(e)->size()); });
 }
 
 // ---------------------------------------------------------------- CMPIEnumeration
@@ -939,52 +810,27 @@ CMPIStatus enRelease(CMPIEnumeration* en) {
     return mkStatus(CMPI_RC_OK);
 }
 
-CMPIEnumeration* enClone(const CMPIEnumeration* en, CMPIStatus* rc) {
-    try {
-        EncEnum* e = asEnum(en);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        auto* o = makeLife<EncEnum>(e->core);
-        o->items = e->items;
-        o->next = e->next;
-        setRc(rc, CMPI_RC_OK);
-        return &o->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
-}
+CMPIEnumeration* enClone(const CMPIEnumeration* en, CMPIStatus* rc) { return cloneOf(asEnum(en), rc); }
 
 CMPIData enNext(const CMPIEnumeration* en, CMPIStatus* rc) {
-    try {
-        EncEnum* e = asEnum(en);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullData();
+    EncEnum* e = asEnum(en);
+    return guarded<CMPIData>(rc, e, [&] {
         if (e->next >= e->items.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
-        setRc(rc, CMPI_RC_OK);
         return toData(e->core, e->items[e->next++]);
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullData();
-    }
+    });
 }
 
 CMPIBoolean enHasNext(const CMPIEnumeration* en, CMPIStatus* rc) {
     EncEnum* e = asEnum(en);
-    if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
-    setRc(rc, CMPI_RC_OK);
-    return e->next < e->items.size() ? 1 : 0;
+    return guarded<CMPIBoolean>(rc, e, [&] { return CMPIBoolean(e->next < e->items.size() ? 1 : 0); });
 }
 
 CMPIArray* enToArray(const CMPIEnumeration* en, CMPIStatus* rc) {
-    try {
-        EncEnum* e = asEnum(en);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+    EncEnum* e = asEnum(en);
+    return guarded<CMPIArray*>(rc, e, [&] {
         const Type t = e->items.empty() ? Type::Null : e->items.front().type;
-        setRc(rc, CMPI_RC_OK);
         return &newArray(e->core, t, e->items)->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    });
 }
 
 // ---------------------------------------------------------------- CMPIResult
@@ -1003,86 +849,80 @@ void noteStrict(EncResult* e, const std::string& what) {
     if (e->core->strict) e->sink->strictErrors.push_back(what);
 }
 
+// Called with e->m held: the instance or path goes to the sink, and under
+// --strict what the strict checks find goes with it.
+void noteFinding(EncResult* e, std::string err) {
+    if (!err.empty()) e->sink->strictErrors.push_back(std::move(err));
+}
+
+void addInstance(EncResult* e, Instance inst) {
+    if (e->core->strict) noteFinding(e, checkInstance(e->core->repo, inst));
+    e->sink->instances.push_back(std::move(inst));
+}
+
+void addPath(EncResult* e, const ObjectPath& p) {
+    if (e->core->strict) noteFinding(e, checkPath(e->core->repo, p));
+    e->sink->paths.push_back(p);
+}
+
+bool resultOk(const EncResult* e) { return e && e->sink; }
+
 CMPIStatus rsData(const CMPIResult* r, const CMPIValue* value, CMPIType type) {
-    try {
-        EncResult* e = asResult(r);
-        if (!e || !e->sink) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    EncResult* e = asResult(r);
+    return guardedStatus(resultOk(e), [&] {
         Value v;
         const CMPIrc rc = toValue(value, type, v);
-        if (rc != CMPI_RC_OK) return mkStatus(rc);
+        if (rc != CMPI_RC_OK) return rc;
         std::lock_guard<std::mutex> g(e->m);
         if (e->kind == ResultKind::Instances && v.type == Type::Instance && !v.array && v.inst) {
             // returnData of an instance counts as returnInstance.
             Instance copy = *v.inst;
             copy.path = instancePath(e->core, copy);
-            if (e->core->strict) {
-                const std::string err = checkInstance(e->core->repo, copy);
-                if (!err.empty()) e->sink->strictErrors.push_back(err);
-            }
-            e->sink->instances.push_back(std::move(copy));
+            addInstance(e, std::move(copy));
         } else if (e->kind == ResultKind::Paths && v.type == Type::Reference && !v.array && v.ref) {
-            if (e->core->strict) {
-                const std::string err = checkPath(e->core->repo, *v.ref);
-                if (!err.empty()) e->sink->strictErrors.push_back(err);
-            }
-            e->sink->paths.push_back(*v.ref);
+            addPath(e, *v.ref);
         } else {
             if (e->kind != ResultKind::Method && e->kind != ResultKind::Data)
                 noteStrict(e, std::string("returnData of a ") + typeName(v.type) + " in an operation that returns " +
                                   (e->kind == ResultKind::Paths ? "object paths" : "instances"));
             e->sink->data.push_back(std::move(v));
         }
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 CMPIStatus rsInstance(const CMPIResult* r, const CMPIInstance* inst) {
-    try {
-        EncResult* e = asResult(r);
-        EncInstance* i = asInstance(inst);
-        if (!e || !e->sink || !i) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    EncResult* e = asResult(r);
+    EncInstance* i = asInstance(inst);
+    return guardedStatus(resultOk(e) && i, [&] {
         Instance copy = i->inst;
         copy.path = instancePath(e->core, i->inst);
         std::lock_guard<std::mutex> g(e->m);
         if (e->kind != ResultKind::Instances) noteStrict(e, "returnInstance in an operation that returns no instances");
-        if (e->core->strict) {
-            const std::string err = checkInstance(e->core->repo, copy);
-            if (!err.empty()) e->sink->strictErrors.push_back(err);
-        }
-        e->sink->instances.push_back(std::move(copy));
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        addInstance(e, std::move(copy));
+        return CMPI_RC_OK;
+    });
 }
 
 CMPIStatus rsPath(const CMPIResult* r, const CMPIObjectPath* op) {
-    try {
-        EncResult* e = asResult(r);
-        EncPath* p = asPath(op);
-        if (!e || !e->sink || !p) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    EncResult* e = asResult(r);
+    EncPath* p = asPath(op);
+    return guardedStatus(resultOk(e) && p, [&] {
         std::lock_guard<std::mutex> g(e->m);
         if (e->kind != ResultKind::Paths && e->kind != ResultKind::Data)
             noteStrict(e, "returnObjectPath in an operation that returns no object paths");
-        if (e->core->strict) {
-            const std::string err = checkPath(e->core->repo, p->p);
-            if (!err.empty()) e->sink->strictErrors.push_back(err);
-        }
-        e->sink->paths.push_back(p->p);
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        addPath(e, p->p);
+        return CMPI_RC_OK;
+    });
 }
 
 CMPIStatus rsDone(const CMPIResult* r) {
     EncResult* e = asResult(r);
-    if (!e || !e->sink) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
-    std::lock_guard<std::mutex> g(e->m);
-    e->sink->done = true;
-    return mkStatus(CMPI_RC_OK);
+    return guardedStatus(resultOk(e), [&] {
+        std::lock_guard<std::mutex> g(e->m);
+        e->sink->done = true;
+        return CMPI_RC_OK;
+    });
 }
 
 CMPIStatus rsError(const CMPIResult*, const CMPIError*) { return mkStatus(CMPI_RC_ERR_NOT_SUPPORTED); }
@@ -1094,41 +934,20 @@ CMPIStatus seRelease(CMPISelectExp* s) {
     return mkStatus(CMPI_RC_OK);
 }
 
-CMPISelectExp* seClone(const CMPISelectExp* s, CMPIStatus* rc) {
-    try {
-        EncSelectExp* e = asSelect(s);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        auto* o = makeLife<EncSelectExp>(e->core);
-        o->query = e->query;
-        o->lang = e->lang;
-        o->fromClass = e->fromClass;
-        setRc(rc, CMPI_RC_OK);
-        return &o->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
-}
+CMPISelectExp* seClone(const CMPISelectExp* s, CMPIStatus* rc) { return cloneOf(asSelect(s), rc); }
 
 // Matches by class only: the WHERE clause is not evaluated.
 CMPIBoolean seEvaluate(const CMPISelectExp* s, const CMPIInstance* inst, CMPIStatus* rc) {
     EncSelectExp* e = asSelect(s);
     EncInstance* i = asInstance(inst);
-    if (!e || !i) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
-    setRc(rc, CMPI_RC_OK);
-    return e->core->repo.isA(i->inst.className(), e->fromClass) ? 1 : 0;
+    return guarded<CMPIBoolean>(rc, e && i, [&] {
+        return CMPIBoolean(e->core->repo.isA(i->inst.className(), e->fromClass) ? 1 : 0);
+    });
 }
 
 CMPIString* seString(const CMPISelectExp* s, CMPIStatus* rc) {
-    try {
-        EncSelectExp* e = asSelect(s);
-        if (!e) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        setRc(rc, CMPI_RC_OK);
-        return &newString(e->core, e->query)->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    EncSelectExp* e = asSelect(s);
+    return guarded<CMPIString*>(rc, e, [&] { return &newString(e->core, e->query)->enc; });
 }
 
 CMPISelectCond* seCond(const CMPISelectExp*, CMPIStatus* rc) {
@@ -1144,33 +963,26 @@ CMPIBoolean seEvalAccessor(const CMPISelectExp*, CMPIAccessor*, void*, CMPIStatu
 // ---------------------------------------------------------------- CMPIBrokerFT
 
 CMPIContext* bPrepareAttach(const CMPIBroker* mb, const CMPIContext* ctx) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        EncContext* e = asContext(ctx);
-        if (!core) return nullptr;
+    Host::Impl* core = coreOf(mb);
+    EncContext* e = asContext(ctx);
+    return guarded<CMPIContext*>(nullptr, core, [&] {
         auto* o = makeLife<EncContext>(core);
         if (e) o->entries = e->entries;
         return &o->enc;
-    } catch (...) {
-        return nullptr;
-    }
+    });
 }
 
 CMPIStatus bAttach(const CMPIBroker* mb, const CMPIContext* ctx) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core || !asContext(ctx)) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    Host::Impl* core = coreOf(mb);
+    return guardedStatus(core && asContext(ctx), [&] {
         core->pushArena();
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 CMPIStatus bDetach(const CMPIBroker* mb, const CMPIContext* ctx) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core || !asContext(ctx)) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    Host::Impl* core = coreOf(mb);
+    return guardedStatus(core && asContext(ctx), [&] {
         // The newest arena of this host on this thread is the attached one.
         unsigned long long id = 0;
         {
@@ -1182,24 +994,19 @@ CMPIStatus bDetach(const CMPIBroker* mb, const CMPIContext* ctx) {
                 }
             }
         }
-        if (id == 0) return mkStatus(CMPI_RC_ERR_FAILED);
+        if (id == 0) return CMPI_RC_ERR_FAILED;
         core->popArena(id);
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 CMPIStatus bDeliver(const CMPIBroker* mb, const CMPIContext*, const char* ns, const CMPIInstance* ind) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        EncInstance* i = asInstance(ind);
-        if (!core || !i) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    Host::Impl* core = coreOf(mb);
+    EncInstance* i = asInstance(ind);
+    return guardedStatus(core && i, [&] {
         core->deliver(ns ? ns : "", i->inst);
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 // Up-calls to other providers: the host serves one provider only.
@@ -1271,147 +1078,98 @@ CMPIData bGetProp(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, 
 // ---------------------------------------------------------------- CMPIBrokerEncFT
 
 CMPIInstance* eNewInstance(const CMPIBroker* mb, const CMPIObjectPath* op, CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        EncPath* p = asPath(op);
-        if (!core || !p) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+    Host::Impl* core = coreOf(mb);
+    EncPath* p = asPath(op);
+    return guarded<CMPIInstance*>(rc, core && p, [&] {
         Instance inst;
         inst.path = p->p;
         // sfcb makes the keys of the path properties of the new instance.
         if (core->flavour == Flavour::Sfcb)
             for (const auto& k : p->p.keys) inst.setProperty(k.first, k.second);
-        setRc(rc, CMPI_RC_OK);
         return &newInstance(core, std::move(inst))->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    });
 }
 
 CMPIObjectPath* eNewPath(const CMPIBroker* mb, const char* ns, const char* cn, CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+    Host::Impl* core = coreOf(mb);
+    return guarded<CMPIObjectPath*>(rc, core, [&] {
         ObjectPath p;
         p.nameSpace = ns ? ns : "";
         p.className = cn ? cn : "";
-        setRc(rc, CMPI_RC_OK);
         return &newPath(core, std::move(p))->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    });
 }
 
 CMPIArgs* eNewArgs(const CMPIBroker* mb, CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        setRc(rc, CMPI_RC_OK);
-        return &newArgs(core, {})->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    Host::Impl* core = coreOf(mb);
+    return guarded<CMPIArgs*>(rc, core, [&] { return &newArgs(core, {})->enc; });
 }
 
 CMPIString* eNewString(const CMPIBroker* mb, const char* data, CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+    Host::Impl* core = coreOf(mb);
+    return guarded<CMPIString*>(rc, core, [&] {
         EncString* s = newString(core, data ? data : "");
         s->null = data == nullptr;
-        setRc(rc, CMPI_RC_OK);
         return &s->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    });
 }
 
 CMPIArray* eNewArray(const CMPIBroker* mb, CMPICount max, CMPIType type, CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+    Host::Impl* core = coreOf(mb);
+    return guarded<CMPIArray*>(rc, core, [&]() -> CMPIArray* {
         Type et;
         if (!scalarType(static_cast<CMPIType>(type & ~CMPI_ARRAY), et) || et == Type::Null)
             return setRc(rc, CMPI_RC_ERR_INVALID_DATA_TYPE), nullptr;
         if (max > (1u << 24)) return setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER), nullptr;
-        setRc(rc, CMPI_RC_OK);
         return &newArray(core, et, std::vector<Value>(max, Value::nullOf(et)))->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    });
 }
 
 CMPIDateTime* eNewDateTime(const CMPIBroker* mb, CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        setRc(rc, CMPI_RC_OK);
-        return &newDateTime(core, DateTime::now())->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    Host::Impl* core = coreOf(mb);
+    return guarded<CMPIDateTime*>(rc, core, [&] { return &newDateTime(core, DateTime::now())->enc; });
 }
 
 CMPIDateTime* eNewDateTimeBin(const CMPIBroker* mb, CMPIUint64 bin, CMPIBoolean interval, CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+    Host::Impl* core = coreOf(mb);
+    return guarded<CMPIDateTime*>(rc, core, [&] {
         DateTime dt;
         dt.usec = bin;
         dt.interval = interval != 0;
-        setRc(rc, CMPI_RC_OK);
         return &newDateTime(core, dt)->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    });
 }
 
 CMPIDateTime* eNewDateTimeChars(const CMPIBroker* mb, const char* text, CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+    Host::Impl* core = coreOf(mb);
+    return guarded<CMPIDateTime*>(rc, core, [&]() -> CMPIDateTime* {
         auto dt = text ? DateTime::fromText(text) : std::nullopt;
         if (!dt) return setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER), nullptr;
-        setRc(rc, CMPI_RC_OK);
         return &newDateTime(core, *dt)->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    });
 }
 
 CMPISelectExp* eNewSelectExp(const CMPIBroker* mb, const char* query, const char* lang, CMPIArray** projection,
                              CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (projection) *projection = nullptr;
-        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+    Host::Impl* core = coreOf(mb);
+    if (projection) *projection = nullptr;
+    return guarded<CMPISelectExp*>(rc, core, [&]() -> CMPISelectExp* {
         if (!lang || (strcasecmp(lang, "WQL") != 0 && strcasecmp(lang, "CQL") != 0 &&
                       strcasecmp(lang, "DMTF:CQL") != 0))
             return setRc(rc, CMPI_RC_ERR_QUERY_LANGUAGE_NOT_SUPPORTED), nullptr;
         EncSelectExp* s = newSelectExp(core, query ? query : "", lang);
         if (!s) return setRc(rc, CMPI_RC_ERR_INVALID_QUERY), nullptr;
-        setRc(rc, CMPI_RC_OK);
         return &s->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    });
 }
 
 CMPIBoolean eClassPathIsA(const CMPIBroker* mb, const CMPIObjectPath* op, const char* type, CMPIStatus* rc) {
     Host::Impl* core = coreOf(mb);
     EncPath* p = asPath(op);
-    if (!core || !p) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
-    if (!type) return setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER), 0;
-    setRc(rc, CMPI_RC_OK);
-    return core->repo.isA(p->p.className, type) ? 1 : 0;
+    return guarded<CMPIBoolean>(rc, core && p, [&] {
+        if (!type) return setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER), CMPIBoolean(0);
+        return CMPIBoolean(core->repo.isA(p->p.className, type) ? 1 : 0);
+    });
 }
 
 // Which encapsulated type an object is, by its function table.
@@ -1437,10 +1195,9 @@ const char* typeOfObject(const void* object) {
 }
 
 CMPIString* eToString(const CMPIBroker* mb, const void* object, CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        const char* t = typeOfObject(object);
-        if (!core || !t) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+    Host::Impl* core = coreOf(mb);
+    const char* t = typeOfObject(object);
+    return guarded<CMPIString*>(rc, core && t, [&] {
         std::string text;
         const std::string type = t;
         if (type == "CMPIInstance") text = formatInstanceMof(asInstance(static_cast<const CMPIInstance*>(object))->inst);
@@ -1448,73 +1205,47 @@ CMPIString* eToString(const CMPIBroker* mb, const void* object, CMPIStatus* rc) 
         else if (type == "CMPIString") text = asString(static_cast<const CMPIString*>(object))->s;
         else if (type == "CMPIDateTime") text = asDateTime(static_cast<const CMPIDateTime*>(object))->dt.toText();
         else text = type;
-        setRc(rc, CMPI_RC_OK);
         return &newString(core, text)->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    });
 }
 
 CMPIBoolean eIsOfType(const CMPIBroker*, const void* object, const char* type, CMPIStatus* rc) {
     const char* t = typeOfObject(object);
-    if (!t) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), 0;
-    setRc(rc, CMPI_RC_OK);
-    return type && std::strcmp(t, type) == 0 ? 1 : 0;
+    return guarded<CMPIBoolean>(rc, t, [&] { return CMPIBoolean(type && std::strcmp(t, type) == 0 ? 1 : 0); });
 }
 
 CMPIString* eGetType(const CMPIBroker* mb, const void* object, CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        const char* t = typeOfObject(object);
-        if (!core || !t) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        setRc(rc, CMPI_RC_OK);
-        return &newString(core, t)->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    Host::Impl* core = coreOf(mb);
+    const char* t = typeOfObject(object);
+    return guarded<CMPIString*>(rc, core && t, [&] { return &newString(core, t)->enc; });
 }
 
 // Message lookup: there are no message files, so the default text is
 // returned as it stands (insert arguments are not read).
 CMPIString* eGetMessage(const CMPIBroker* mb, const char*, const char* defMsg, CMPIStatus* rc, CMPICount, ...) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
-        setRc(rc, CMPI_RC_OK);
-        return &newString(core, defMsg ? defMsg : "")->enc;
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    Host::Impl* core = coreOf(mb);
+    return guarded<CMPIString*>(rc, core, [&] { return &newString(core, defMsg ? defMsg : "")->enc; });
+}
+
+// logMessage and trace: one line to the host's log, "<what>[<level>] <id>: <text>".
+CMPIStatus logLine(const CMPIBroker* mb, const char* what, int level, const char* id, const char* text,
+                   const CMPIString* string) {
+    Host::Impl* core = coreOf(mb);
+    return guardedStatus(core, [&] {
+        std::string line = std::string(what) + "[" + std::to_string(level) + "] " + (id ? id : "") + ": ";
+        line += text ? text : stringOf(string);
+        core->log(line);
+        return CMPI_RC_OK;
+    });
 }
 
 CMPIStatus eLog(const CMPIBroker* mb, int severity, const char* id, const char* text, const CMPIString* string) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
-        std::string line = "log[" + std::to_string(severity) + "] " + (id ? id : "") + ": ";
-        line += text ? text : stringOf(string);
-        core->log(line);
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+    return logLine(mb, "log", severity, id, text, string);
 }
 
 CMPIStatus eTrace(const CMPIBroker* mb, int level, const char* component, const char* text,
                   const CMPIString* string) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
-        std::string line = "trace[" + std::to_string(level) + "] " + (component ? component : "") + ": ";
-        line += text ? text : stringOf(string);
-        core->log(line);
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+    return logLine(mb, "trace", level, component, text, string);
 }
 
 CMPIError* eNewError(const CMPIBroker*, const char*, const char*, const char*, const CMPIErrorSeverity,
@@ -1640,32 +1371,24 @@ int xSignalCond(CMPI_COND_TYPE c) {
 // ---------------------------------------------------------------- CMPIBrokerMemFT
 
 CMPIGcStat* mMark(const CMPIBroker* mb, CMPIStatus* rc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core) return setRc(rc, CMPI_RC_ERR_INVALID_HANDLE), nullptr;
+    Host::Impl* core = coreOf(mb);
+    return guarded<CMPIGcStat*>(rc, core, [&] {
         const unsigned long long id = core->pushArena();
-        setRc(rc, CMPI_RC_OK);
         return reinterpret_cast<CMPIGcStat*>(static_cast<uintptr_t>(id));
-    } catch (...) {
-        setRc(rc, CMPI_RC_ERR_FAILED);
-        return nullptr;
-    }
+    });
 }
 
 CMPIStatus mRelease(const CMPIBroker* mb, const CMPIGcStat* gc) {
-    try {
-        Host::Impl* core = coreOf(mb);
-        if (!core || !gc) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    Host::Impl* core = coreOf(mb);
+    return guardedStatus(core && gc, [&] {
         const auto id = static_cast<unsigned long long>(reinterpret_cast<uintptr_t>(gc));
         {
             std::lock_guard<std::mutex> g(core->arenaLock);
-            if (!core->arenas.count(id)) return mkStatus(CMPI_RC_ERR_INVALID_HANDLE);
+            if (!core->arenas.count(id)) return CMPI_RC_ERR_INVALID_HANDLE;
         }
         core->popArena(id);
-        return mkStatus(CMPI_RC_OK);
-    } catch (...) {
-        return mkStatus(CMPI_RC_ERR_FAILED);
-    }
+        return CMPI_RC_OK;
+    });
 }
 
 void* track(Host::Impl* core, void* p) {
