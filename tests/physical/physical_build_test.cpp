@@ -28,10 +28,8 @@ using fctest::fcAdapter;
 using fctest::fcFunction;
 using fctest::host;
 using fctest::json;
-using phystest::lun;
 using phystest::nicFunction;
 using phystest::port;
-using phystest::target;
 using phystest::transceiver;
 
 namespace {
@@ -93,51 +91,7 @@ protected:
     }
 };
 
-// ---- SCSI ------------------------------------------------------------------------
-
-TEST_F(PhysicalBuild, ScsiListsNameControllersTargetsAndLuns)
-{
-    json luns0 = json::array({lun(0, 16, "/dev/sdb"), lun(7, 8, "/dev/sdc")});
-    json luns1 = json::array({lun(2, 16, "/dev/sdd")});
-    json f0 = fcFunction(1, 0, {{"targets", json::array({target("3a:00:00:00:00:00:00:01", luns0),
-                                                         target("3a:00:00:00:00:00:00:02", luns1)})}});
-    json f1 = fcFunction(1, 1);   // a port without targets
-    use(host(json::array({adapterWithPorts("SER1", "RSX-1620",
-                                           json::array({port(0, json::array({f0})), port(1, json::array({f1}))}))})));
-
-    buildSCSIProtocolControllerList();
-    buildSCSIProtocolEndpointHBAList();
-    buildSCSIProtocolEndpointTargetList();
-    buildStorageExtentList();
-
-    for (auto* list : {&g_SCSIProtocolControllerList, &g_SCSIProtocolEndpointHBAList}) {
-        ASSERT_EQ(2, list->count);
-        EXPECT_STREQ("3100000000010000", list->entries[0].name);
-        EXPECT_STREQ("3100000000010100", list->entries[1].name);
-        EXPECT_EQ(1, list->entries[1].valid);
-    }
-
-    // Only the port with targets has target endpoints and extents.
-    ASSERT_EQ(2, g_SCSIProtocolEndpointTargetList.count);
-    EXPECT_STREQ("3100000000010000_3A00000000000001", g_SCSIProtocolEndpointTargetList.entries[0].name);
-    EXPECT_STREQ("3100000000010000_3A00000000000002", g_SCSIProtocolEndpointTargetList.entries[1].name);
-
-    ASSERT_EQ(3, g_StorageExtentList.count);
-    const StorageExtentEntry& e0 = g_StorageExtentList.entries[0];
-    // A 16-byte identifier gives 32 hex digits, an 8-byte one 16.
-    EXPECT_STREQ("3100000000010000_3A00000000000001_634E4F52000000000000000000000000_0", e0.deviceId);
-    EXPECT_STREQ("3100000000010000_3A00000000000001_634E4F5200000007_7", g_StorageExtentList.entries[1].deviceId);
-    EXPECT_STREQ("3100000000010000_3A00000000000002_634E4F52000000000000000000000002_2",
-                 g_StorageExtentList.entries[2].deviceId);
-    // The slot keeps the library's records that makeInstance reads through.
-    ASSERT_NE(nullptr, e0.lun);
-    EXPECT_STREQ("/dev/sdb", e0.lun->osDeviceName);
-    EXPECT_EQ(4096u, e0.lun->blockSize);
-    ASSERT_NE(nullptr, g_StorageExtentList.entries[2].target);
-    EXPECT_EQ(0x02, g_StorageExtentList.entries[2].target->portWWN[7]);
-    EXPECT_EQ(&g_StorageExtentList.entries[2].device->portWWN[0],
-              &g_StorageExtentList.entries[0].device->portWWN[0]);
-}
+// ---- Empty hosts -----------------------------------------------------------------
 
 TEST_F(PhysicalBuild, NoAdaptersLeaveEveryListEmpty)
 {
@@ -493,42 +447,6 @@ TEST_F(PhysicalBuild, NicOperationsMakeThePortsSlotOrANullHandle)
     EXPECT_TRUE(makeInstance_Nic_PhysicalPort("Vexlan_Adapter_PhysicalPort", ns, nullptr, m_CNAList, nullptr).isNull());
     EXPECT_TRUE(makePath_Nic_PhysicalPackage("Vexlan_Adapter_PhysicalPackage", ns, nullptr).isNull());
     fake::reset();
-}
-
-TEST_F(PhysicalBuild, RepeatedPortTagsAreDroppedAndCountOnlyFilledSlots)
-{
-    json a = fcAdapter(1, "RSX-1620", 2, "TWIN");
-    json b = fcAdapter(2, "RSX-1620", 3, "TWIN");   // ports 0 and 1 repeat the tags of a
-    json c = fcAdapter(3, "RSX-1620", 1, "11SVXL4G01ZV10C4001234");
-    use(host(json::array({a, b, c})));
-    buildPhysicalPortList();
-    ASSERT_EQ(4, g_PhysicalPortList.count);
-    EXPECT_STREQ("TWIN_0", g_PhysicalPortList.entries[0].tag);
-    EXPECT_STREQ("TWIN_1", g_PhysicalPortList.entries[1].tag);
-    EXPECT_STREQ("TWIN_2", g_PhysicalPortList.entries[2].tag);
-    EXPECT_STREQ("11SVXL4G01ZV10C4001234_0", g_PhysicalPortList.entries[3].tag);
-    EXPECT_STREQ("11SVXL4G01ZV10C4001234", g_PhysicalPortList.entries[3].serialNumber);
-    // The unused slot of the capacity stays invalid.
-    EXPECT_EQ(0, g_PhysicalPortList.entries[4].valid);
-}
-
-TEST_F(PhysicalBuild, SixtyFourAdaptersOfFourFCFunctionsEach)
-{
-    use(fctest::wideHost());
-    buildSCSIProtocolControllerList();
-    buildSCSIProtocolEndpointHBAList();
-    buildPhysicalPackageList();
-    buildProductList();
-    buildPhysicalPortList();
-    buildPhysicalConnectorList();
-    EXPECT_EQ(256, g_SCSIProtocolControllerList.count);
-    EXPECT_EQ(256, g_SCSIProtocolEndpointHBAList.count);
-    EXPECT_EQ(64, g_PhysicalPackageList.count);
-    EXPECT_EQ(64, g_ProductList.count);
-    EXPECT_EQ(128, g_PhysicalPortList.count);
-    EXPECT_EQ(0, g_PhysicalConnectorList.count);   // no modules in the cages
-    EXPECT_STREQ("VXW0063", g_PhysicalPackageList.entries[63].serialNumber);
-    EXPECT_STREQ("VXW0063_1", g_PhysicalPortList.entries[127].tag);
 }
 
 // ---- Tag texts ---------------------------------------------------------------------------

@@ -18,24 +18,6 @@ inline json transceiver(const std::string& serial, const std::string& vendor = "
     return json{{"vendor", vendor}, {"partNumber", part}, {"serialNumber", serial}};
 }
 
-// A LUN with an identifier of `idBytes` bytes (8 or 16) ending in `lun`.
-inline json lun(int number, int idBytes, const std::string& device)
-{
-    std::string id = "63:4e:4f:52";
-    for (int i = 4; i < idBytes - 1; ++i)
-        id += ":00";
-    char last[8];
-    std::snprintf(last, sizeof(last), ":%02x", number & 0xFF);
-    id += last;
-    return json{{"lun", number},          {"id", id},          {"vendor", "NORDARR"}, {"product", "Grid"},
-                {"revision", "0421"},    {"blockSize", 4096}, {"osDevice", device}};
-}
-
-inline json target(const std::string& portWWN, json luns)
-{
-    return json{{"portWWN", portWWN}, {"luns", luns}};
-}
-
 // A NIC function with a MAC ending in `last` on interface `ifname`.
 inline json nicFunction(int last, const std::string& ifname)
 {
