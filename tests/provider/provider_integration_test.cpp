@@ -322,11 +322,21 @@ TEST(Faults, AnUnusableAdapterLibraryGivesEmptyListsNeverACrash)
         ASSERT_TRUE(r.ok()) << r.message;
         ASSERT_EQ(r.instances.size(), 1u);
         EXPECT_EQ(r.instances[0].property("OSName"), nullptr);
-        for (const char* cls : {"Vexlan_FCHBA_FCPort", "Vexlan_NIC_EthernetPort2", "Vexlan_Adapter_PhysicalPackage"}) {
+        // Every class of the model answers, with nothing but the host (and
+        // what needs no adapter: object manager, namespaces, profiles).
+        int classes = 0;
+        for (const std::string& cls : host.classes().classNames()) {
+            const cimhost::ClassDecl* decl = host.classes().find(cls);
+            if (cls.rfind("Vexlan", 0) != 0 || decl == nullptr || decl->association || decl->indication)
+                continue;
+            ++classes;
             OpResult e = host.enumerateInstances(classPath(cls));
             EXPECT_TRUE(e.ok()) << cls << ": " << e.message;
-            EXPECT_TRUE(e.instances.empty()) << cls;
+            if (cls.find("Port") != std::string::npos || cls.find("Physical") != std::string::npos ||
+                cls.find("StorageExtent") != std::string::npos || cls.find("Endpoint") != std::string::npos)
+                EXPECT_TRUE(e.instances.empty()) << cls;
         }
+        EXPECT_GT(classes, 20);
         // Polls keep running against the failing library.
         EXPECT_TRUE(waitForLog("Exiting Initialize_CNA_List()", seconds(5)));
         std::this_thread::sleep_for(seconds(3));
