@@ -133,6 +133,16 @@ bool scalarType(CMPIType t, Type& out) {
     }
 }
 
+// A value that refers to an encapsulated object: a null pointer is a null
+// value, a handle that is not ours an error.
+template <class C, class Enc, class F>
+CMPIrc objectValue(const C* c, const Enc* e, Type t, Value& out, F from) {
+    if (!c) out = Value::nullOf(t);
+    else if (!e) return CMPI_RC_ERR_INVALID_HANDLE;
+    else out = from(*e);
+    return CMPI_RC_OK;
+}
+
 CMPIrc scalarToValue(const CMPIValue& v, CMPIType t, Value& out) {
     switch (t) {
         case CMPI_boolean: out = Value::fromBool(v.boolean != 0); return CMPI_RC_OK;
@@ -147,47 +157,23 @@ CMPIrc scalarToValue(const CMPIValue& v, CMPIType t, Value& out) {
         case CMPI_sint64: out = Value::fromSigned(Type::SInt64, v.sint64); return CMPI_RC_OK;
         case CMPI_real32: out = Value::fromReal(Type::Real32, v.real32); return CMPI_RC_OK;
         case CMPI_real64: out = Value::fromReal(Type::Real64, v.real64); return CMPI_RC_OK;
-        case CMPI_string: {
-            EncString* s = asString(v.string);
-            if (!v.string) out = Value::nullOf(Type::String);
-            else if (!s) return CMPI_RC_ERR_INVALID_HANDLE;
-            else out = s->null ? Value::nullOf(Type::String) : Value::fromString(s->s);
-            return CMPI_RC_OK;
-        }
+        case CMPI_string:
+            return objectValue(v.string, asString(v.string), Type::String, out, [](const EncString& s) {
+                return s.null ? Value::nullOf(Type::String) : Value::fromString(s.s);
+            });
         case CMPI_charsptr:
             out = v.dataPtr.ptr ? Value::fromString(static_cast<const char*>(v.dataPtr.ptr))
                                 : Value::nullOf(Type::String);
             return CMPI_RC_OK;
-        case CMPI_dateTime: {
-            if (!v.dateTime) {
-                out = Value::nullOf(Type::DateTime);
-                return CMPI_RC_OK;
-            }
-            EncDateTime* d = asDateTime(v.dateTime);
-            if (!d) return CMPI_RC_ERR_INVALID_HANDLE;
-            out = Value::fromDateTime(d->dt);
-            return CMPI_RC_OK;
-        }
-        case CMPI_ref: {
-            if (!v.ref) {
-                out = Value::nullOf(Type::Reference);
-                return CMPI_RC_OK;
-            }
-            EncPath* p = asPath(v.ref);
-            if (!p) return CMPI_RC_ERR_INVALID_HANDLE;
-            out = Value::fromRef(p->p);
-            return CMPI_RC_OK;
-        }
-        case CMPI_instance: {
-            if (!v.inst) {
-                out = Value::nullOf(Type::Instance);
-                return CMPI_RC_OK;
-            }
-            EncInstance* i = asInstance(v.inst);
-            if (!i) return CMPI_RC_ERR_INVALID_HANDLE;
-            out = Value::fromInstance(i->inst);
-            return CMPI_RC_OK;
-        }
+        case CMPI_dateTime:
+            return objectValue(v.dateTime, asDateTime(v.dateTime), Type::DateTime, out,
+                               [](const EncDateTime& d) { return Value::fromDateTime(d.dt); });
+        case CMPI_ref:
+            return objectValue(v.ref, asPath(v.ref), Type::Reference, out,
+                               [](const EncPath& p) { return Value::fromRef(p.p); });
+        case CMPI_instance:
+            return objectValue(v.inst, asInstance(v.inst), Type::Instance, out,
+                               [](const EncInstance& i) { return Value::fromInstance(i.inst); });
         default: return CMPI_RC_ERR_INVALID_DATA_TYPE;
     }
 }
