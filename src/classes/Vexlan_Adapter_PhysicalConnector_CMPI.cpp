@@ -13,12 +13,6 @@
 
 ClassList<PhysicalConnectorEntry> g_PhysicalConnectorList = {0, nullptr};
 
-#define PC_DEBUG(...)                                          \
-    do {                                                       \
-        if (g_EnableDebugPrint)                                \
-            Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__);     \
-    } while (0)
-
 void CreatePhysicalConnectorTag(char* out, char* transceiverSerial, char* adapterSerial, int portNumber)
 {
     if (out == nullptr)
@@ -89,7 +83,7 @@ void nicConnectorTag(char* out, const _CNAPortStruc* port, const _zorap_adapter_
 
 int calcTag_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port, char* out)
 {
-    PC_DEBUG("Vexlan_NIC_PhysicalConnector makeInstance_PhysicalConnector was called\n");
+    PHYSICAL_DEBUG("Vexlan_NIC_PhysicalConnector makeInstance_PhysicalConnector was called\n");
     if (out == nullptr)
         return 0;
     out[0] = '\0';
@@ -118,7 +112,7 @@ int slotWithTag(const char* tag)
 
 void logSameTag(int slot)
 {
-    PC_DEBUG("Exiting  createPhysicalConnector: Current device has the same the serial number as a device in the "
+    PHYSICAL_DEBUG("Exiting  createPhysicalConnector: Current device has the same the serial number as a device in the "
              "list at index=%d. Skip!\n",
              slot);
 }
@@ -171,7 +165,7 @@ struct CoreBlock {
 // reads it, when a module with a serial sits in the cage.
 void createFCConnector(_zorap_adapter_t* adapter, _zorap_phy_port_t* phy, _tagZORAPSDMDevice* device, int& n)
 {
-    PC_DEBUG("Entering createPhysicalConnector, index = %d", n);
+    PHYSICAL_DEBUG("Entering createPhysicalConnector, index = %d", n);
     // The data block is released on every way out.
     std::unique_ptr<unsigned char, CoreBlock> buffer(static_cast<unsigned char*>(CoreZMalloc(kSFPDataSize)));
     if (!buffer) {
@@ -180,14 +174,14 @@ void createFCConnector(_zorap_adapter_t* adapter, _zorap_phy_port_t* phy, _tagZO
         return;
     }
     if (ZORAP_GetSFPData(device, buffer.get()) != 0) {
-        PC_DEBUG("No Transceiver on DeviceNumber %u\n", device->portIndex);
+        PHYSICAL_DEBUG("No Transceiver on DeviceNumber %u\n", device->portIndex);
         return;
     }
     _SFPFields fields;
     std::memset(&fields, 0, sizeof(fields));
     parseSFPFields(device, buffer.get(), kSFPDataSize, &fields);
     if (fields.SerialNumber[0] == '\0') {
-        PC_DEBUG("Empty SerialNumber for the Transceiver on DeviceNumber %u\n", device->portIndex);
+        PHYSICAL_DEBUG("Empty SerialNumber for the Transceiver on DeviceNumber %u\n", device->portIndex);
         return;
     }
     char adapterSerial[sizeof(adapter->serialNumber) + 1];
@@ -203,7 +197,7 @@ void createFCConnector(_zorap_adapter_t* adapter, _zorap_phy_port_t* phy, _tagZO
     entry.sfp = fields;
     std::snprintf(entry.tag, sizeof(entry.tag), "%s", tag);
     entry.valid = 1;
-    PC_DEBUG("Exiting  createPhysicalConnector\n");
+    PHYSICAL_DEBUG("Exiting  createPhysicalConnector\n");
     ++n;
 }
 
@@ -307,7 +301,7 @@ int findSlot_Nic_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port)
 CmpiObjectPath makePath_Nic_PhysicalConnector(const char* className, const char* nameSpace, _CNAStruc* cna,
                                               _CNAPortStruc* port)
 {
-    PC_DEBUG("Vexlan_NIC_PhysicalConnector makePath_PhysicalConnector was called\n");
+    PHYSICAL_DEBUG("Vexlan_NIC_PhysicalConnector makePath_PhysicalConnector was called\n");
     const int slot = findSlot_Nic_PhysicalConnector(cna, port);
     if (slot < 0)
         return CmpiObjectPath(static_cast<CMPIObjectPath*>(nullptr));

@@ -15,12 +15,6 @@
 
 ClassList<PhysicalPackageEntry> g_PhysicalPackageList = {0, nullptr};
 
-#define PP_DEBUG(...)                                          \
-    do {                                                       \
-        if (g_EnableDebugPrint)                                \
-            Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__);     \
-    } while (0)
-
 std::uint32_t AdapterTypeOfKind(std::uint32_t adapterKind)
 {
     switch (adapterKind) {
@@ -115,14 +109,14 @@ void vpdValueInto(const char* line, char (&target)[128], const VpdFieldTexts& te
 {
     const char* colon = nullptr;
     if (line[0] != '\0') {
-        PP_DEBUG("%s%s", texts.lineLabel, line);
+        PHYSICAL_DEBUG("%s%s", texts.lineLabel, line);
         colon = std::strchr(line, ':');
     }
     if (colon == nullptr) {
-        PP_DEBUG("%s", texts.missing);
+        PHYSICAL_DEBUG("%s", texts.missing);
         return;
     }
-    PP_DEBUG("%s%s", texts.valueLabel, colon + 1);
+    PHYSICAL_DEBUG("%s%s", texts.valueLabel, colon + 1);
     safeStrCpy(target, colon + 1, sizeof(target));
 }
 
@@ -130,47 +124,47 @@ void vpdValueInto(const char* line, char (&target)[128], const VpdFieldTexts& te
 void createFCPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zorap_adapter_t* adapter,
                      _tagZORAPSDMDevice* device, Serial& serial, int& index)
 {
-    PP_DEBUG("Calling createPhysicalPackage() for FC/FCoE device.");
-    PP_DEBUG("Entering createPhysicalPackage, index = %d", index);
+    PHYSICAL_DEBUG("Calling createPhysicalPackage() for FC/FCoE device.");
+    PHYSICAL_DEBUG("Entering createPhysicalPackage, index = %d", index);
     std::memset(g_serialNumber, 0, sizeof(g_serialNumber));
     std::memset(g_fruNumberVersion, 0, sizeof(g_fruNumberVersion));
     const int r = GetHBAVPDData(device);
     if (r == 0)
-        PP_DEBUG("Vexlan_FC_PhysicalPackage: createPhysicalPackage: VPD data retrieved successfully.");
+        PHYSICAL_DEBUG("Vexlan_FC_PhysicalPackage: createPhysicalPackage: VPD data retrieved successfully.");
     else
-        PP_DEBUG("Vexlan_FC_PhysicalPackage: createPhysicalPackage: Unable to retrieve VPD data!");
+        PHYSICAL_DEBUG("Vexlan_FC_PhysicalPackage: createPhysicalPackage: Unable to retrieve VPD data!");
     TakeFCSerial(device, r, serial, sizeof(Serial));
 
     const int same = slotWithSerial(list, serial);
     if (same >= 0) {
-        PP_DEBUG("Exiting  createPhysicalPackage: Current device has the same the serial number as a device in the "
+        PHYSICAL_DEBUG("Exiting  createPhysicalPackage: Current device has the same the serial number as a device in the "
                  "list at index=%d. Skip!\n",
                  same);
-        PP_DEBUG("Done calling createPhysicalPackage() for FC/FCoE device.");
+        PHYSICAL_DEBUG("Done calling createPhysicalPackage() for FC/FCoE device.");
         ++index;
         return;
     }
     // Devices of one board that name more serials than the tree has adapters
     // find no slot for the extra ones.
     if (list.count >= capacity) {
-        PP_DEBUG("Done calling createPhysicalPackage() for FC/FCoE device.");
+        PHYSICAL_DEBUG("Done calling createPhysicalPackage() for FC/FCoE device.");
         ++index;
         return;
     }
 
     PhysicalPackageEntry& entry = list.entries[list.count++];
     if (g_I2CUUID[0] != '\0') {
-        PP_DEBUG("createPhysicalPackage: I2C uuid=%s", g_I2CUUID);
+        PHYSICAL_DEBUG("createPhysicalPackage: I2C uuid=%s", g_I2CUUID);
         safeStrCpy(entry.tag, g_I2CUUID, sizeof(entry.tag));
     } else if (g_UUID[0] != '\0') {
-        PP_DEBUG("createPhysicalPackage: g_UUID=%s", g_UUID);
+        PHYSICAL_DEBUG("createPhysicalPackage: g_UUID=%s", g_UUID);
         const char* colon = std::strchr(g_UUID, ':');
         if (colon != nullptr)
-            PP_DEBUG("createPhysicalPackage: uuid=%s", colon + 1);
+            PHYSICAL_DEBUG("createPhysicalPackage: uuid=%s", colon + 1);
         if (colon != nullptr && colon[1] != '\0') {
             safeStrCpy(entry.tag, colon + 1, sizeof(entry.tag));
         } else {
-            PP_DEBUG("createPhysicalPackage: uuid is NULL");
+            PHYSICAL_DEBUG("createPhysicalPackage: uuid is NULL");
             safeStrCpy(entry.tag, serial, sizeof(entry.tag));
         }
     } else {
@@ -183,8 +177,8 @@ void createFCPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zorap
     vpdValueInto(g_fruNumberVersion, entry.sku, kFruTexts);
     vpdValueInto(g_partNumber, entry.partNumber, kPartNumberTexts);
     entry.valid = 1;
-    PP_DEBUG("Exiting  createPhysicalPackage\n");
-    PP_DEBUG("Done calling createPhysicalPackage() for FC/FCoE device.");
+    PHYSICAL_DEBUG("Exiting  createPhysicalPackage\n");
+    PHYSICAL_DEBUG("Done calling createPhysicalPackage() for FC/FCoE device.");
     ++index;
 }
 
@@ -196,7 +190,7 @@ void createNicPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zora
     for (_CNAStruc* c = m_CNAList; c != nullptr; c = c->next) {
         char cnaSerial[sizeof(c->serialNumber) + 1];
         copyFieldText(cnaSerial, c->serialNumber);
-        PP_DEBUG("Comparing %s to %s.", cnaSerial, adapterSerial);
+        PHYSICAL_DEBUG("Comparing %s to %s.", cnaSerial, adapterSerial);
         if (std::strcmp(cnaSerial, adapterSerial) == 0) {
             cna = c;
             break;
@@ -204,7 +198,7 @@ void createNicPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zora
     }
     if (cna == nullptr || list.count >= capacity)
         return;
-    PP_DEBUG("Calling createPhysicalPackage() for NIC device.");
+    PHYSICAL_DEBUG("Calling createPhysicalPackage() for NIC device.");
     PhysicalPackageEntry& entry = list.entries[list.count++];
     calcTag_PhysicalPackage(cna, entry.tag);
     copyFieldText(entry.serialNumber, cna->serialNumber);
@@ -214,7 +208,7 @@ void createNicPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zora
     entry.adapterType = AdapterTypeOfKind(adapter->adapterKind);
     entry.isCNA = entry.adapterType == 3 ? 1 : 0;
     entry.valid = 1;
-    PP_DEBUG("Done calling createPhysicalPackage() for NIC device.");
+    PHYSICAL_DEBUG("Done calling createPhysicalPackage() for NIC device.");
     ++index;
 }
 
@@ -236,23 +230,23 @@ void buildPhysicalPackageList()
     int index = 0;
     Serial serial = {};   // kept from device to device, as the FC serial rule needs
     for (_zorap_adapter_t* adapter = adapters->firstAdapter; adapter != nullptr; adapter = adapter->next) {
-        PP_DEBUG("buildPhysicalPackageList(): Processing an adapter entry.");
+        PHYSICAL_DEBUG("buildPhysicalPackageList(): Processing an adapter entry.");
         if (adapter->phyPortList == nullptr)
             continue;
         char adapterSerial[sizeof(adapter->serialNumber) + 1];
         copyFieldText(adapterSerial, adapter->serialNumber);
         for (_zorap_phy_port_t* phy = adapter->phyPortList->firstPhyPort; phy != nullptr; phy = phy->next) {
-            PP_DEBUG("buildPhysicalPackageList(): Processing an phyport entry.");
+            PHYSICAL_DEBUG("buildPhysicalPackageList(): Processing an phyport entry.");
             if (phy->protocolList == nullptr)
                 continue;
             for (_zorap_protocol_t* protocol = phy->protocolList->firstProtocol; protocol != nullptr;
                  protocol = protocol->next) {
-                PP_DEBUG("buildPhysicalPackageList(): Processing an protocol entry.");
+                PHYSICAL_DEBUG("buildPhysicalPackageList(): Processing an protocol entry.");
                 if (protocol->protocolType > 2)
                     continue;
                 const int same = slotWithSerial(list, adapterSerial);
                 if (same >= 0) {
-                    PP_DEBUG("Exiting  createPhysicalPackage: Current device has the same the serial number as a "
+                    PHYSICAL_DEBUG("Exiting  createPhysicalPackage: Current device has the same the serial number as a "
                              "device in the list at index=%d. Skip %s!\n",
                              same, adapterSerial);
                     continue;
@@ -373,7 +367,7 @@ int findSlot_Nic_PhysicalPackage(_CNAStruc* cna)
 
 CmpiObjectPath makePath_Nic_PhysicalPackage(const char* className, const char* nameSpace, _CNAStruc* cna)
 {
-    PP_DEBUG("Vexlan_NIC_PhysicalPackage makePath_PhysicalPackage was called");
+    PHYSICAL_DEBUG("Vexlan_NIC_PhysicalPackage makePath_PhysicalPackage was called");
     const int slot = findSlot_Nic_PhysicalPackage(cna);
     if (slot < 0)
         return CmpiObjectPath(static_cast<CMPIObjectPath*>(nullptr));
@@ -383,7 +377,7 @@ CmpiObjectPath makePath_Nic_PhysicalPackage(const char* className, const char* n
 CmpiInstance makeInstance_Nic_PhysicalPackage(const char* className, const char* nameSpace, const char** properties,
                                               _CNAStruc* cna)
 {
-    PP_DEBUG("Vexlan_NIC_PhysicalPackage makeInstance_PhysicalPackage was called");
+    PHYSICAL_DEBUG("Vexlan_NIC_PhysicalPackage makeInstance_PhysicalPackage was called");
     const int slot = findSlot_Nic_PhysicalPackage(cna);
     if (slot < 0)
         return CmpiInstance(static_cast<CMPIInstance*>(nullptr));

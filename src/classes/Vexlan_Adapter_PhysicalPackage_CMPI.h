@@ -11,6 +11,7 @@
 
 #include "classes/ClassModule.h"
 #include "inventory/AdapterFunc.h"
+#include "support/Vexlan_FC_Utils_CMPI.h"
 
 struct PhysicalPackageEntry {
     unsigned char valid;
@@ -53,6 +54,13 @@ int findSlot_Nic_PhysicalPackage(_CNAStruc* cna);
 CmpiObjectPath makePath_Nic_PhysicalPackage(const char* className, const char* nameSpace, _CNAStruc* cna);
 CmpiInstance makeInstance_Nic_PhysicalPackage(const char* className, const char* nameSpace,
                                               const char** properties, _CNAStruc* cna);
+
+// A debug line of the physical class builds, when debug output is on.
+#define PHYSICAL_DEBUG(...)                                    \
+    do {                                                       \
+        if (g_EnableDebugPrint)                                \
+            Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__);     \
+    } while (0)
 
 // Copies at most `sourceMax` bytes of text (less at a NUL) into `target` of
 // `targetSize` bytes, cut to fit and always terminated. Library records'

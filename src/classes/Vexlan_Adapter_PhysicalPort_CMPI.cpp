@@ -13,12 +13,6 @@
 
 ClassList<PhysicalPortEntry> g_PhysicalPortList = {0, nullptr};
 
-#define PPORT_DEBUG(...)                                       \
-    do {                                                       \
-        if (g_EnableDebugPrint)                                \
-            Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__);     \
-    } while (0)
-
 void CreatePhysicalPortTag(char* out, char* adapterSerial, int portNumber)
 {
     if (out == nullptr)
@@ -57,7 +51,7 @@ void portTag(char* out, const _zorap_adapter_t* adapter, const _zorap_phy_port_t
 
 int calcTag_PhysicalPort(_CNAStruc* cna, _CNAPortStruc* port, char* out)
 {
-    PPORT_DEBUG("Vexlan_NIC_PhysicalPort makeInstance_PhysicalPort was called\n");
+    PHYSICAL_DEBUG("Vexlan_NIC_PhysicalPort makeInstance_PhysicalPort was called\n");
     if (out == nullptr)
         return 0;
     out[0] = '\0';
@@ -89,7 +83,7 @@ void buildPhysicalPortList()
             continue;
         for (_zorap_phy_port_t* p = a->phyPortList->firstPhyPort; p != nullptr && list.count < capacity;
              p = p->next) {
-            PPORT_DEBUG("Entering createPhysicalPort, index = %d", list.count);
+            PHYSICAL_DEBUG("Entering createPhysicalPort, index = %d", list.count);
             char tag[kPhysicalTagSize];
             portTag(tag, a, p);
             int same = -1;
@@ -97,7 +91,7 @@ void buildPhysicalPortList()
                 if (std::strcmp(list.entries[i].tag, tag) == 0)
                     same = i;
             if (same >= 0) {
-                PPORT_DEBUG("Exiting  createPhysicalPort: Current device has the same the serial number as a device "
+                PHYSICAL_DEBUG("Exiting  createPhysicalPort: Current device has the same the serial number as a device "
                             "in the list at index=%d. Skip!\n",
                             same);
                 continue;
@@ -107,7 +101,7 @@ void buildPhysicalPortList()
             copyFieldText(entry.serialNumber, a->serialNumber);
             entry.portNumber = p->portNumber;
             entry.valid = 1;
-            PPORT_DEBUG("Exiting  createPhysicalPort\n");
+            PHYSICAL_DEBUG("Exiting  createPhysicalPort\n");
         }
     }
     int valid = 0;
@@ -178,7 +172,7 @@ int findSlot_Nic_PhysicalPort(_CNAStruc* cna, _CNAPortStruc* port)
 CmpiObjectPath makePath_Nic_PhysicalPort(const char* className, const char* nameSpace, _CNAStruc* cna,
                                          _CNAPortStruc* port)
 {
-    PPORT_DEBUG("Vexlan_NIC_PhysicalPort makePath_PhysicalPort was called\n");
+    PHYSICAL_DEBUG("Vexlan_NIC_PhysicalPort makePath_PhysicalPort was called\n");
     const int slot = findSlot_Nic_PhysicalPort(cna, port);
     if (slot < 0)
         return CmpiObjectPath(static_cast<CMPIObjectPath*>(nullptr));
