@@ -28,9 +28,24 @@ CMPIStatus cStatus(const CMPIBroker* mb, CMPIrc rc, const char* msg) noexcept
     return st;
 }
 
+// The status of the exception being handled: a thrown CmpiStatus as it
+// was thrown, any other CMPI_RC_ERR_FAILED, with the text of a
+// std::exception as its message.  Called only inside a catch block.
+CMPIStatus caughtStatus(const CMPIBroker* mb) noexcept
+{
+    try {
+        throw;
+    } catch (const CmpiStatus& st) {
+        return st.status(mb);
+    } catch (const std::exception& e) {
+        return cStatus(mb, CMPI_RC_ERR_FAILED, e.what());
+    } catch (...) {
+        return cStatus(mb, CMPI_RC_ERR_FAILED, nullptr);
+    }
+}
+
 // Runs call(mi) for the provider object behind an MI handle, as the MI
-// type of the table.  A thrown CmpiStatus is returned as it was thrown;
-// any other exception gives CMPI_RC_ERR_FAILED.
+// type of the table, turning any exception into a status (caughtStatus).
 template <class MI, class Call>
 CMPIStatus drive(const void* hdl, Call&& call) noexcept
 {
@@ -44,12 +59,8 @@ CMPIStatus drive(const void* hdl, Call&& call) noexcept
             return cStatus(mb, CMPI_RC_ERR_NOT_SUPPORTED, nullptr);
         CmpiStatus st = call(*mi);
         return st.status(mb);
-    } catch (const CmpiStatus& st) {
-        return st.status(mb);
-    } catch (const std::exception& e) {
-        return cStatus(mb, CMPI_RC_ERR_FAILED, e.what());
     } catch (...) {
-        return cStatus(mb, CMPI_RC_ERR_FAILED, nullptr);
+        return caughtStatus(mb);
     }
 }
 
@@ -104,12 +115,8 @@ CMPIStatus CmpiBaseMI::cleanupMI(void* mi, const void* hdl, const CMPIContext* e
         }
         delete base;
         return st.status(mb);
-    } catch (const CmpiStatus& st) {
-        return st.status(mb);
-    } catch (const std::exception& e) {
-        return cStatus(mb, CMPI_RC_ERR_FAILED, e.what());
     } catch (...) {
-        return cStatus(mb, CMPI_RC_ERR_FAILED, nullptr);
+        return caughtStatus(mb);
     }
 }
 
