@@ -119,14 +119,24 @@ void CmpiData::typeMismatch() const
     throw CmpiStatus(CMPI_RC_ERR_TYPE_MISMATCH);
 }
 
-CmpiData::operator CmpiString() const
-{
-    if (isNullValue())
-        return CmpiString();
-    if (data_.type != CMPI_string)
-        typeMismatch();
-    return CmpiString(data_.value.string);
-}
+// Handle values: a null value gives a wrapper of no handle, another type a
+// type mismatch.
+#define CMPI_DATA_HANDLE_CONV(Class, member, code)                          \
+    CmpiData::operator Class() const                                        \
+    {                                                                       \
+        if (isNullValue())                                                  \
+            return Class(static_cast<decltype(data_.value.member)>(nullptr)); \
+        if (data_.type != (code))                                           \
+            typeMismatch();                                                 \
+        return Class(data_.value.member);                                   \
+    }
+
+CMPI_DATA_HANDLE_CONV(CmpiString, string, CMPI_string)
+CMPI_DATA_HANDLE_CONV(CmpiDateTime, dateTime, CMPI_dateTime)
+CMPI_DATA_HANDLE_CONV(CmpiObjectPath, ref, CMPI_ref)
+CMPI_DATA_HANDLE_CONV(CmpiInstance, inst, CMPI_instance)
+
+#undef CMPI_DATA_HANDLE_CONV
 
 CmpiData::operator const char*() const
 {
@@ -137,33 +147,6 @@ CmpiData::operator const char*() const
     if (data_.type != CMPI_string)
         typeMismatch();
     return CmpiString(data_.value.string).charPtr();
-}
-
-CmpiData::operator CmpiDateTime() const
-{
-    if (isNullValue())
-        return CmpiDateTime(static_cast<const CMPIDateTime*>(nullptr));
-    if (data_.type != CMPI_dateTime)
-        typeMismatch();
-    return CmpiDateTime(data_.value.dateTime);
-}
-
-CmpiData::operator CmpiObjectPath() const
-{
-    if (isNullValue())
-        return CmpiObjectPath(static_cast<CMPIObjectPath*>(nullptr));
-    if (data_.type != CMPI_ref)
-        typeMismatch();
-    return CmpiObjectPath(data_.value.ref);
-}
-
-CmpiData::operator CmpiInstance() const
-{
-    if (isNullValue())
-        return CmpiInstance(static_cast<CMPIInstance*>(nullptr));
-    if (data_.type != CMPI_instance)
-        typeMismatch();
-    return CmpiInstance(data_.value.inst);
 }
 
 CmpiData::operator CmpiArray() const
