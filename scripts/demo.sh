@@ -4,7 +4,7 @@
 # the object paths of every class that answers, then the tail of the provider's
 # log. It runs with private /opt and /var/tmp (tests/isolate.sh), so it leaves no
 # files behind; where that is not possible it runs in a temporary working
-# directory with the provider's log off, and never writes to the real /opt.
+# directory with the provider's log off and creates nothing under the real /opt.
 set -euo pipefail
 ROOT=$(cd "$(dirname "$0")/.." && pwd)
 if [ "${1:-}" = --inside ]; then BUILD=$2; else BUILD=$(cd "${1:-$ROOT/build}" && pwd); fi
