@@ -46,4 +46,16 @@ public:
                                       const char* role);
 };
 
+// The CMPI 2.0 function table of an association MI named miName: cleanup and every
+// operation go to the drivers above.  A provider library defines its table
+// with it, e.g. `CMPIAssociationMIFT ft = cmpiAssociationMIFT("...");`.
+constexpr CMPIAssociationMIFT cmpiAssociationMIFT(const char* miName)
+{
+    return {200, 200, miName, CmpiBaseMI::driveBaseCleanup,
+            CmpiAssociationMI::driveAssociators,
+            CmpiAssociationMI::driveAssociatorNames,
+            CmpiAssociationMI::driveReferences,
+            CmpiAssociationMI::driveReferenceNames};
+}
+
 #endif

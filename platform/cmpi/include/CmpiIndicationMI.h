@@ -45,4 +45,18 @@ public:
     virtual CmpiStatus disableIndications(const CmpiContext& ctx);
 };
 
+// The CMPI 2.0 function table of an indication MI named miName: cleanup and every
+// operation go to the drivers above.  A provider library defines its table
+// with it, e.g. `CMPIIndicationMIFT ft = cmpiIndicationMIFT("...");`.
+constexpr CMPIIndicationMIFT cmpiIndicationMIFT(const char* miName)
+{
+    return {200, 200, miName, CmpiBaseMI::driveBaseCleanup,
+            CmpiIndicationMI::driveAuthorizeFilter,
+            CmpiIndicationMI::driveMustPoll,
+            CmpiIndicationMI::driveActivateFilter,
+            CmpiIndicationMI::driveDeActivateFilter,
+            CmpiIndicationMI::driveEnableIndications,
+            CmpiIndicationMI::driveDisableIndications};
+}
+
 #endif

@@ -54,4 +54,19 @@ public:
                                  const char* language);
 };
 
+// The CMPI 2.0 function table of an instance MI named miName: cleanup and every
+// operation go to the drivers above.  A provider library defines its table
+// with it, e.g. `CMPIInstanceMIFT ft = cmpiInstanceMIFT("...");`.
+constexpr CMPIInstanceMIFT cmpiInstanceMIFT(const char* miName)
+{
+    return {200, 200, miName, CmpiBaseMI::driveBaseCleanup,
+            CmpiInstanceMI::driveEnumInstanceNames,
+            CmpiInstanceMI::driveEnumInstances,
+            CmpiInstanceMI::driveGetInstance,
+            CmpiInstanceMI::driveCreateInstance,
+            CmpiInstanceMI::driveSetInstance,
+            CmpiInstanceMI::driveDeleteInstance,
+            CmpiInstanceMI::driveExecQuery};
+}
+
 #endif

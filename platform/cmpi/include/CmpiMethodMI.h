@@ -24,4 +24,13 @@ public:
                                     const CmpiArgs& in, CmpiArgs& out);
 };
 
+// The CMPI 2.0 function table of a method MI named miName: cleanup and every
+// operation go to the drivers above.  A provider library defines its table
+// with it, e.g. `CMPIMethodMIFT ft = cmpiMethodMIFT("...");`.
+constexpr CMPIMethodMIFT cmpiMethodMIFT(const char* miName)
+{
+    return {200, 200, miName, CmpiBaseMI::driveBaseCleanup,
+            CmpiMethodMI::driveInvokeMethod};
+}
+
 #endif

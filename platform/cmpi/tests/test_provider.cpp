@@ -6,23 +6,10 @@ std::atomic<bool> TestProvider::unloadable{true};
 
 CmpiProviderBase testProviderBase;
 
-CMPIInstanceMIFT testInstFT = {
-    200, 200, "instanceTest", CmpiBaseMI::driveBaseCleanup,
-    CmpiInstanceMI::driveEnumInstanceNames, CmpiInstanceMI::driveEnumInstances,
-    CmpiInstanceMI::driveGetInstance, CmpiInstanceMI::driveCreateInstance,
-    CmpiInstanceMI::driveSetInstance, CmpiInstanceMI::driveDeleteInstance,
-    CmpiInstanceMI::driveExecQuery};
+CMPIInstanceMIFT testInstFT = cmpiInstanceMIFT("instanceTest");
 
-CMPIAssociationMIFT testAssocFT = {
-    200, 200, "associationTest", CmpiBaseMI::driveBaseCleanup,
-    CmpiAssociationMI::driveAssociators, CmpiAssociationMI::driveAssociatorNames,
-    CmpiAssociationMI::driveReferences, CmpiAssociationMI::driveReferenceNames};
+CMPIAssociationMIFT testAssocFT = cmpiAssociationMIFT("associationTest");
 
-CMPIMethodMIFT testMethFT = {200, 200, "methodTest", CmpiBaseMI::driveBaseCleanup,
-                             CmpiMethodMI::driveInvokeMethod};
+CMPIMethodMIFT testMethFT = cmpiMethodMIFT("methodTest");
 
-CMPIIndicationMIFT testIndFT = {
-    200, 200, "indicationTest", CmpiBaseMI::driveBaseCleanup,
-    CmpiIndicationMI::driveAuthorizeFilter, CmpiIndicationMI::driveMustPoll,
-    CmpiIndicationMI::driveActivateFilter, CmpiIndicationMI::driveDeActivateFilter,
-    CmpiIndicationMI::driveEnableIndications, CmpiIndicationMI::driveDisableIndications};
+CMPIIndicationMIFT testIndFT = cmpiIndicationMIFT("indicationTest");
