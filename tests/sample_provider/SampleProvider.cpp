@@ -641,26 +641,10 @@ MI* create(MI& mi, FT* ft, const CMPIBroker* mb, const CMPIContext* ctx, CMPISta
     return nullptr;
 }
 
-CMPIInstanceMIFT instFT = {
-    200, 200, "instanceSample_Provider", CmpiBaseMI::driveBaseCleanup,
-    CmpiInstanceMI::driveEnumInstanceNames, CmpiInstanceMI::driveEnumInstances,
-    CmpiInstanceMI::driveGetInstance, CmpiInstanceMI::driveCreateInstance,
-    CmpiInstanceMI::driveSetInstance, CmpiInstanceMI::driveDeleteInstance,
-    CmpiInstanceMI::driveExecQuery};
-
-CMPIAssociationMIFT assocFT = {
-    200, 200, "associationSample_Provider", CmpiBaseMI::driveBaseCleanup,
-    CmpiAssociationMI::driveAssociators, CmpiAssociationMI::driveAssociatorNames,
-    CmpiAssociationMI::driveReferences, CmpiAssociationMI::driveReferenceNames};
-
-CMPIMethodMIFT methFT = {200, 200, "methodSample_Provider", CmpiBaseMI::driveBaseCleanup,
-                         CmpiMethodMI::driveInvokeMethod};
-
-CMPIIndicationMIFT indFT = {
-    200, 200, "indicationSample_Provider", CmpiBaseMI::driveBaseCleanup,
-    CmpiIndicationMI::driveAuthorizeFilter, CmpiIndicationMI::driveMustPoll,
-    CmpiIndicationMI::driveActivateFilter, CmpiIndicationMI::driveDeActivateFilter,
-    CmpiIndicationMI::driveEnableIndications, CmpiIndicationMI::driveDisableIndications};
+CMPIInstanceMIFT instFT = cmpiInstanceMIFT("instanceSample_Provider");
+CMPIAssociationMIFT assocFT = cmpiAssociationMIFT("associationSample_Provider");
+CMPIMethodMIFT methFT = cmpiMethodMIFT("methodSample_Provider");
+CMPIIndicationMIFT indFT = cmpiIndicationMIFT("indicationSample_Provider");
 
 } // namespace
 
