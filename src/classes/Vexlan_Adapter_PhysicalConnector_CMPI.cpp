@@ -113,8 +113,8 @@ int slotWithTag(const char* tag)
 void logSameTag(int slot)
 {
     PHYSICAL_DEBUG("Exiting  createPhysicalConnector: Current device has the same the serial number as a device in the "
-             "list at index=%d. Skip!\n",
-             slot);
+                   "list at index=%d. Skip!\n",
+                   slot);
 }
 
 // A NIC function: the transceiver that the NIC adapter list read for the

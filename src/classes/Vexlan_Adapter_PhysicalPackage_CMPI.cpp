@@ -138,8 +138,8 @@ void createFCPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zorap
     const int same = slotWithSerial(list, serial);
     if (same >= 0) {
         PHYSICAL_DEBUG("Exiting  createPhysicalPackage: Current device has the same the serial number as a device in the "
-                 "list at index=%d. Skip!\n",
-                 same);
+                       "list at index=%d. Skip!\n",
+                       same);
         PHYSICAL_DEBUG("Done calling createPhysicalPackage() for FC/FCoE device.");
         ++index;
         return;
@@ -247,8 +247,8 @@ void buildPhysicalPackageList()
                 const int same = slotWithSerial(list, adapterSerial);
                 if (same >= 0) {
                     PHYSICAL_DEBUG("Exiting  createPhysicalPackage: Current device has the same the serial number as a "
-                             "device in the list at index=%d. Skip %s!\n",
-                             same, adapterSerial);
+                                   "device in the list at index=%d. Skip %s!\n",
+                                   same, adapterSerial);
                     continue;
                 }
                 if (protocol->protocolType < 2)

@@ -92,8 +92,8 @@ void buildPhysicalPortList()
                     same = i;
             if (same >= 0) {
                 PHYSICAL_DEBUG("Exiting  createPhysicalPort: Current device has the same the serial number as a device "
-                            "in the list at index=%d. Skip!\n",
-                            same);
+                               "in the list at index=%d. Skip!\n",
+                               same);
                 continue;
             }
             PhysicalPortEntry& entry = list.entries[list.count++];
