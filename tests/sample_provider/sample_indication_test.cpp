@@ -2,7 +2,7 @@
 // host, in both server flavours: delivery while a filter is active, quiet
 // after the last deactivation, and a clean unload with the thread joined
 // whether or not the server called disableIndications first.
-#include "cimhost/host.h"
+#include "sample_host.h"
 
 #include <gtest/gtest.h>
 
@@ -13,31 +13,17 @@
 using cimhost::Flavour;
 using cimhost::Host;
 using cimhost::Indication;
+using sample_test::flavourTestName;
+using sample_test::kNs;
 
 namespace {
 
-std::string flavourTestName(const ::testing::TestParamInfo<Flavour>& param)
-{
-    return cimhost::flavourName(param.param);
-}
-
 using namespace std::chrono_literals;
 
-const char* const kNs = "root/sample";
 const char* const kQuery = "SELECT * FROM Sample_Alert";
 
-class SampleIndications : public ::testing::TestWithParam<Flavour> {
+class SampleIndications : public sample_test::SampleHostTest {
 protected:
-    Host host;
-
-    void SetUp() override
-    {
-        host.setFlavour(GetParam());
-        host.setStrict(true);
-        host.setDefaultNamespace(kNs);
-        ASSERT_TRUE(host.loadMof(SAMPLE_MOF).ok());
-        ASSERT_TRUE(host.load(SAMPLE_PROVIDER_LIB, "Sample_Provider").ok());
-    }
 
     // Takes what has arrived until nothing comes for `quiet` (at most 100).
     int drain(std::chrono::milliseconds quiet)

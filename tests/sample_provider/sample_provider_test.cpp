@@ -4,6 +4,7 @@
 // the provider's lifecycle and what its library exports.
 #include "cimhost/cli.h"
 #include "cimhost/host.h"
+#include "sample_host.h"
 #include "cmpidt.h"
 
 #include <gtest/gtest.h>
@@ -27,15 +28,10 @@ using cimhost::ObjectPath;
 using cimhost::OpResult;
 using cimhost::Type;
 using cimhost::Value;
+using sample_test::flavourTestName;
+using sample_test::kNs;
 
 namespace {
-
-std::string flavourTestName(const ::testing::TestParamInfo<Flavour>& param)
-{
-    return cimhost::flavourName(param.param);
-}
-
-const char* const kNs = "root/sample";
 
 ObjectPath path(const char* cls, const char* key = nullptr, const char* value = nullptr)
 {
@@ -72,20 +68,8 @@ const Value* outArg(const OpResult& r, const char* name)
     return nullptr;
 }
 
-class SampleProvider : public ::testing::TestWithParam<Flavour> {
+class SampleProvider : public sample_test::SampleHostTest {
 protected:
-    Host host;
-
-    void SetUp() override
-    {
-        host.setFlavour(GetParam());
-        host.setStrict(true);
-        host.setDefaultNamespace(kNs);
-        ASSERT_TRUE(host.loadMof(SAMPLE_MOF).ok());
-        cimhost::Status st = host.load(SAMPLE_PROVIDER_LIB, "Sample_Provider");
-        ASSERT_TRUE(st.ok()) << cimhost::statusLine(st);
-    }
-
     // Fails the test when the host's strict check found anything.
     static void expectClean(const OpResult& r)
     {
