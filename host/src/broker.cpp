@@ -748,14 +748,7 @@ CMPIStatus nlAdd(const C* c, const char* name, const CMPIValue* value, CMPIType 
         Value v;
         const CMPIrc r = toValue(value, type, v);
         if (r != CMPI_RC_OK) return r;
-        auto& l = *NamedList<Enc, C>::list(e);
-        for (auto& nv : l) {
-            if (namesEqual(nv.first, name)) {
-                nv.second = std::move(v);
-                return CMPI_RC_OK;
-            }
-        }
-        l.emplace_back(name, std::move(v));
+        setNamed(*NamedList<Enc, C>::list(e), name, std::move(v));
         return CMPI_RC_OK;
     });
 }
@@ -764,11 +757,9 @@ template <class Enc, class C>
 CMPIData nlGet(const C* c, const char* name, CMPIStatus* rc) {
     Enc* e = asNamed<Enc, C>(c);
     return guarded<CMPIData>(rc, e, [&] {
-        for (const auto& nv : *NamedList<Enc, C>::list(e)) {
-            if (name && namesEqual(nv.first, name)) return toData(e->core, nv.second);
-        }
-        setRc(rc, CMPI_RC_ERR_NOT_FOUND);
-        return nullData(CMPI_notFound);
+        const Value* v = name ? findNamed(*NamedList<Enc, C>::list(e), name) : nullptr;
+        if (!v) return setRc(rc, CMPI_RC_ERR_NOT_FOUND), nullData(CMPI_notFound);
+        return toData(e->core, *v);
     });
 }
 

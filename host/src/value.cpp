@@ -272,21 +272,25 @@ bool Value::operator==(const Value& o) const {
 
 bool namesEqual(const std::string& a, const std::string& b) { return strcasecmp(a.c_str(), b.c_str()) == 0; }
 
-const Value* ObjectPath::key(const std::string& name) const {
-    for (const auto& k : keys)
-        if (namesEqual(k.first, name)) return &k.second;
+const Value* findNamed(const std::vector<NamedValue>& list, const std::string& name) {
+    for (const auto& nv : list)
+        if (namesEqual(nv.first, name)) return &nv.second;
     return nullptr;
 }
 
-void ObjectPath::setKey(const std::string& name, Value v) {
-    for (auto& k : keys) {
-        if (namesEqual(k.first, name)) {
-            k.second = std::move(v);
+void setNamed(std::vector<NamedValue>& list, const std::string& name, Value v) {
+    for (auto& nv : list) {
+        if (namesEqual(nv.first, name)) {
+            nv.second = std::move(v);
             return;
         }
     }
-    keys.emplace_back(name, std::move(v));
+    list.emplace_back(name, std::move(v));
 }
+
+const Value* ObjectPath::key(const std::string& name) const { return findNamed(keys, name); }
+
+void ObjectPath::setKey(const std::string& name, Value v) { setNamed(keys, name, std::move(v)); }
 
 bool ObjectPath::operator==(const ObjectPath& o) const {
     if (!namesEqual(className, o.className) || nameSpace != o.nameSpace || host != o.host ||
@@ -299,20 +303,8 @@ bool ObjectPath::operator==(const ObjectPath& o) const {
     return true;
 }
 
-const Value* Instance::property(const std::string& name) const {
-    for (const auto& p : properties)
-        if (namesEqual(p.first, name)) return &p.second;
-    return nullptr;
-}
+const Value* Instance::property(const std::string& name) const { return findNamed(properties, name); }
 
-void Instance::setProperty(const std::string& name, Value v) {
-    for (auto& p : properties) {
-        if (namesEqual(p.first, name)) {
-            p.second = std::move(v);
-            return;
-        }
-    }
-    properties.emplace_back(name, std::move(v));
-}
+void Instance::setProperty(const std::string& name, Value v) { setNamed(properties, name, std::move(v)); }
 
 }  // namespace cimhost

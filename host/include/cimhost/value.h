@@ -104,6 +104,12 @@ using NamedValue = std::pair<std::string, Value>;
 // Case-insensitive comparison of CIM names.
 bool namesEqual(const std::string& a, const std::string& b);
 
+// A list of named values (keys, properties, arguments, context entries):
+// the value of a name, compared case-insensitively, or null; and setting a
+// name, in place when it is there, appended when not.
+const Value* findNamed(const std::vector<NamedValue>& list, const std::string& name);
+void setNamed(std::vector<NamedValue>& list, const std::string& name, Value v);
+
 // A CIM object path: host, namespace, class and keys in the order given.
 struct ObjectPath {
     std::string host;
