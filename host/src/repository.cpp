@@ -409,6 +409,21 @@ bool endsWithMof(const std::string& n) {
     return n.size() > 4 && lower(n.substr(n.size() - 4)) == ".mof";
 }
 
+// The first declaration called `name` in class cls or, failing that, in its
+// nearest superclass; at most 64 levels, so that a loop in the MOF ends.
+template <class Decl>
+const Decl* findInChain(const ClassRepository& repo, std::string cur, const std::string& name,
+                        std::vector<Decl> ClassDecl::*list) {
+    for (int guard = 0; guard < 64 && !cur.empty(); ++guard) {
+        const ClassDecl* c = repo.find(cur);
+        if (!c) return nullptr;
+        for (const auto& d : c->*list)
+            if (namesEqual(d.name, name)) return &d;
+        cur = c->superClass;
+    }
+    return nullptr;
+}
+
 }  // namespace
 
 const ParamDecl* MethodDecl::param(const std::string& n) const {
@@ -532,15 +547,7 @@ std::vector<PropertyDecl> ClassRepository::allProperties(const std::string& cls)
 }
 
 const PropertyDecl* ClassRepository::findProperty(const std::string& cls, const std::string& prop) const {
-    std::string cur = cls;
-    for (int guard = 0; guard < 64 && !cur.empty(); ++guard) {
-        const ClassDecl* c = find(cur);
-        if (!c) return nullptr;
-        for (const auto& p : c->properties)
-            if (namesEqual(p.name, prop)) return &p;
-        cur = c->superClass;
-    }
-    return nullptr;
+    return findInChain(*this, cls, prop, &ClassDecl::properties);
 }
 
 std::vector<std::string> ClassRepository::keyNames(const std::string& cls) const {
@@ -551,15 +558,7 @@ std::vector<std::string> ClassRepository::keyNames(const std::string& cls) const
 }
 
 const MethodDecl* ClassRepository::findMethod(const std::string& cls, const std::string& method) const {
-    std::string cur = cls;
-    for (int guard = 0; guard < 64 && !cur.empty(); ++guard) {
-        const ClassDecl* c = find(cur);
-        if (!c) return nullptr;
-        for (const auto& m : c->methods)
-            if (namesEqual(m.name, method)) return &m;
-        cur = c->superClass;
-    }
-    return nullptr;
+    return findInChain(*this, cls, method, &ClassDecl::methods);
 }
 
 }  // namespace cimhost
