@@ -63,32 +63,38 @@ std::int64_t maxSigned(Type t) {
     }
 }
 
-bool parseUnsigned(const std::string& s, Type t, Value& out) {
-    if (s.empty() || s[0] == '-' || s[0] == '+' || std::isspace(static_cast<unsigned char>(s[0]))) return false;
+// All of s as a number read by parse (a strtoX): no leading space, nothing
+// left over, no range error.
+template <class N, class F>
+bool wholeNumber(const std::string& s, F parse, N& v) {
+    if (s.empty() || std::isspace(static_cast<unsigned char>(s[0]))) return false;
     errno = 0;
     char* end = nullptr;
-    const unsigned long long v = std::strtoull(s.c_str(), &end, 0);
-    if (errno != 0 || !end || *end != '\0' || v > maxOf(t)) return false;
+    v = parse(s.c_str(), &end);
+    return errno == 0 && end && *end == '\0';
+}
+
+bool parseUnsigned(const std::string& s, Type t, Value& out) {
+    if (!s.empty() && (s[0] == '-' || s[0] == '+')) return false;
+    unsigned long long v = 0;
+    if (!wholeNumber(s, [](const char* p, char** e) { return std::strtoull(p, e, 0); }, v) || v > maxOf(t))
+        return false;
     out = Value::fromUnsigned(t, v);
     return true;
 }
 
 bool parseSigned(const std::string& s, Type t, Value& out) {
-    if (s.empty() || std::isspace(static_cast<unsigned char>(s[0]))) return false;
-    errno = 0;
-    char* end = nullptr;
-    const long long v = std::strtoll(s.c_str(), &end, 0);
-    if (errno != 0 || !end || *end != '\0' || v < minOf(t) || v > maxSigned(t)) return false;
+    long long v = 0;
+    if (!wholeNumber(s, [](const char* p, char** e) { return std::strtoll(p, e, 0); }, v) || v < minOf(t) ||
+        v > maxSigned(t))
+        return false;
     out = Value::fromSigned(t, v);
     return true;
 }
 
 bool parseReal(const std::string& s, Type t, Value& out) {
-    if (s.empty() || std::isspace(static_cast<unsigned char>(s[0]))) return false;
-    errno = 0;
-    char* end = nullptr;
-    const double v = std::strtod(s.c_str(), &end);
-    if (errno != 0 || !end || *end != '\0') return false;
+    double v = 0;
+    if (!wholeNumber(s, [](const char* p, char** e) { return std::strtod(p, e); }, v)) return false;
     out = Value::fromReal(t, v);
     return true;
 }
