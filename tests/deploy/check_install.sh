@@ -21,7 +21,7 @@ failures=0
 fail() { echo "FAIL: $*"; failures=$((failures + 1)); }
 
 install_to() {   # install_to DESTDIR PREFIX
-  if ! DESTDIR=$1 cmake --install "$build" --prefix "$2" > "$tmp/install.log" 2>&1; then
+  if ! DESTDIR=$1 "${CMAKE:-cmake}" --install "$build" --prefix "$2" > "$tmp/install.log" 2>&1; then
     cat "$tmp/install.log"; echo "FAIL: cmake --install"; exit 1
   fi
 }
