@@ -170,68 +170,33 @@ Value Value::nullOf(Type t, bool isArray) {
     return v;
 }
 
-Value Value::fromString(std::string s) {
-    Value v;
-    v.type = Type::String;
-    v.null = false;
-    v.s = std::move(s);
-    return v;
-}
+namespace {
 
-Value Value::fromBool(bool b) {
-    Value v;
-    v.type = Type::Boolean;
-    v.null = false;
-    v.b = b;
-    return v;
-}
-
-Value Value::fromUnsigned(Type t, std::uint64_t u) {
+// A non-null scalar of type t whose member `field` holds x.
+template <class M, class X>
+Value scalarValue(Type t, M Value::*field, X&& x) {
     Value v;
     v.type = t;
     v.null = false;
-    v.u = u;
+    v.*field = std::forward<X>(x);
     return v;
 }
 
-Value Value::fromSigned(Type t, std::int64_t i) {
-    Value v;
-    v.type = t;
-    v.null = false;
-    v.i = i;
-    return v;
-}
+}  // namespace
 
-Value Value::fromReal(Type t, double d) {
-    Value v;
-    v.type = t;
-    v.null = false;
-    v.d = d;
-    return v;
-}
-
-Value Value::fromDateTime(const DateTime& dt) {
-    Value v;
-    v.type = Type::DateTime;
-    v.null = false;
-    v.dt = dt;
-    return v;
-}
+Value Value::fromString(std::string s) { return scalarValue(Type::String, &Value::s, std::move(s)); }
+Value Value::fromBool(bool b) { return scalarValue(Type::Boolean, &Value::b, b); }
+Value Value::fromUnsigned(Type t, std::uint64_t u) { return scalarValue(t, &Value::u, u); }
+Value Value::fromSigned(Type t, std::int64_t i) { return scalarValue(t, &Value::i, i); }
+Value Value::fromReal(Type t, double d) { return scalarValue(t, &Value::d, d); }
+Value Value::fromDateTime(const DateTime& dt) { return scalarValue(Type::DateTime, &Value::dt, dt); }
 
 Value Value::fromRef(const ObjectPath& p) {
-    Value v;
-    v.type = Type::Reference;
-    v.null = false;
-    v.ref = std::make_shared<ObjectPath>(p);
-    return v;
+    return scalarValue(Type::Reference, &Value::ref, std::make_shared<ObjectPath>(p));
 }
 
 Value Value::fromInstance(const Instance& i) {
-    Value v;
-    v.type = Type::Instance;
-    v.null = false;
-    v.inst = std::make_shared<Instance>(i);
-    return v;
+    return scalarValue(Type::Instance, &Value::inst, std::make_shared<Instance>(i));
 }
 
 Value Value::arrayOf(Type t, std::vector<Value> elems) {
