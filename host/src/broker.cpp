@@ -183,6 +183,30 @@ void putName(Host::Impl* core, CMPIString** name, const std::string& s) {
     if (name) *name = &newString(core, s)->enc;
 }
 
+// getX(name) and getXAt(index) of a list of named values (keys, properties,
+// arguments, context entries): a name that is not there gives `missing`,
+// an index past the end CMPI_RC_ERR_NO_SUCH_PROPERTY, each with data of
+// state CMPI_notFound. A key's data carries CMPI_keyValue in its state.
+CMPIData namedData(Host::Impl* core, const Value& v, bool key) {
+    CMPIData d = toData(core, v);
+    if (key) d.state = static_cast<CMPIValueState>(d.state | CMPI_keyValue);
+    return d;
+}
+
+CMPIData getNamed(Host::Impl* core, const std::vector<NamedValue>& list, const char* name, CMPIrc missing, bool key,
+                  CMPIStatus* rc) {
+    const Value* v = name ? findNamed(list, name) : nullptr;
+    if (!v) return setRc(rc, missing), nullData(CMPI_notFound);
+    return namedData(core, *v, key);
+}
+
+CMPIData getNamedAt(Host::Impl* core, const std::vector<NamedValue>& list, CMPICount index, CMPIString** name,
+                    bool key, CMPIStatus* rc) {
+    if (index >= list.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
+    putName(core, name, list[index].first);
+    return namedData(core, list[index].second, key);
+}
+
 // What a function returns to the provider when it fails.
 template <class R>
 R failValue() {
@@ -505,29 +529,16 @@ CMPIStatus opAddKey(CMPIObjectPath* op, const char* name, const CMPIValue* value
     });
 }
 
-// A key's data carries CMPI_keyValue in its state.
-CMPIData keyData(Host::Impl* core, const Value& v) {
-    CMPIData d = toData(core, v);
-    d.state = static_cast<CMPIValueState>(d.state | CMPI_keyValue);
-    return d;
-}
-
 CMPIData opGetKey(const CMPIObjectPath* op, const char* name, CMPIStatus* rc) {
     EncPath* e = asPath(op);
     return guarded<CMPIData>(rc, e, [&] {
-        const Value* v = name ? e->p.key(name) : nullptr;
-        if (!v) return setRc(rc, CMPI_RC_ERR_NOT_FOUND), nullData(CMPI_notFound);
-        return keyData(e->core, *v);
+        return getNamed(e->core, e->p.keys, name, CMPI_RC_ERR_NOT_FOUND, true, rc);
     });
 }
 
 CMPIData opGetKeyAt(const CMPIObjectPath* op, CMPICount index, CMPIString** name, CMPIStatus* rc) {
     EncPath* e = asPath(op);
-    return guarded<CMPIData>(rc, e, [&] {
-        if (index >= e->p.keys.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
-        putName(e->core, name, e->p.keys[index].first);
-        return keyData(e->core, e->p.keys[index].second);
-    });
+    return guarded<CMPIData>(rc, e, [&] { return getNamedAt(e->core, e->p.keys, index, name, true, rc); });
 }
 
 CMPICount opKeyCount(const CMPIObjectPath* op, CMPIStatus* rc) {
@@ -632,20 +643,13 @@ CMPIInstance* inClone(const CMPIInstance* i, CMPIStatus* rc) { return cloneOf(as
 CMPIData inGet(const CMPIInstance* i, const char* name, CMPIStatus* rc) {
     EncInstance* e = asInstance(i);
     return guarded<CMPIData>(rc, e, [&] {
-        const Value* v = name ? e->inst.property(name) : nullptr;
-        if (!v) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
-        return toData(e->core, *v);
+        return getNamed(e->core, e->inst.properties, name, CMPI_RC_ERR_NO_SUCH_PROPERTY, false, rc);
     });
 }
 
 CMPIData inGetAt(const CMPIInstance* i, CMPICount index, CMPIString** name, CMPIStatus* rc) {
     EncInstance* e = asInstance(i);
-    return guarded<CMPIData>(rc, e, [&] {
-        if (index >= e->inst.properties.size())
-            return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
-        putName(e->core, name, e->inst.properties[index].first);
-        return toData(e->core, e->inst.properties[index].second);
-    });
+    return guarded<CMPIData>(rc, e, [&] { return getNamedAt(e->core, e->inst.properties, index, name, false, rc); });
 }
 
 CMPICount inCount(const CMPIInstance* i, CMPIStatus* rc) {
@@ -757,9 +761,7 @@ template <class Enc, class C>
 CMPIData nlGet(const C* c, const char* name, CMPIStatus* rc) {
     Enc* e = asNamed<Enc, C>(c);
     return guarded<CMPIData>(rc, e, [&] {
-        const Value* v = name ? findNamed(*NamedList<Enc, C>::list(e), name) : nullptr;
-        if (!v) return setRc(rc, CMPI_RC_ERR_NOT_FOUND), nullData(CMPI_notFound);
-        return toData(e->core, *v);
+        return getNamed(e->core, *NamedList<Enc, C>::list(e), name, CMPI_RC_ERR_NOT_FOUND, false, rc);
     });
 }
 
@@ -767,10 +769,7 @@ template <class Enc, class C>
 CMPIData nlGetAt(const C* c, CMPICount index, CMPIString** name, CMPIStatus* rc) {
     Enc* e = asNamed<Enc, C>(c);
     return guarded<CMPIData>(rc, e, [&] {
-        const auto& l = *NamedList<Enc, C>::list(e);
-        if (index >= l.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
-        putName(e->core, name, l[index].first);
-        return toData(e->core, l[index].second);
+        return getNamedAt(e->core, *NamedList<Enc, C>::list(e), index, name, false, rc);
     });
 }
 
