@@ -14,6 +14,7 @@
 #include <cstring>
 #include <ctime>
 #include <memory>
+#include <tuple>
 #include <type_traits>
 
 #include "cimhost/text.h"
@@ -240,6 +241,32 @@ CMPIStatus guardedStatus(bool handlesOk, F&& body) {
     } catch (...) {
         return mkStatus(CMPI_RC_ERR_FAILED);
     }
+}
+
+// An entry of a function table that the host does not serve: it reports
+// CMPI_RC_ERR_NOT_SUPPORTED, as its status or through its last parameter,
+// and returns the failure value.
+template <class Fn>
+struct NotSupported;
+
+template <class R, class... A>
+struct NotSupported<R (*)(A...)> {
+    static R call(A... args) {
+        if constexpr (std::is_same_v<R, CMPIStatus>) {
+            return mkStatus(CMPI_RC_ERR_NOT_SUPPORTED);
+        } else {
+            constexpr size_t last = sizeof...(A) - 1;
+            static_assert(std::is_same_v<std::tuple_element_t<last, std::tuple<A...>>, CMPIStatus*>,
+                          "the status pointer comes last");
+            setRc(std::get<last>(std::forward_as_tuple(args...)), CMPI_RC_ERR_NOT_SUPPORTED);
+            return failValue<R>();
+        }
+    }
+};
+
+template <class Fn>
+void unsupported(Fn& entry) {
+    entry = NotSupported<Fn>::call;
 }
 
 // A clone copies the whole object and lives until the provider is
@@ -565,22 +592,6 @@ CMPIStatus opSetHostNsFrom(CMPIObjectPath* op, const CMPIObjectPath* src) {
     });
 }
 
-CMPIData opClassQual(const CMPIObjectPath*, const char*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullData();
-}
-CMPIData opPropQual(const CMPIObjectPath*, const char*, const char*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullData();
-}
-CMPIData opMethQual(const CMPIObjectPath*, const char*, const char*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullData();
-}
-CMPIData opParamQual(const CMPIObjectPath*, const char*, const char*, const char*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullData();
-}
 
 CMPIString* opToString(const CMPIObjectPath* op, CMPIStatus* rc) {
     EncPath* e = asPath(op);
@@ -816,10 +827,6 @@ CMPIStatus rsRelease(CMPIResult* r) {
     return mkStatus(CMPI_RC_OK);
 }
 
-CMPIResult* rsClone(const CMPIResult*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
 
 void noteStrict(EncResult* e, const std::string& what) {
     if (e->core->strict) e->sink->strictErrors.push_back(what);
@@ -901,7 +908,6 @@ CMPIStatus rsDone(const CMPIResult* r) {
     });
 }
 
-CMPIStatus rsError(const CMPIResult*, const CMPIError*) { return mkStatus(CMPI_RC_ERR_NOT_SUPPORTED); }
 
 // ---------------------------------------------------------------- CMPISelectExp
 
@@ -926,15 +932,7 @@ CMPIString* seString(const CMPISelectExp* s, CMPIStatus* rc) {
     return guarded<CMPIString*>(rc, e, [&] { return &newString(e->core, e->query)->enc; });
 }
 
-CMPISelectCond* seCond(const CMPISelectExp*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
 
-CMPIBoolean seEvalAccessor(const CMPISelectExp*, CMPIAccessor*, void*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return 0;
-}
 
 // ---------------------------------------------------------------- CMPIBrokerFT
 
@@ -985,71 +983,6 @@ CMPIStatus bDeliver(const CMPIBroker* mb, const CMPIContext*, const char* ns, co
     });
 }
 
-// Up-calls to other providers: the host serves one provider only.
-CMPIEnumeration* bEnumNames(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
-CMPIInstance* bGetInstance(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char**,
-                           CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
-CMPIObjectPath* bCreate(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const CMPIInstance*,
-                        CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
-CMPIStatus bModify(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const CMPIInstance*,
-                   const char**) {
-    return mkStatus(CMPI_RC_ERR_NOT_SUPPORTED);
-}
-CMPIStatus bDelete(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*) {
-    return mkStatus(CMPI_RC_ERR_NOT_SUPPORTED);
-}
-CMPIEnumeration* bExecQuery(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*,
-                            const char*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
-CMPIEnumeration* bEnum(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char**,
-                       CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
-CMPIEnumeration* bAssoc(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*, const char*,
-                        const char*, const char*, const char**, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
-CMPIEnumeration* bAssocNames(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*,
-                             const char*, const char*, const char*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
-CMPIEnumeration* bRefs(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*, const char*,
-                       const char**, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
-CMPIEnumeration* bRefNames(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*,
-                           const char*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
-CMPIData bInvoke(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*, const CMPIArgs*,
-                 CMPIArgs*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullData();
-}
-CMPIStatus bSetProp(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*, const CMPIValue*,
-                    CMPIType) {
-    return mkStatus(CMPI_RC_ERR_NOT_SUPPORTED);
-}
-CMPIData bGetProp(const CMPIBroker*, const CMPIContext*, const CMPIObjectPath*, const char*, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullData();
-}
 
 // ---------------------------------------------------------------- CMPIBrokerEncFT
 
@@ -1224,11 +1157,6 @@ CMPIStatus eTrace(const CMPIBroker* mb, int level, const char* component, const 
     return logLine(mb, "trace", level, component, text, string);
 }
 
-CMPIError* eNewError(const CMPIBroker*, const char*, const char*, const char*, const CMPIErrorSeverity,
-                     const CMPIErrorProbableCause, const CMPIrc, CMPIStatus* rc) {
-    setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    return nullptr;
-}
 
 CMPIStatus eOpenMsgFile(const CMPIBroker*, const char*, CMPIMsgFileHandle* handle) {
     if (handle) *handle = nullptr;
@@ -1433,20 +1361,21 @@ Tables buildTables() {
     t.bft.attachThread = bAttach;
     t.bft.detachThread = bDetach;
     t.bft.deliverIndication = bDeliver;
-    t.bft.enumerateInstanceNames = bEnumNames;
-    t.bft.getInstance = bGetInstance;
-    t.bft.createInstance = bCreate;
-    t.bft.modifyInstance = bModify;
-    t.bft.deleteInstance = bDelete;
-    t.bft.execQuery = bExecQuery;
-    t.bft.enumerateInstances = bEnum;
-    t.bft.associators = bAssoc;
-    t.bft.associatorNames = bAssocNames;
-    t.bft.references = bRefs;
-    t.bft.referenceNames = bRefNames;
-    t.bft.invokeMethod = bInvoke;
-    t.bft.setProperty = bSetProp;
-    t.bft.getProperty = bGetProp;
+    // Up-calls to other providers: the host serves one provider only.
+    unsupported(t.bft.enumerateInstanceNames);
+    unsupported(t.bft.getInstance);
+    unsupported(t.bft.createInstance);
+    unsupported(t.bft.modifyInstance);
+    unsupported(t.bft.deleteInstance);
+    unsupported(t.bft.execQuery);
+    unsupported(t.bft.enumerateInstances);
+    unsupported(t.bft.associators);
+    unsupported(t.bft.associatorNames);
+    unsupported(t.bft.references);
+    unsupported(t.bft.referenceNames);
+    unsupported(t.bft.invokeMethod);
+    unsupported(t.bft.setProperty);
+    unsupported(t.bft.getProperty);
 
     t.eft.ftVersion = 200;
     t.eft.newInstance = eNewInstance;
@@ -1465,7 +1394,7 @@ Tables buildTables() {
     t.eft.getMessage = eGetMessage;
     t.eft.logMessage = eLog;
     t.eft.trace = eTrace;
-    t.eft.newCMPIError = eNewError;
+    unsupported(t.eft.newCMPIError);
     t.eft.openMessageFile = eOpenMsgFile;
     t.eft.closeMessageFile = eCloseMsgFile;
     t.eft.getMessage2 = eGetMessage2;
@@ -1535,10 +1464,10 @@ Tables buildTables() {
     t.pathFT.getKeyCount = opKeyCount;
     t.pathFT.setNameSpaceFromObjectPath = opSetNsFrom;
     t.pathFT.setHostAndNameSpaceFromObjectPath = opSetHostNsFrom;
-    t.pathFT.getClassQualifier = opClassQual;
-    t.pathFT.getPropertyQualifier = opPropQual;
-    t.pathFT.getMethodQualifier = opMethQual;
-    t.pathFT.getParameterQualifier = opParamQual;
+    unsupported(t.pathFT.getClassQualifier);
+    unsupported(t.pathFT.getPropertyQualifier);
+    unsupported(t.pathFT.getMethodQualifier);
+    unsupported(t.pathFT.getParameterQualifier);
     t.pathFT.toString = opToString;
 
     t.arrayFT.ftVersion = 200;
@@ -1586,21 +1515,21 @@ Tables buildTables() {
 
     t.resultFT.ftVersion = 200;
     t.resultFT.release = rsRelease;
-    t.resultFT.clone = rsClone;
+    unsupported(t.resultFT.clone);
     t.resultFT.returnData = rsData;
     t.resultFT.returnInstance = rsInstance;
     t.resultFT.returnObjectPath = rsPath;
     t.resultFT.returnDone = rsDone;
-    t.resultFT.returnError = rsError;
+    unsupported(t.resultFT.returnError);
 
     t.selectFT.ftVersion = 200;
     t.selectFT.release = seRelease;
     t.selectFT.clone = seClone;
     t.selectFT.evaluate = seEvaluate;
     t.selectFT.getString = seString;
-    t.selectFT.getDOC = seCond;
-    t.selectFT.getCOD = seCond;
-    t.selectFT.evaluateUsingAccessor = seEvalAccessor;
+    unsupported(t.selectFT.getDOC);
+    unsupported(t.selectFT.getCOD);
+    unsupported(t.selectFT.evaluateUsingAccessor);
     return t;
 }
 
