@@ -269,6 +269,19 @@ void unsupported(Fn& entry) {
     entry = NotSupported<Fn>::call;
 }
 
+// release() of an encapsulated object, and the broker's free functions for
+// it: the object goes at once instead of with its arena.
+template <auto As, class C>
+CMPIStatus releaseOf(C* c) {
+    releaseObj(As(c));
+    return mkStatus(CMPI_RC_OK);
+}
+
+template <auto As, class C>
+void freeOf(const CMPIBroker*, C* c) {
+    releaseObj(As(c));
+}
+
 // A clone copies the whole object and lives until the provider is
 // unloaded, not with the request.
 template <class Enc>
@@ -484,11 +497,6 @@ namespace {
 
 // ---------------------------------------------------------------- CMPIString
 
-CMPIStatus strRelease(CMPIString* s) {
-    releaseObj(asString(s));
-    return mkStatus(CMPI_RC_OK);
-}
-
 CMPIString* strClone(const CMPIString* s, CMPIStatus* rc) { return cloneOf(asString(s), rc); }
 
 const char* strChars(const CMPIString* s, CMPIStatus* rc) {
@@ -497,11 +505,6 @@ const char* strChars(const CMPIString* s, CMPIStatus* rc) {
 }
 
 // ---------------------------------------------------------------- CMPIDateTime
-
-CMPIStatus dtRelease(CMPIDateTime* d) {
-    releaseObj(asDateTime(d));
-    return mkStatus(CMPI_RC_OK);
-}
 
 CMPIDateTime* dtClone(const CMPIDateTime* d, CMPIStatus* rc) { return cloneOf(asDateTime(d), rc); }
 
@@ -521,11 +524,6 @@ CMPIBoolean dtIsInterval(const CMPIDateTime* d, CMPIStatus* rc) {
 }
 
 // ---------------------------------------------------------------- CMPIObjectPath
-
-CMPIStatus opRelease(CMPIObjectPath* op) {
-    releaseObj(asPath(op));
-    return mkStatus(CMPI_RC_OK);
-}
 
 CMPIObjectPath* opClone(const CMPIObjectPath* op, CMPIStatus* rc) { return cloneOf(asPath(op), rc); }
 
@@ -600,11 +598,6 @@ CMPIString* opToString(const CMPIObjectPath* op, CMPIStatus* rc) {
 
 // ---------------------------------------------------------------- CMPIArray
 
-CMPIStatus arRelease(CMPIArray* a) {
-    releaseObj(asArray(a));
-    return mkStatus(CMPI_RC_OK);
-}
-
 CMPIArray* arClone(const CMPIArray* a, CMPIStatus* rc) { return cloneOf(asArray(a), rc); }
 
 CMPICount arSize(const CMPIArray* a, CMPIStatus* rc) {
@@ -643,11 +636,6 @@ CMPIStatus arSet(CMPIArray* a, CMPICount index, const CMPIValue* value, CMPIType
 }
 
 // ---------------------------------------------------------------- CMPIInstance
-
-CMPIStatus inRelease(CMPIInstance* i) {
-    releaseObj(asInstance(i));
-    return mkStatus(CMPI_RC_OK);
-}
 
 CMPIInstance* inClone(const CMPIInstance* i, CMPIStatus* rc) { return cloneOf(asInstance(i), rc); }
 
@@ -745,12 +733,6 @@ template <>
 EncContext* asNamed<EncContext, CMPIContext>(const CMPIContext* c) { return asContext(c); }
 
 template <class Enc, class C>
-CMPIStatus nlRelease(C* c) {
-    releaseObj(asNamed<Enc, C>(c));
-    return mkStatus(CMPI_RC_OK);
-}
-
-template <class Enc, class C>
 C* nlClone(const C* c, CMPIStatus* rc) {
     return cloneOf(asNamed<Enc, C>(c), rc);
 }
@@ -792,11 +774,6 @@ CMPICount nlCount(const C* c, CMPIStatus* rc) {
 
 // ---------------------------------------------------------------- CMPIEnumeration
 
-CMPIStatus enRelease(CMPIEnumeration* en) {
-    releaseObj(asEnum(en));
-    return mkStatus(CMPI_RC_OK);
-}
-
 CMPIEnumeration* enClone(const CMPIEnumeration* en, CMPIStatus* rc) { return cloneOf(asEnum(en), rc); }
 
 CMPIData enNext(const CMPIEnumeration* en, CMPIStatus* rc) {
@@ -821,11 +798,6 @@ CMPIArray* enToArray(const CMPIEnumeration* en, CMPIStatus* rc) {
 }
 
 // ---------------------------------------------------------------- CMPIResult
-
-CMPIStatus rsRelease(CMPIResult* r) {
-    releaseObj(asResult(r));
-    return mkStatus(CMPI_RC_OK);
-}
 
 
 void noteStrict(EncResult* e, const std::string& what) {
@@ -910,11 +882,6 @@ CMPIStatus rsDone(const CMPIResult* r) {
 
 
 // ---------------------------------------------------------------- CMPISelectExp
-
-CMPIStatus seRelease(CMPISelectExp* s) {
-    releaseObj(asSelect(s));
-    return mkStatus(CMPI_RC_OK);
-}
 
 CMPISelectExp* seClone(const CMPISelectExp* s, CMPIStatus* rc) { return cloneOf(asSelect(s), rc); }
 
@@ -1342,13 +1309,6 @@ void mFree(const CMPIBroker* mb, void* ptr) {
     std::free(ptr);
 }
 
-void mFreeInstance(const CMPIBroker*, CMPIInstance* i) { releaseObj(asInstance(i)); }
-void mFreePath(const CMPIBroker*, CMPIObjectPath* p) { releaseObj(asPath(p)); }
-void mFreeArgs(const CMPIBroker*, CMPIArgs* a) { releaseObj(asArgs(a)); }
-void mFreeString(const CMPIBroker*, CMPIString* s) { releaseObj(asString(s)); }
-void mFreeArray(const CMPIBroker*, CMPIArray* a) { releaseObj(asArray(a)); }
-void mFreeDateTime(const CMPIBroker*, CMPIDateTime* d) { releaseObj(asDateTime(d)); }
-void mFreeSelectExp(const CMPIBroker*, CMPISelectExp* s) { releaseObj(asSelect(s)); }
 
 Tables buildTables() {
     Tables t;
@@ -1429,28 +1389,28 @@ Tables buildTables() {
     t.mft.cmpiRealloc = mRealloc;
     t.mft.cmpiStrDup = mStrDup;
     t.mft.cmpiFree = mFree;
-    t.mft.freeInstance = mFreeInstance;
-    t.mft.freeObjectPath = mFreePath;
-    t.mft.freeArgs = mFreeArgs;
-    t.mft.freeString = mFreeString;
-    t.mft.freeArray = mFreeArray;
-    t.mft.freeDateTime = mFreeDateTime;
-    t.mft.freeSelectExp = mFreeSelectExp;
+    t.mft.freeInstance = freeOf<asInstance>;
+    t.mft.freeObjectPath = freeOf<asPath>;
+    t.mft.freeArgs = freeOf<asArgs>;
+    t.mft.freeString = freeOf<asString>;
+    t.mft.freeArray = freeOf<asArray>;
+    t.mft.freeDateTime = freeOf<asDateTime>;
+    t.mft.freeSelectExp = freeOf<asSelect>;
 
     t.stringFT.ftVersion = 200;
-    t.stringFT.release = strRelease;
+    t.stringFT.release = releaseOf<asString>;
     t.stringFT.clone = strClone;
     t.stringFT.getCharPtr = strChars;
 
     t.dateTimeFT.ftVersion = 200;
-    t.dateTimeFT.release = dtRelease;
+    t.dateTimeFT.release = releaseOf<asDateTime>;
     t.dateTimeFT.clone = dtClone;
     t.dateTimeFT.getBinaryFormat = dtBinary;
     t.dateTimeFT.getStringFormat = dtText;
     t.dateTimeFT.isInterval = dtIsInterval;
 
     t.pathFT.ftVersion = 200;
-    t.pathFT.release = opRelease;
+    t.pathFT.release = releaseOf<asPath>;
     t.pathFT.clone = opClone;
     t.pathFT.setNameSpace = opSetText<&ObjectPath::nameSpace>;
     t.pathFT.getNameSpace = opGetText<&ObjectPath::nameSpace>;
@@ -1471,7 +1431,7 @@ Tables buildTables() {
     t.pathFT.toString = opToString;
 
     t.arrayFT.ftVersion = 200;
-    t.arrayFT.release = arRelease;
+    t.arrayFT.release = releaseOf<asArray>;
     t.arrayFT.clone = arClone;
     t.arrayFT.getSize = arSize;
     t.arrayFT.getSimpleType = arType;
@@ -1479,7 +1439,7 @@ Tables buildTables() {
     t.arrayFT.setElementAt = arSet;
 
     t.instanceFT.ftVersion = 200;
-    t.instanceFT.release = inRelease;
+    t.instanceFT.release = releaseOf<asInstance>;
     t.instanceFT.clone = inClone;
     t.instanceFT.getProperty = inGet;
     t.instanceFT.getPropertyAt = inGetAt;
@@ -1491,7 +1451,7 @@ Tables buildTables() {
     t.instanceFT.setPropertyWithOrigin = inSetWithOrigin;
 
     t.argsFT.ftVersion = 200;
-    t.argsFT.release = nlRelease<EncArgs, CMPIArgs>;
+    t.argsFT.release = releaseOf<asArgs>;
     t.argsFT.clone = nlClone<EncArgs, CMPIArgs>;
     t.argsFT.addArg = nlAdd<EncArgs, CMPIArgs>;
     t.argsFT.getArg = nlGet<EncArgs, CMPIArgs>;
@@ -1499,7 +1459,7 @@ Tables buildTables() {
     t.argsFT.getArgCount = nlCount<EncArgs, CMPIArgs>;
 
     t.contextFT.ftVersion = 200;
-    t.contextFT.release = nlRelease<EncContext, CMPIContext>;
+    t.contextFT.release = releaseOf<asContext>;
     t.contextFT.clone = nlClone<EncContext, CMPIContext>;
     t.contextFT.getEntry = nlGet<EncContext, CMPIContext>;
     t.contextFT.getEntryAt = nlGetAt<EncContext, CMPIContext>;
@@ -1507,14 +1467,14 @@ Tables buildTables() {
     t.contextFT.addEntry = nlAdd<EncContext, CMPIContext>;
 
     t.enumFT.ftVersion = 200;
-    t.enumFT.release = enRelease;
+    t.enumFT.release = releaseOf<asEnum>;
     t.enumFT.clone = enClone;
     t.enumFT.getNext = enNext;
     t.enumFT.hasNext = enHasNext;
     t.enumFT.toArray = enToArray;
 
     t.resultFT.ftVersion = 200;
-    t.resultFT.release = rsRelease;
+    t.resultFT.release = releaseOf<asResult>;
     unsupported(t.resultFT.clone);
     t.resultFT.returnData = rsData;
     t.resultFT.returnInstance = rsInstance;
@@ -1523,7 +1483,7 @@ Tables buildTables() {
     unsupported(t.resultFT.returnError);
 
     t.selectFT.ftVersion = 200;
-    t.selectFT.release = seRelease;
+    t.selectFT.release = releaseOf<asSelect>;
     t.selectFT.clone = seClone;
     t.selectFT.evaluate = seEvaluate;
     t.selectFT.getString = seString;
