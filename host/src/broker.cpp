@@ -184,30 +184,6 @@ void putName(Host::Impl* core, CMPIString** name, const std::string& s) {
     if (name) *name = &newString(core, s)->enc;
 }
 
-// getX(name) and getXAt(index) of a list of named values (keys, properties,
-// arguments, context entries): a name that is not there gives `missing`,
-// an index past the end CMPI_RC_ERR_NO_SUCH_PROPERTY, each with data of
-// state CMPI_notFound. A key's data carries CMPI_keyValue in its state.
-CMPIData namedData(Host::Impl* core, const Value& v, bool key) {
-    CMPIData d = toData(core, v);
-    if (key) d.state = static_cast<CMPIValueState>(d.state | CMPI_keyValue);
-    return d;
-}
-
-CMPIData getNamed(Host::Impl* core, const std::vector<NamedValue>& list, const char* name, CMPIrc missing, bool key,
-                  CMPIStatus* rc) {
-    const Value* v = name ? findNamed(list, name) : nullptr;
-    if (!v) return setRc(rc, missing), nullData(CMPI_notFound);
-    return namedData(core, *v, key);
-}
-
-CMPIData getNamedAt(Host::Impl* core, const std::vector<NamedValue>& list, CMPICount index, CMPIString** name,
-                    bool key, CMPIStatus* rc) {
-    if (index >= list.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
-    putName(core, name, list[index].first);
-    return namedData(core, list[index].second, key);
-}
-
 // What a function returns to the provider when it fails.
 template <class R>
 R failValue() {
@@ -554,23 +530,6 @@ CMPIStatus opAddKey(CMPIObjectPath* op, const char* name, const CMPIValue* value
     });
 }
 
-CMPIData opGetKey(const CMPIObjectPath* op, const char* name, CMPIStatus* rc) {
-    EncPath* e = asPath(op);
-    return guarded<CMPIData>(rc, e, [&] {
-        return getNamed(e->core, e->p.keys, name, CMPI_RC_ERR_NOT_FOUND, true, rc);
-    });
-}
-
-CMPIData opGetKeyAt(const CMPIObjectPath* op, CMPICount index, CMPIString** name, CMPIStatus* rc) {
-    EncPath* e = asPath(op);
-    return guarded<CMPIData>(rc, e, [&] { return getNamedAt(e->core, e->p.keys, index, name, true, rc); });
-}
-
-CMPICount opKeyCount(const CMPIObjectPath* op, CMPIStatus* rc) {
-    EncPath* e = asPath(op);
-    return guarded<CMPICount>(rc, e, [&] { return static_cast<CMPICount>(e->p.keys.size()); });
-}
-
 CMPIStatus opSetNsFrom(CMPIObjectPath* op, const CMPIObjectPath* src) {
     EncPath* e = asPath(op);
     EncPath* s = asPath(src);
@@ -639,23 +598,6 @@ CMPIStatus arSet(CMPIArray* a, CMPICount index, const CMPIValue* value, CMPIType
 
 CMPIInstance* inClone(const CMPIInstance* i, CMPIStatus* rc) { return cloneOf(asInstance(i), rc); }
 
-CMPIData inGet(const CMPIInstance* i, const char* name, CMPIStatus* rc) {
-    EncInstance* e = asInstance(i);
-    return guarded<CMPIData>(rc, e, [&] {
-        return getNamed(e->core, e->inst.properties, name, CMPI_RC_ERR_NO_SUCH_PROPERTY, false, rc);
-    });
-}
-
-CMPIData inGetAt(const CMPIInstance* i, CMPICount index, CMPIString** name, CMPIStatus* rc) {
-    EncInstance* e = asInstance(i);
-    return guarded<CMPIData>(rc, e, [&] { return getNamedAt(e->core, e->inst.properties, index, name, false, rc); });
-}
-
-CMPICount inCount(const CMPIInstance* i, CMPIStatus* rc) {
-    EncInstance* e = asInstance(i);
-    return guarded<CMPICount>(rc, e, [&] { return static_cast<CMPICount>(e->inst.properties.size()); });
-}
-
 CMPIStatus inSet(const CMPIInstance* i, const char* name, const CMPIValue* value, CMPIType type) {
     EncInstance* e = asInstance(i);
     return guardedStatus(e, [&] {
@@ -713,63 +655,100 @@ CMPIStatus inSetPath(CMPIInstance* i, const CMPIObjectPath* op) {
     });
 }
 
-// ---------------------------------------------------------------- CMPIArgs and CMPIContext
+// ---------------------------------------------------------------- named values
 
-// Both hold a list of named values; one set of functions serves both.
-template <class Enc, class C>
-struct NamedList {
-    static std::vector<NamedValue>* list(Enc* e);
+// The keys of a path, the properties of an instance, the arguments and the
+// context entries: lists of named values that one set of functions serves.
+// Named<Enc> says which list a type holds, what a name that is not there
+// reports, and whether the values are keys.
+template <class Enc>
+struct Named;
+template <>
+struct Named<EncPath> {
+    static std::vector<NamedValue>& list(EncPath* e) { return e->p.keys; }
+    static constexpr CMPIrc missing = CMPI_RC_ERR_NOT_FOUND;
+    static constexpr bool keys = true;
 };
 template <>
-std::vector<NamedValue>* NamedList<EncArgs, CMPIArgs>::list(EncArgs* e) { return &e->args; }
+struct Named<EncInstance> {
+    static std::vector<NamedValue>& list(EncInstance* e) { return e->inst.properties; }
+    static constexpr CMPIrc missing = CMPI_RC_ERR_NO_SUCH_PROPERTY;
+    static constexpr bool keys = false;
+};
 template <>
-std::vector<NamedValue>* NamedList<EncContext, CMPIContext>::list(EncContext* e) { return &e->entries; }
+struct Named<EncArgs> {
+    static std::vector<NamedValue>& list(EncArgs* e) { return e->args; }
+    static constexpr CMPIrc missing = CMPI_RC_ERR_NOT_FOUND;
+    static constexpr bool keys = false;
+};
+template <>
+struct Named<EncContext> {
+    static std::vector<NamedValue>& list(EncContext* e) { return e->entries; }
+    static constexpr CMPIrc missing = CMPI_RC_ERR_NOT_FOUND;
+    static constexpr bool keys = false;
+};
 
-template <class Enc, class C>
-Enc* asNamed(const C* c);
-template <>
-EncArgs* asNamed<EncArgs, CMPIArgs>(const CMPIArgs* c) { return asArgs(c); }
-template <>
-EncContext* asNamed<EncContext, CMPIContext>(const CMPIContext* c) { return asContext(c); }
-
-template <class Enc, class C>
-C* nlClone(const C* c, CMPIStatus* rc) {
-    return cloneOf(asNamed<Enc, C>(c), rc);
+// getX(name) and getXAt(index): a name that is not there gives `missing`,
+// an index past the end CMPI_RC_ERR_NO_SUCH_PROPERTY, each with data of
+// state CMPI_notFound. A key's data carries CMPI_keyValue in its state.
+CMPIData namedData(Host::Impl* core, const Value& v, bool key) {
+    CMPIData d = toData(core, v);
+    if (key) d.state = static_cast<CMPIValueState>(d.state | CMPI_keyValue);
+    return d;
 }
 
-template <class Enc, class C>
+CMPIData getNamed(Host::Impl* core, const std::vector<NamedValue>& list, const char* name, CMPIrc missing, bool key,
+                  CMPIStatus* rc) {
+    const Value* v = name ? findNamed(list, name) : nullptr;
+    if (!v) return setRc(rc, missing), nullData(CMPI_notFound);
+    return namedData(core, *v, key);
+}
+
+CMPIData getNamedAt(Host::Impl* core, const std::vector<NamedValue>& list, CMPICount index, CMPIString** name,
+                    bool key, CMPIStatus* rc) {
+    if (index >= list.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_notFound);
+    putName(core, name, list[index].first);
+    return namedData(core, list[index].second, key);
+}
+
+template <auto As, class C>
+C* nlClone(const C* c, CMPIStatus* rc) {
+    return cloneOf(As(c), rc);
+}
+
+// addArg and addEntry: a name that is there is set in place.
+template <auto As, class C>
 CMPIStatus nlAdd(const C* c, const char* name, const CMPIValue* value, CMPIType type) {
-    Enc* e = asNamed<Enc, C>(c);
+    auto* e = As(c);
     return guardedStatus(e, [&] {
         if (!name || !*name) return CMPI_RC_ERR_INVALID_PARAMETER;
         Value v;
         const CMPIrc r = toValue(value, type, v);
         if (r != CMPI_RC_OK) return r;
-        setNamed(*NamedList<Enc, C>::list(e), name, std::move(v));
+        setNamed(Named<std::remove_pointer_t<decltype(e)>>::list(e), name, std::move(v));
         return CMPI_RC_OK;
     });
 }
 
-template <class Enc, class C>
+template <auto As, class C>
 CMPIData nlGet(const C* c, const char* name, CMPIStatus* rc) {
-    Enc* e = asNamed<Enc, C>(c);
-    return guarded<CMPIData>(rc, e, [&] {
-        return getNamed(e->core, *NamedList<Enc, C>::list(e), name, CMPI_RC_ERR_NOT_FOUND, false, rc);
-    });
+    auto* e = As(c);
+    using N = Named<std::remove_pointer_t<decltype(e)>>;
+    return guarded<CMPIData>(rc, e, [&] { return getNamed(e->core, N::list(e), name, N::missing, N::keys, rc); });
 }
 
-template <class Enc, class C>
+template <auto As, class C>
 CMPIData nlGetAt(const C* c, CMPICount index, CMPIString** name, CMPIStatus* rc) {
-    Enc* e = asNamed<Enc, C>(c);
-    return guarded<CMPIData>(rc, e, [&] {
-        return getNamedAt(e->core, *NamedList<Enc, C>::list(e), index, name, false, rc);
-    });
+    auto* e = As(c);
+    using N = Named<std::remove_pointer_t<decltype(e)>>;
+    return guarded<CMPIData>(rc, e, [&] { return getNamedAt(e->core, N::list(e), index, name, N::keys, rc); });
 }
 
-template <class Enc, class C>
+template <auto As, class C>
 CMPICount nlCount(const C* c, CMPIStatus* rc) {
-    Enc* e = asNamed<Enc, C>(c);
-    return guarded<CMPICount>(rc, e, [&] { return static_cast<CMPICount>(NamedList<Enc, C>::list(e)->size()); });
+    auto* e = As(c);
+    using N = Named<std::remove_pointer_t<decltype(e)>>;
+    return guarded<CMPICount>(rc, e, [&] { return static_cast<CMPICount>(N::list(e).size()); });
 }
 
 // ---------------------------------------------------------------- CMPIEnumeration
@@ -1419,9 +1398,9 @@ Tables buildTables() {
     t.pathFT.setClassName = opSetText<&ObjectPath::className>;
     t.pathFT.getClassName = opGetText<&ObjectPath::className>;
     t.pathFT.addKey = opAddKey;
-    t.pathFT.getKey = opGetKey;
-    t.pathFT.getKeyAt = opGetKeyAt;
-    t.pathFT.getKeyCount = opKeyCount;
+    t.pathFT.getKey = nlGet<asPath>;
+    t.pathFT.getKeyAt = nlGetAt<asPath>;
+    t.pathFT.getKeyCount = nlCount<asPath>;
     t.pathFT.setNameSpaceFromObjectPath = opSetNsFrom;
     t.pathFT.setHostAndNameSpaceFromObjectPath = opSetHostNsFrom;
     unsupported(t.pathFT.getClassQualifier);
@@ -1441,9 +1420,9 @@ Tables buildTables() {
     t.instanceFT.ftVersion = 200;
     t.instanceFT.release = releaseOf<asInstance>;
     t.instanceFT.clone = inClone;
-    t.instanceFT.getProperty = inGet;
-    t.instanceFT.getPropertyAt = inGetAt;
-    t.instanceFT.getPropertyCount = inCount;
+    t.instanceFT.getProperty = nlGet<asInstance>;
+    t.instanceFT.getPropertyAt = nlGetAt<asInstance>;
+    t.instanceFT.getPropertyCount = nlCount<asInstance>;
     t.instanceFT.setProperty = inSet;
     t.instanceFT.getObjectPath = inPath;
     t.instanceFT.setPropertyFilter = inSetFilter;
@@ -1452,19 +1431,19 @@ Tables buildTables() {
 
     t.argsFT.ftVersion = 200;
     t.argsFT.release = releaseOf<asArgs>;
-    t.argsFT.clone = nlClone<EncArgs, CMPIArgs>;
-    t.argsFT.addArg = nlAdd<EncArgs, CMPIArgs>;
-    t.argsFT.getArg = nlGet<EncArgs, CMPIArgs>;
-    t.argsFT.getArgAt = nlGetAt<EncArgs, CMPIArgs>;
-    t.argsFT.getArgCount = nlCount<EncArgs, CMPIArgs>;
+    t.argsFT.clone = nlClone<asArgs>;
+    t.argsFT.addArg = nlAdd<asArgs>;
+    t.argsFT.getArg = nlGet<asArgs>;
+    t.argsFT.getArgAt = nlGetAt<asArgs>;
+    t.argsFT.getArgCount = nlCount<asArgs>;
 
     t.contextFT.ftVersion = 200;
     t.contextFT.release = releaseOf<asContext>;
-    t.contextFT.clone = nlClone<EncContext, CMPIContext>;
-    t.contextFT.getEntry = nlGet<EncContext, CMPIContext>;
-    t.contextFT.getEntryAt = nlGetAt<EncContext, CMPIContext>;
-    t.contextFT.getEntryCount = nlCount<EncContext, CMPIContext>;
-    t.contextFT.addEntry = nlAdd<EncContext, CMPIContext>;
+    t.contextFT.clone = nlClone<asContext>;
+    t.contextFT.getEntry = nlGet<asContext>;
+    t.contextFT.getEntryAt = nlGetAt<asContext>;
+    t.contextFT.getEntryCount = nlCount<asContext>;
+    t.contextFT.addEntry = nlAdd<asContext>;
 
     t.enumFT.ftVersion = 200;
     t.enumFT.release = releaseOf<asEnum>;
