@@ -27,15 +27,18 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <initializer_list>
 #include <new>
 #include <strings.h>
 #include <optional>
 #include <string>
 #include <type_traits>
+#include <utility>
 #include <vector>
 
 #include "CmpiImpl.h"
+#include "inventory/AdapterWalk.h"
 #include "zorap_cna.h"
 
 // ---------------------------------------------------------------------------
@@ -149,24 +152,74 @@ void checkType(const char* name, CMPIType declared, const CmpiData& value);
 template <class Visit>
 bool walkProtocols(Visit&& visit)
 {
-    _zorap_adapter_list_t* adapters = ZORAP_GetAdapterList();
-    if (adapters == nullptr)
-        return false;
-    for (_zorap_adapter_t* adapter = adapters->firstAdapter; adapter != nullptr; adapter = adapter->next) {
-        if (adapter->phyPortList == nullptr)
-            continue;
-        for (_zorap_phy_port_t* phy = adapter->phyPortList->firstPhyPort; phy != nullptr; phy = phy->next) {
-            if (phy->protocolList == nullptr)
-                continue;
-            for (_zorap_protocol_t* protocol = phy->protocolList->firstProtocol; protocol != nullptr;
-                 protocol = protocol->next)
-                visit(adapter, phy, protocol);
-        }
-    }
-    return true;
+    return forEachProtocol(std::forward<Visit>(visit));
 }
 
 void buildLine(bool entering, const char* stem, int index);
+
+// The start of a build of one slot per adapter or per physical port: the
+// library's adapter list, with `list` holding that many zeroed slots,
+// `capacity` their number and the list's count 0 for a dense fill. Null when
+// the library gives no adapter list (the list untouched) or there is nothing
+// to allocate.
+enum class SlotPer { Adapter, PhyPort };
+template <class Entry>
+_zorap_adapter_list_t* startBuild(ClassList<Entry>& list, SlotPer per, int& capacity)
+{
+    _zorap_adapter_list_t* adapters = ZORAP_GetAdapterList();
+    if (adapters == nullptr)
+        return nullptr;
+    capacity = 0;
+    if (per == SlotPer::Adapter) {
+        for (_zorap_adapter_t* a = adapters->firstAdapter; a != nullptr; a = a->next)
+            ++capacity;
+    } else {
+        forEachPhyPortIn(adapters, [&](_zorap_adapter_t*, _zorap_phy_port_t*) { ++capacity; });
+    }
+    if (!list.allocate(capacity))
+        return nullptr;
+    list.count = 0;
+    return adapters;
+}
+
+// The indexed operations on a slot that a lookup found; no slot (-1) gives a
+// null handle (isNull()).
+inline CmpiObjectPath pathOfSlot(CmpiObjectPath (*makePath)(const char*, const char*, int), int slot,
+                                 const char* className, const char* nameSpace)
+{
+    if (slot < 0)
+        return CmpiObjectPath(static_cast<CMPIObjectPath*>(nullptr));
+    return makePath(className, nameSpace, slot);
+}
+
+inline CmpiInstance instanceOfSlot(CmpiInstance (*makeInstance)(const char*, const char*, const char**, int),
+                                   int slot, const char* className, const char* nameSpace, const char** properties)
+{
+    if (slot < 0)
+        return CmpiInstance(static_cast<CMPIInstance*>(nullptr));
+    return makeInstance(className, nameSpace, properties, slot);
+}
+
+// The end of a dense build: the count is the number of valid slots.
+template <class Entry>
+void countValid(ClassList<Entry>& list)
+{
+    int valid = 0;
+    for (int i = 0; i < list.count; ++i)
+        if (list.entries[i].valid)
+            ++valid;
+    list.count = valid;
+}
+
+// The first slot below the list's count whose `tag` is `tag`, or -1.
+template <class Entry>
+int slotWithTag(const ClassList<Entry>& list, const char* tag)
+{
+    for (int i = 0; i < list.count; ++i)
+        if (std::strcmp(list.entries[i].tag, tag) == 0)
+            return i;
+    return -1;
+}
 
 }  // namespace classmodule
 

@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <cstring>
 
+#include "inventory/AdapterWalk.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 _CNAStruc* m_CNAList = nullptr;
@@ -89,22 +90,10 @@ void Initialize_CNA_List()
 {
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("Entered Initialize_CNA_List()");
-    _zorap_adapter_list_t* adapters = ZORAP_GetAdapterList();
-    if (adapters != nullptr) {
-        for (_zorap_adapter_t* adapter = adapters->firstAdapter; adapter != nullptr; adapter = adapter->next) {
-            if (adapter->phyPortList == nullptr)
-                continue;
-            for (_zorap_phy_port_t* phy = adapter->phyPortList->firstPhyPort; phy != nullptr; phy = phy->next) {
-                if (phy->protocolList == nullptr)
-                    continue;
-                for (_zorap_protocol_t* protocol = phy->protocolList->firstProtocol; protocol != nullptr;
-                     protocol = protocol->next) {
-                    if (protocol->protocolType == ZORAP_PROTOCOL_NIC)
-                        addNicProtocol(protocol);
-                }
-            }
-        }
-    }
+    forEachProtocol([](_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* protocol) {
+        if (protocol->protocolType == ZORAP_PROTOCOL_NIC)
+            addNicProtocol(protocol);
+    });
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("Exiting Initialize_CNA_List()");
 }
