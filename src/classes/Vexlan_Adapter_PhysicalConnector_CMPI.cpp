@@ -21,26 +21,30 @@ void CreatePhysicalConnectorTag(char* out, char* transceiverSerial, char* adapte
                   adapterSerial != nullptr ? adapterSerial : "", portNumber);
 }
 
-int ParsePhysicalConnectorTag(char* tag, char* transceiverSerial, char* adapterSerial, int* portNumber)
+int SplitPhysicalTag(const char* tag, char* const* texts, int textCount, int* portNumber)
 {
-    if (tag == nullptr || transceiverSerial == nullptr || adapterSerial == nullptr || portNumber == nullptr)
-        return 0;
     char work[256] = {};
     std::snprintf(work, sizeof(work), "%s", tag);
     char* rest = nullptr;
     char* part = strtok_r(work, "_", &rest);
-    if (part == nullptr)
-        return 0;
-    std::snprintf(transceiverSerial, kPhysicalTagPartSize, "%s", part);
-    part = strtok_r(nullptr, "_", &rest);
-    if (part == nullptr)
-        return 0;
-    std::snprintf(adapterSerial, kPhysicalTagPartSize, "%s", part);
-    part = strtok_r(nullptr, "_", &rest);
+    for (int i = 0; i < textCount; ++i) {
+        if (part == nullptr)
+            return 0;
+        std::snprintf(texts[i], kPhysicalTagPartSize, "%s", part);
+        part = strtok_r(nullptr, "_", &rest);
+    }
     if (part == nullptr)
         return 0;
     *portNumber = static_cast<int>(std::strtol(part, nullptr, 10));
     return 1;
+}
+
+int ParsePhysicalConnectorTag(char* tag, char* transceiverSerial, char* adapterSerial, int* portNumber)
+{
+    if (tag == nullptr || transceiverSerial == nullptr || adapterSerial == nullptr || portNumber == nullptr)
+        return 0;
+    char* const texts[] = {transceiverSerial, adapterSerial};
+    return SplitPhysicalTag(tag, texts, 2, portNumber);
 }
 
 int getZORAPStructs(_CNAStruc*, _CNAPortStruc* port, _zorap_adapter_t** adapter, _zorap_phy_port_t** phyPort,
@@ -101,15 +105,6 @@ int calcTag_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port, char* out)
 // ---------------------------------------------------------------------------
 namespace {
 
-// The slot below `count` with this tag, or -1.
-int slotWithTag(const char* tag)
-{
-    for (int i = 0; i < g_PhysicalConnectorList.count; ++i)
-        if (std::strcmp(g_PhysicalConnectorList.entries[i].tag, tag) == 0)
-            return i;
-    return -1;
-}
-
 void logSameTag(int slot)
 {
     PHYSICAL_DEBUG("Exiting  createPhysicalConnector: Current device has the same the serial number as a device in the "
@@ -140,7 +135,7 @@ void createNicConnector(_zorap_adapter_t* adapter, _zorap_phy_port_t* phy, _zora
         return;
     char tag[kPhysicalTagSize];
     nicConnectorTag(tag, found, adapter, phy);
-    const int same = slotWithTag(tag);
+    const int same = classmodule::slotWithTag(g_PhysicalConnectorList, tag);
     if (same >= 0) {
         logSameTag(same);
         return;
@@ -188,7 +183,7 @@ void createFCConnector(_zorap_adapter_t* adapter, _zorap_phy_port_t* phy, _tagZO
     copyFieldText(adapterSerial, adapter->serialNumber);
     char tag[kPhysicalTagSize];
     CreatePhysicalConnectorTag(tag, fields.SerialNumber, adapterSerial, phy->portNumber);
-    const int same = slotWithTag(tag);
+    const int same = classmodule::slotWithTag(g_PhysicalConnectorList, tag);
     if (same >= 0) {
         logSameTag(same);
         return;
@@ -225,11 +220,7 @@ void buildPhysicalConnectorList()
         else if (pr->protocolType < 2 && pr->fcDevice.transceiverSupport == 1)
             createFCConnector(a, p, &pr->fcDevice, n);
     });
-    int valid = 0;
-    for (int i = 0; i < list.count; ++i)
-        if (list.entries[i].valid)
-            ++valid;
-    list.count = valid;
+    classmodule::countValid(list);
 }
 
 void removePhysicalConnectorList()
@@ -289,30 +280,19 @@ VEXLAN_LIST_CLASS_OPERATIONS(PhysicalConnector, kPhysicalConnector)
 // ---------------------------------------------------------------------------
 int findSlot_Nic_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port)
 {
-    for (int i = 0; i < g_PhysicalConnectorList.count; ++i) {
-        char tag[kPhysicalTagSize];
-        calcTag_PhysicalConnector(cna, port, tag);
-        if (std::strcmp(tag, g_PhysicalConnectorList.entries[i].tag) == 0)
-            return i;
-    }
-    return -1;
+    return findNicTagSlot(g_PhysicalConnectorList, calcTag_PhysicalConnector, cna, port);
 }
 
 CmpiObjectPath makePath_Nic_PhysicalConnector(const char* className, const char* nameSpace, _CNAStruc* cna,
                                               _CNAPortStruc* port)
 {
     PHYSICAL_DEBUG("Vexlan_NIC_PhysicalConnector makePath_PhysicalConnector was called\n");
-    const int slot = findSlot_Nic_PhysicalConnector(cna, port);
-    if (slot < 0)
-        return CmpiObjectPath(static_cast<CMPIObjectPath*>(nullptr));
-    return makePath_PhysicalConnector(className, nameSpace, slot);
+    return classmodule::pathOfSlot(makePath_PhysicalConnector, findSlot_Nic_PhysicalConnector(cna, port), className, nameSpace);
 }
 
 CmpiInstance makeInstance_Nic_PhysicalConnector(const char* className, const char* nameSpace,
                                                 const char** properties, _CNAStruc* cna, _CNAPortStruc* port)
 {
-    const int slot = findSlot_Nic_PhysicalConnector(cna, port);
-    if (slot < 0)
-        return CmpiInstance(static_cast<CMPIInstance*>(nullptr));
-    return makeInstance_PhysicalConnector(className, nameSpace, properties, slot);
+    return classmodule::instanceOfSlot(makeInstance_PhysicalConnector, findSlot_Nic_PhysicalConnector(cna, port), className, nameSpace,
+                                       properties);
 }

@@ -6,6 +6,7 @@
 #define VEXLAN_CLASSES_VEXLAN_ADAPTER_PHYSICALCONNECTOR_CMPI_H
 
 #include <cstddef>
+#include <cstring>
 
 #include "classes/ClassModule.h"
 #include "inventory/AdapterFunc.h"
@@ -24,6 +25,10 @@ extern ClassList<PhysicalConnectorEntry> g_PhysicalConnectorList;
 constexpr std::size_t kPhysicalTagSize = 128;
 constexpr std::size_t kPhysicalTagPartSize = 256;
 
+// Splits a tag at "_" into `textCount` texts (each of kPhysicalTagPartSize)
+// and a final port number: 1 when all parts were found.
+int SplitPhysicalTag(const char* tag, char* const* texts, int textCount, int* portNumber);
+
 // "%s_%s_%d" of transceiver serial, adapter serial and port number.
 void CreatePhysicalConnectorTag(char* out, char* transceiverSerial, char* adapterSerial, int portNumber);
 // Splits such a tag at "_": 1 when three parts were found. A serial that holds
@@ -35,6 +40,21 @@ int ParsePhysicalConnectorTag(char* tag, char* transceiverSerial, char* adapterS
 // compared). 1 on success, else 0 with the outputs untouched.
 int getZORAPStructs(_CNAStruc* cna, _CNAPortStruc* port, _zorap_adapter_t** adapter, _zorap_phy_port_t** phyPort,
                     _zorap_protocol_t** protocol);
+
+// The first slot of a tag list whose tag is the one `calcTag` gives for the
+// NIC port (worked out anew for each slot), or -1.
+template <class Entry>
+int findNicTagSlot(const ClassList<Entry>& list, int (*calcTag)(_CNAStruc*, _CNAPortStruc*, char*), _CNAStruc* cna,
+                   _CNAPortStruc* port)
+{
+    for (int i = 0; i < list.count; ++i) {
+        char tag[kPhysicalTagSize];
+        calcTag(cna, port, tag);
+        if (std::strcmp(tag, list.entries[i].tag) == 0)
+            return i;
+    }
+    return -1;
+}
 
 // The connector tag of a NIC port: 1 on success, else 0 with `out` empty.
 int calcTag_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port, char* out);

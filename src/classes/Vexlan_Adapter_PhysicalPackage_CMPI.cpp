@@ -216,16 +216,11 @@ void createNicPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zora
 
 void buildPhysicalPackageList()
 {
-    _zorap_adapter_list_t* adapters = ZORAP_GetAdapterList();
+    ClassList<PhysicalPackageEntry>& list = g_PhysicalPackageList;
+    int capacity = 0;
+    _zorap_adapter_list_t* adapters = classmodule::startBuild(list, classmodule::SlotPer::Adapter, capacity);
     if (adapters == nullptr)
         return;
-    int capacity = 0;
-    for (_zorap_adapter_t* a = adapters->firstAdapter; a != nullptr; a = a->next)
-        ++capacity;
-    ClassList<PhysicalPackageEntry>& list = g_PhysicalPackageList;
-    if (!list.allocate(capacity))
-        return;
-    list.count = 0;
 
     int index = 0;
     Serial serial = {};   // kept from device to device, as the FC serial rule needs
@@ -368,18 +363,13 @@ int findSlot_Nic_PhysicalPackage(_CNAStruc* cna)
 CmpiObjectPath makePath_Nic_PhysicalPackage(const char* className, const char* nameSpace, _CNAStruc* cna)
 {
     PHYSICAL_DEBUG("Vexlan_NIC_PhysicalPackage makePath_PhysicalPackage was called");
-    const int slot = findSlot_Nic_PhysicalPackage(cna);
-    if (slot < 0)
-        return CmpiObjectPath(static_cast<CMPIObjectPath*>(nullptr));
-    return makePath_PhysicalPackage(className, nameSpace, slot);
+    return classmodule::pathOfSlot(makePath_PhysicalPackage, findSlot_Nic_PhysicalPackage(cna), className, nameSpace);
 }
 
 CmpiInstance makeInstance_Nic_PhysicalPackage(const char* className, const char* nameSpace, const char** properties,
                                               _CNAStruc* cna)
 {
     PHYSICAL_DEBUG("Vexlan_NIC_PhysicalPackage makeInstance_PhysicalPackage was called");
-    const int slot = findSlot_Nic_PhysicalPackage(cna);
-    if (slot < 0)
-        return CmpiInstance(static_cast<CMPIInstance*>(nullptr));
-    return makeInstance_PhysicalPackage(className, nameSpace, properties, slot);
+    return classmodule::instanceOfSlot(makeInstance_PhysicalPackage, findSlot_Nic_PhysicalPackage(cna), className, nameSpace,
+                                       properties);
 }

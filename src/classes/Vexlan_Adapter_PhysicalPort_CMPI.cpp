@@ -24,18 +24,8 @@ int ParsePhysicalPortTag(char* tag, char* adapterSerial, int* portNumber)
 {
     if (tag == nullptr || adapterSerial == nullptr || portNumber == nullptr)
         return 0;
-    char work[256] = {};
-    std::snprintf(work, sizeof(work), "%s", tag);
-    char* rest = nullptr;
-    char* part = strtok_r(work, "_", &rest);
-    if (part == nullptr)
-        return 0;
-    std::snprintf(adapterSerial, kPhysicalTagPartSize, "%s", part);
-    part = strtok_r(nullptr, "_", &rest);
-    if (part == nullptr)
-        return 0;
-    *portNumber = static_cast<int>(std::strtol(part, nullptr, 10));
-    return 1;
+    char* const texts[] = {adapterSerial};
+    return SplitPhysicalTag(tag, texts, 1, portNumber);
 }
 
 namespace {
@@ -66,49 +56,32 @@ int calcTag_PhysicalPort(_CNAStruc* cna, _CNAPortStruc* port, char* out)
 
 void buildPhysicalPortList()
 {
-    _zorap_adapter_list_t* adapters = ZORAP_GetAdapterList();
+    ClassList<PhysicalPortEntry>& list = g_PhysicalPortList;
+    int capacity = 0;
+    _zorap_adapter_list_t* adapters = classmodule::startBuild(list, classmodule::SlotPer::PhyPort, capacity);
     if (adapters == nullptr)
         return;
-    int capacity = 0;
-    for (_zorap_adapter_t* a = adapters->firstAdapter; a != nullptr; a = a->next)
-        if (a->phyPortList != nullptr)
-            for (_zorap_phy_port_t* p = a->phyPortList->firstPhyPort; p != nullptr; p = p->next)
-                ++capacity;
-    ClassList<PhysicalPortEntry>& list = g_PhysicalPortList;
-    if (!list.allocate(capacity))
-        return;
-    list.count = 0;
-    for (_zorap_adapter_t* a = adapters->firstAdapter; a != nullptr; a = a->next) {
-        if (a->phyPortList == nullptr)
-            continue;
-        for (_zorap_phy_port_t* p = a->phyPortList->firstPhyPort; p != nullptr && list.count < capacity;
-             p = p->next) {
-            PHYSICAL_DEBUG("Entering createPhysicalPort, index = %d", list.count);
-            char tag[kPhysicalTagSize];
-            portTag(tag, a, p);
-            int same = -1;
-            for (int i = 0; i < list.count && same < 0; ++i)
-                if (std::strcmp(list.entries[i].tag, tag) == 0)
-                    same = i;
-            if (same >= 0) {
-                PHYSICAL_DEBUG("Exiting  createPhysicalPort: Current device has the same the serial number as a device "
-                               "in the list at index=%d. Skip!\n",
-                               same);
-                continue;
-            }
-            PhysicalPortEntry& entry = list.entries[list.count++];
-            std::snprintf(entry.tag, sizeof(entry.tag), "%s", tag);
-            copyFieldText(entry.serialNumber, a->serialNumber);
-            entry.portNumber = p->portNumber;
-            entry.valid = 1;
-            PHYSICAL_DEBUG("Exiting  createPhysicalPort\n");
+    forEachPhyPortIn(adapters, [&](_zorap_adapter_t* a, _zorap_phy_port_t* p) {
+        if (list.count >= capacity)
+            return;
+        PHYSICAL_DEBUG("Entering createPhysicalPort, index = %d", list.count);
+        char tag[kPhysicalTagSize];
+        portTag(tag, a, p);
+        const int same = classmodule::slotWithTag(list, tag);
+        if (same >= 0) {
+            PHYSICAL_DEBUG("Exiting  createPhysicalPort: Current device has the same the serial number as a device "
+                           "in the list at index=%d. Skip!\n",
+                           same);
+            return;
         }
-    }
-    int valid = 0;
-    for (int i = 0; i < list.count; ++i)
-        if (list.entries[i].valid)
-            ++valid;
-    list.count = valid;
+        PhysicalPortEntry& entry = list.entries[list.count++];
+        std::snprintf(entry.tag, sizeof(entry.tag), "%s", tag);
+        copyFieldText(entry.serialNumber, a->serialNumber);
+        entry.portNumber = p->portNumber;
+        entry.valid = 1;
+        PHYSICAL_DEBUG("Exiting  createPhysicalPort\n");
+    });
+    classmodule::countValid(list);
 }
 
 void removePhysicalPortList()
@@ -160,30 +133,19 @@ VEXLAN_LIST_CLASS_OPERATIONS(PhysicalPort, kPhysicalPort)
 
 int findSlot_Nic_PhysicalPort(_CNAStruc* cna, _CNAPortStruc* port)
 {
-    for (int i = 0; i < g_PhysicalPortList.count; ++i) {
-        char tag[kPhysicalTagSize];
-        calcTag_PhysicalPort(cna, port, tag);
-        if (std::strcmp(tag, g_PhysicalPortList.entries[i].tag) == 0)
-            return i;
-    }
-    return -1;
+    return findNicTagSlot(g_PhysicalPortList, calcTag_PhysicalPort, cna, port);
 }
 
 CmpiObjectPath makePath_Nic_PhysicalPort(const char* className, const char* nameSpace, _CNAStruc* cna,
                                          _CNAPortStruc* port)
 {
     PHYSICAL_DEBUG("Vexlan_NIC_PhysicalPort makePath_PhysicalPort was called\n");
-    const int slot = findSlot_Nic_PhysicalPort(cna, port);
-    if (slot < 0)
-        return CmpiObjectPath(static_cast<CMPIObjectPath*>(nullptr));
-    return makePath_PhysicalPort(className, nameSpace, slot);
+    return classmodule::pathOfSlot(makePath_PhysicalPort, findSlot_Nic_PhysicalPort(cna, port), className, nameSpace);
 }
 
 CmpiInstance makeInstance_Nic_PhysicalPort(const char* className, const char* nameSpace, const char** properties,
                                            _CNAStruc* cna, _CNAPortStruc* port)
 {
-    const int slot = findSlot_Nic_PhysicalPort(cna, port);
-    if (slot < 0)
-        return CmpiInstance(static_cast<CMPIInstance*>(nullptr));
-    return makeInstance_PhysicalPort(className, nameSpace, properties, slot);
+    return classmodule::instanceOfSlot(makeInstance_PhysicalPort, findSlot_Nic_PhysicalPort(cna, port), className, nameSpace,
+                                       properties);
 }

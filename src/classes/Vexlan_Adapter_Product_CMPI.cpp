@@ -10,16 +10,11 @@ ClassList<ProductEntry> g_ProductList = {0, nullptr};
 
 void buildProductList()
 {
-    _zorap_adapter_list_t* adapters = ZORAP_GetAdapterList();
+    ClassList<ProductEntry>& list = g_ProductList;
+    int capacity = 0;
+    _zorap_adapter_list_t* adapters = classmodule::startBuild(list, classmodule::SlotPer::Adapter, capacity);
     if (adapters == nullptr)
         return;
-    int capacity = 0;
-    for (_zorap_adapter_t* a = adapters->firstAdapter; a != nullptr; a = a->next)
-        ++capacity;
-    ClassList<ProductEntry>& list = g_ProductList;
-    if (!list.allocate(capacity))
-        return;
-    list.count = 0;
     for (_zorap_adapter_t* a = adapters->firstAdapter; a != nullptr && list.count < capacity; a = a->next) {
         classmodule::buildLine(true, "Product", list.count);
         ProductEntry& entry = list.entries[list.count];
