@@ -333,8 +333,9 @@ TEST(Faults, AnUnusableAdapterLibraryGivesEmptyListsNeverACrash)
             OpResult e = host.enumerateInstances(classPath(cls));
             EXPECT_TRUE(e.ok()) << cls << ": " << e.message;
             if (cls.find("Port") != std::string::npos || cls.find("Physical") != std::string::npos ||
-                cls.find("StorageExtent") != std::string::npos || cls.find("Endpoint") != std::string::npos)
+                cls.find("StorageExtent") != std::string::npos || cls.find("Endpoint") != std::string::npos) {
                 EXPECT_TRUE(e.instances.empty()) << cls;
+            }
         }
         EXPECT_GT(classes, 20);
         // Polls keep running against the failing library.
