@@ -7,6 +7,8 @@
 #ifndef VEXLAN_CLASSES_VEXLAN_FC_SCSIPROTOCOLCONTROLLER_CMPI_H
 #define VEXLAN_CLASSES_VEXLAN_FC_SCSIPROTOCOLCONTROLLER_CMPI_H
 
+#include <cstdint>
+
 #include "classes/ClassModule.h"
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
 #include "classes/Vexlan_FC_FCPort_CMPI.h"
@@ -20,6 +22,36 @@ struct SCSIPortNameEntry {
 // Full list of one slot per FC protocol, named by the port WWN; the build of
 // the controller and of the HBA endpoint. No debug lines.
 void buildSCSIPortNameList(ClassList<SCSIPortNameEntry>& list);
+
+// The target walk of the target endpoint and storage extent builds: every
+// target of every FC function as the library links it, with the WWN texts of
+// the local port and of the target: visit(device, target, local, remote).
+// A visit that returns false ends that function's target chain.
+template <class Visit>
+bool walkFCTargets(Visit&& visit)
+{
+    return classmodule::walkProtocols([&](_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* pr) {
+        if (pr->protocolType >= 2)
+            return;
+        _tagZORAPSDMDevice* device = &pr->fcDevice;
+        char local[kFCWWNTextSize];
+        FormatWWN(device->portWWN, local, sizeof(local));
+        for (_zorap_target_t* target = device->targetList; target != nullptr; target = target->next) {
+            char remote[kFCWWNTextSize];
+            FormatWWN(target->portWWN, remote, sizeof(remote));
+            if (!visit(device, target, static_cast<const char*>(local), static_cast<const char*>(remote)))
+                break;
+        }
+    });
+}
+
+// Allocates a full list of `wanted` slots when there are adapters; a sum
+// beyond the signed count leaves the list empty. False: no slots.
+template <class Entry>
+bool allocateCounted(ClassList<Entry>& list, bool haveAdapters, std::uint64_t wanted)
+{
+    return haveAdapters && wanted <= INT32_MAX && list.allocate(static_cast<int>(wanted));
+}
 
 extern ClassList<SCSIPortNameEntry> g_SCSIProtocolControllerList;
 

@@ -17,25 +17,18 @@ void buildSCSIProtocolEndpointTargetList()
             wanted += pr->fcDevice.targetCount;
     });
     ClassList<SCSIPortNameEntry>& list = g_SCSIProtocolEndpointTargetList;
-    if (!haveAdapters || wanted > INT32_MAX || !list.allocate(static_cast<int>(wanted)))
+    if (!allocateCounted(list, haveAdapters, wanted))
         return;
     const int capacity = static_cast<int>(wanted);
     int index = 0;
-    classmodule::walkProtocols([&](_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* pr) {
-        if (pr->protocolType >= 2)
-            return;
-        char local[kFCWWNTextSize];
-        FormatWWN(pr->fcDevice.portWWN, local, sizeof(local));
-        // The chain is followed as the library links it; a chain longer than
-        // the counts gives no slot beyond the capacity.
-        for (_zorap_target_t* target = pr->fcDevice.targetList; target != nullptr && index < capacity;
-             target = target->next) {
-            char remote[kFCWWNTextSize];
-            FormatWWN(target->portWWN, remote, sizeof(remote));
-            SCSIPortNameEntry& entry = list.entries[index++];
-            std::snprintf(entry.name, sizeof(entry.name), "%s_%s", local, remote);
-            entry.valid = 1;
-        }
+    // A chain longer than the counts gives no slot beyond the capacity.
+    walkFCTargets([&](_tagZORAPSDMDevice*, _zorap_target_t*, const char* local, const char* remote) {
+        if (index >= capacity)
+            return false;
+        SCSIPortNameEntry& entry = list.entries[index++];
+        std::snprintf(entry.name, sizeof(entry.name), "%s_%s", local, remote);
+        entry.valid = 1;
+        return true;
     });
 }
 

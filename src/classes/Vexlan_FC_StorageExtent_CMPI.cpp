@@ -22,38 +22,30 @@ void buildStorageExtentList()
             wanted += target->lunCount;
     });
     ClassList<StorageExtentEntry>& list = g_StorageExtentList;
-    if (!haveAdapters || wanted > INT32_MAX || !list.allocate(static_cast<int>(wanted)))
+    if (!allocateCounted(list, haveAdapters, wanted))
         return;
     const int capacity = static_cast<int>(wanted);
     int index = 0;
-    classmodule::walkProtocols([&](_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* pr) {
-        if (pr->protocolType >= 2)
-            return;
-        _tagZORAPSDMDevice* device = &pr->fcDevice;
-        char local[kFCWWNTextSize];
-        FormatWWN(device->portWWN, local, sizeof(local));
-        for (_zorap_target_t* target = device->targetList; target != nullptr; target = target->next) {
-            char remote[kFCWWNTextSize];
-            FormatWWN(target->portWWN, remote, sizeof(remote));
-            // A LUN chain longer than the counts gives no slot beyond the capacity.
-            for (_zorap_lun_t* lun = target->lunList; lun != nullptr && index < capacity; lun = lun->next) {
-                classmodule::buildLine(true, "StorageExtent", index);
-                // Sixteen identifier bytes when the LUN says so, else eight.
-                const int idBytes = lun->lunIdLength == 16 ? 16 : 8;
-                char lunId[2 * 16 + 1] = {};
-                for (int b = 0; b < idBytes; ++b)
-                    std::snprintf(lunId + 2 * b, sizeof(lunId) - 2 * b, "%02X", lun->lunId[b]);
-                StorageExtentEntry& entry = list.entries[index];
-                std::snprintf(entry.deviceId, sizeof(entry.deviceId), "%s_%s_%s_%u", local, remote, lunId,
-                              static_cast<unsigned>(lun->lunNumber));
-                entry.valid = 1;
-                entry.device = device;
-                entry.target = target;
-                entry.lun = lun;
-                classmodule::buildLine(false, "StorageExtent", index);
-                ++index;
-            }
+    walkFCTargets([&](_tagZORAPSDMDevice* device, _zorap_target_t* target, const char* local, const char* remote) {
+        // A LUN chain longer than the counts gives no slot beyond the capacity.
+        for (_zorap_lun_t* lun = target->lunList; lun != nullptr && index < capacity; lun = lun->next) {
+            classmodule::buildLine(true, "StorageExtent", index);
+            // Sixteen identifier bytes when the LUN says so, else eight.
+            const int idBytes = lun->lunIdLength == 16 ? 16 : 8;
+            char lunId[2 * 16 + 1] = {};
+            for (int b = 0; b < idBytes; ++b)
+                std::snprintf(lunId + 2 * b, sizeof(lunId) - 2 * b, "%02X", lun->lunId[b]);
+            StorageExtentEntry& entry = list.entries[index];
+            std::snprintf(entry.deviceId, sizeof(entry.deviceId), "%s_%s_%s_%u", local, remote, lunId,
+                          static_cast<unsigned>(lun->lunNumber));
+            entry.valid = 1;
+            entry.device = device;
+            entry.target = target;
+            entry.lun = lun;
+            classmodule::buildLine(false, "StorageExtent", index);
+            ++index;
         }
+        return true;
     });
 }
 
