@@ -231,11 +231,17 @@ NicLinkStatus nicLinkStatus(const _CNAPortStruc* port);
 #define NIC_TEXT(text) CLASS_VALUE(NicRecord, CmpiData(text))
 #define NIC_UINT16(value) CLASS_VALUE(NicRecord, CmpiData(static_cast<CMPIUint16>(value)))
 
-// The operations of a NIC class module. PARAMS is the parenthesised list of
-// the records that makePath_X and makeInstance_X take, RECORD the NicRecord
-// made of them:
+// The operations of a NIC class module, declared and defined. PARAMS is the
+// parenthesised list of the records that makePath_X and makeInstance_X take,
+// RECORD the NicRecord made of them:
+//     VEXLAN_DECLARE_NIC_CLASS_OPERATIONS(LANEndPoint, (_CNAPortStruc* port));
 //     VEXLAN_NIC_CLASS_OPERATIONS(LANEndPoint, kModule, (_CNAPortStruc* port), (NicRecord{nullptr, port}))
 #define VEXLAN_NIC_UNPAREN(...) __VA_ARGS__
+#define VEXLAN_DECLARE_NIC_CLASS_OPERATIONS(X, PARAMS)                                                \
+    CmpiObjectPath makePath_##X(const char* className, const char* nameSpace, VEXLAN_NIC_UNPAREN PARAMS); \
+    CmpiInstance makeInstance_##X(const char* className, const char* nameSpace, const char** properties, \
+                                  VEXLAN_NIC_UNPAREN PARAMS);                                         \
+    VEXLAN_DECLARE_CLASS_REQUESTS(X)
 #define VEXLAN_NIC_CLASS_OPERATIONS(X, module, PARAMS, RECORD)                                         \
     CmpiObjectPath makePath_##X(const char* className, const char* nameSpace, VEXLAN_NIC_UNPAREN PARAMS) \
     {                                                                                                 \

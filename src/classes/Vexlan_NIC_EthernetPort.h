@@ -3,19 +3,13 @@
 #ifndef VEXLAN_CLASSES_VEXLAN_NIC_ETHERNETPORT_H
 #define VEXLAN_CLASSES_VEXLAN_NIC_ETHERNETPORT_H
 
-#include "CmpiImpl.h"
-#include "classes/ClassModule.h"
-#include "inventory/AdapterFunc.h"
+#include "classes/NicClassModule.h"
 
 // DeviceID of the port: its MAC as twelve upper-case hex digits, into
 // kMacTextSize bytes or more (a null `out` uses a buffer of macaddrToStr).
 // The adapter is not looked at. Returns the text.
 char* calcDeviceID_EthernetPort(_CNAStruc* adapter, _CNAPortStruc* port, char* out);
 
-CmpiObjectPath makePath_EthernetPort(const char* className, const char* nameSpace, _CNAStruc* adapter,
-                                     _CNAPortStruc* port);
-CmpiInstance makeInstance_EthernetPort(const char* className, const char* nameSpace, const char** properties,
-                                       _CNAStruc* adapter, _CNAPortStruc* port);
-VEXLAN_DECLARE_CLASS_REQUESTS(EthernetPort);
+VEXLAN_DECLARE_NIC_CLASS_OPERATIONS(EthernetPort, (_CNAStruc* adapter, _CNAPortStruc* port));
 
 #endif

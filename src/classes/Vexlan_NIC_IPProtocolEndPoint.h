@@ -3,17 +3,12 @@
 #ifndef VEXLAN_CLASSES_VEXLAN_NIC_IPPROTOCOLENDPOINT_H
 #define VEXLAN_CLASSES_VEXLAN_NIC_IPPROTOCOLENDPOINT_H
 
-#include "CmpiImpl.h"
-#include "classes/ClassModule.h"
-#include "inventory/AdapterFunc.h"
+#include "classes/NicClassModule.h"
 
 // Name of the endpoint: the port's MAC as twelve upper-case hex digits, into
 // kMacTextSize bytes or more (a null `out` uses a buffer of macaddrToStr).
 char* calcName_IPProtocolEndPoint(_CNAPortStruc* port, char* out);
 
-CmpiObjectPath makePath_IPProtocolEndPoint(const char* className, const char* nameSpace, _CNAPortStruc* port);
-CmpiInstance makeInstance_IPProtocolEndPoint(const char* className, const char* nameSpace, const char** properties,
-                                             _CNAPortStruc* port);
-VEXLAN_DECLARE_CLASS_REQUESTS(IPProtocolEndPoint);
+VEXLAN_DECLARE_NIC_CLASS_OPERATIONS(IPProtocolEndPoint, (_CNAPortStruc* port));
 
 #endif

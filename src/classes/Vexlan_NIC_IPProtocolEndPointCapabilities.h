@@ -3,14 +3,8 @@
 #ifndef VEXLAN_CLASSES_VEXLAN_NIC_IPPROTOCOLENDPOINTCAPABILITIES_H
 #define VEXLAN_CLASSES_VEXLAN_NIC_IPPROTOCOLENDPOINTCAPABILITIES_H
 
-#include "CmpiImpl.h"
-#include "classes/ClassModule.h"
-#include "inventory/AdapterFunc.h"
+#include "classes/NicClassModule.h"
 
-CmpiObjectPath makePath_IPProtocolEndPointCapabilities(const char* className, const char* nameSpace,
-                                                       _CNAPortStruc* port);
-CmpiInstance makeInstance_IPProtocolEndPointCapabilities(const char* className, const char* nameSpace,
-                                                         const char** properties, _CNAPortStruc* port);
-VEXLAN_DECLARE_CLASS_REQUESTS(IPProtocolEndPointCapabilities);
+VEXLAN_DECLARE_NIC_CLASS_OPERATIONS(IPProtocolEndPointCapabilities, (_CNAPortStruc* port));
 
 #endif

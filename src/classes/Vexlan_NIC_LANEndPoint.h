@@ -2,13 +2,8 @@
 #ifndef VEXLAN_CLASSES_VEXLAN_NIC_LANENDPOINT_H
 #define VEXLAN_CLASSES_VEXLAN_NIC_LANENDPOINT_H
 
-#include "CmpiImpl.h"
-#include "classes/ClassModule.h"
-#include "inventory/AdapterFunc.h"
+#include "classes/NicClassModule.h"
 
-CmpiObjectPath makePath_LANEndPoint(const char* className, const char* nameSpace, _CNAPortStruc* port);
-CmpiInstance makeInstance_LANEndPoint(const char* className, const char* nameSpace, const char** properties,
-                                      _CNAPortStruc* port);
-VEXLAN_DECLARE_CLASS_REQUESTS(LANEndPoint);
+VEXLAN_DECLARE_NIC_CLASS_OPERATIONS(LANEndPoint, (_CNAPortStruc* port));
 
 #endif

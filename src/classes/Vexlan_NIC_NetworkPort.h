@@ -3,9 +3,7 @@
 #ifndef VEXLAN_CLASSES_VEXLAN_NIC_NETWORKPORT_H
 #define VEXLAN_CLASSES_VEXLAN_NIC_NETWORKPORT_H
 
-#include "CmpiImpl.h"
-#include "classes/ClassModule.h"
-#include "inventory/AdapterFunc.h"
+#include "classes/NicClassModule.h"
 
 // DeviceID "<serial>_<port number>". With a null `out` the text goes to a
 // buffer of the function that the next call on the same thread overwrites;
@@ -15,10 +13,6 @@ char* calcDeviceID_NetworkPort(_CNAStruc* adapter, _CNAPortStruc* port, char* ou
 // for `out`.
 char* calcElementName_NetworkPort(_CNAStruc* adapter, _CNAPortStruc* port, char* out);
 
-CmpiObjectPath makePath_NetworkPort(const char* className, const char* nameSpace, _CNAStruc* adapter,
-                                    _CNAPortStruc* port);
-CmpiInstance makeInstance_NetworkPort(const char* className, const char* nameSpace, const char** properties,
-                                      _CNAStruc* adapter, _CNAPortStruc* port);
-VEXLAN_DECLARE_CLASS_REQUESTS(NetworkPort);
+VEXLAN_DECLARE_NIC_CLASS_OPERATIONS(NetworkPort, (_CNAStruc* adapter, _CNAPortStruc* port));
 
 #endif

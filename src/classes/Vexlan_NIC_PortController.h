@@ -3,9 +3,7 @@
 #ifndef VEXLAN_CLASSES_VEXLAN_NIC_PORTCONTROLLER_H
 #define VEXLAN_CLASSES_VEXLAN_NIC_PORTCONTROLLER_H
 
-#include "CmpiImpl.h"
-#include "classes/ClassModule.h"
-#include "inventory/AdapterFunc.h"
+#include "classes/NicClassModule.h"
 
 // Room for a NIC port controller's device ID, terminating zero included.
 constexpr std::size_t kPortControllerDeviceIdSize = 256;
@@ -18,9 +16,6 @@ char* BuildPortControllerDeviceID(char* serial);
 // bytes). Returns `out`.
 char* calcDeviceID_PortController(_CNAStruc* adapter, char* out);
 
-CmpiObjectPath makePath_Nic_PortController(const char* className, const char* nameSpace, _CNAStruc* adapter);
-CmpiInstance makeInstance_Nic_PortController(const char* className, const char* nameSpace, const char** properties,
-                                             _CNAStruc* adapter);
-VEXLAN_DECLARE_CLASS_REQUESTS(Nic_PortController);
+VEXLAN_DECLARE_NIC_CLASS_OPERATIONS(Nic_PortController, (_CNAStruc* adapter));
 
 #endif

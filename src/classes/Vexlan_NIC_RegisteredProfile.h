@@ -5,8 +5,7 @@
 
 #include <cstdint>
 
-#include "CmpiImpl.h"
-#include "classes/ClassModule.h"
+#include "classes/NicClassModule.h"
 
 // One node of the chain, allocated with malloc. `description` is
 // "Vexlan NIC " followed by `name`.
@@ -29,10 +28,6 @@ void InitializeRegisteredProfileList();
 // Frees every node; the chain becomes empty.
 void Clear_RegisteredProfile_List();
 
-CmpiObjectPath makePath_Nic_RegisteredProfile(const char* className, const char* nameSpace,
-                                              _RegisteredProfile* profile);
-CmpiInstance makeInstance_Nic_RegisteredProfile(const char* className, const char* nameSpace,
-                                                const char** properties, _RegisteredProfile* profile);
-VEXLAN_DECLARE_CLASS_REQUESTS(Nic_RegisteredProfile);
+VEXLAN_DECLARE_NIC_CLASS_OPERATIONS(Nic_RegisteredProfile, (_RegisteredProfile* profile));
 
 #endif

@@ -4,14 +4,8 @@
 #ifndef VEXLAN_CLASSES_VEXLAN_NIC_REMOTESERVICEACCESSPOINT_H
 #define VEXLAN_CLASSES_VEXLAN_NIC_REMOTESERVICEACCESSPOINT_H
 
-#include "CmpiImpl.h"
-#include "classes/ClassModule.h"
-#include "inventory/AdapterFunc.h"
+#include "classes/NicClassModule.h"
 
-CmpiObjectPath makePath_RemoteServiceAccessPoint(const char* className, const char* nameSpace,
-                                                 _CNAPortStruc* port);
-CmpiInstance makeInstance_RemoteServiceAccessPoint(const char* className, const char* nameSpace,
-                                                   const char** properties, _CNAPortStruc* port);
-VEXLAN_DECLARE_CLASS_REQUESTS(RemoteServiceAccessPoint);
+VEXLAN_DECLARE_NIC_CLASS_OPERATIONS(RemoteServiceAccessPoint, (_CNAPortStruc* port));
 
 #endif
