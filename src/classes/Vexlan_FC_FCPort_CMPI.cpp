@@ -12,6 +12,7 @@
 #include "inventory/AdapterFunc_Transceiver.h"
 #include "inventory/AdapterFunc_VPD.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
+#include "support/Vexlan_NIC_Utils.h"
 
 ClassList<FCPortEntry> g_FCPortList;
 
@@ -253,9 +254,8 @@ CmpiData ENodeMACText(std::uint8_t macAvailable, const std::uint8_t* mac)
 {
     if (macAvailable != 1)
         return CmpiData("Not Available");
-    char text[13];
-    std::snprintf(text, sizeof(text), "%02X%02X%02X%02X%02X%02X", mac[0], mac[1], mac[2], mac[3], mac[4], mac[5]);
-    return CmpiData(text);
+    char text[kMacTextSize];
+    return CmpiData(macaddrToStr(mac, text));
 }
 
 std::uint64_t FCPortSpeedForCode(std::uint32_t speedCode, int chipCode, char* description, std::size_t size)

@@ -87,9 +87,7 @@ char* calcElementName_NetworkPort(_CNAStruc*, _CNAPortStruc* port, char* out)
 {
     if (out == nullptr)
         out = tElementName;
-    const unsigned char* m = port->macAddress.octet;
-    std::snprintf(out, kNicKeyTextSize, "%02X%02X%02X%02X%02X%02X", m[0], m[1], m[2], m[3], m[4], m[5]);
-    return out;
+    return nicMacText(port, out);
 }
 
 VEXLAN_NIC_CLASS_OPERATIONS(NetworkPort, kModule, (_CNAStruc * adapter, _CNAPortStruc * port),

@@ -32,10 +32,8 @@ PropertyValue deviceId(const NicRecord& r)
 // The first six bytes of the adapter info, without separators.
 PropertyValue fcWwn(const NicRecord& r)
 {
-    const unsigned char* b = r.adapter->nodeWWN;
     char text[kMacTextSize];
-    std::snprintf(text, sizeof(text), "%02X%02X%02X%02X%02X%02X", b[0], b[1], b[2], b[3], b[4], b[5]);
-    return CmpiData(text);
+    return CmpiData(macaddrToStr(r.adapter->nodeWWN, text));
 }
 
 // The status pair is fixed: a link state has no part in it.
