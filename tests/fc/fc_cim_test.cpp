@@ -57,27 +57,6 @@ ObjectPath instanceIdPath(const char* className, const std::string& id)
     return p;
 }
 
-std::vector<std::string> keyNames(const ObjectPath& p)
-{
-    std::vector<std::string> names;
-    for (const auto& k : p.keys)
-        names.push_back(k.first);
-    return names;
-}
-
-// A scalar property, checked for its CIM type.
-const Value& scalar(const Instance& inst, const std::string& name, Type type)
-{
-    static const Value missing;
-    const Value* v = inst.property(name);
-    EXPECT_NE(v, nullptr) << name;
-    if (v == nullptr)
-        return missing;
-    EXPECT_EQ(v->type, type) << name;
-    EXPECT_FALSE(v->array) << name;
-    return *v;
-}
-
 // The one element of a one-element uint16 array.
 std::uint64_t firstOf(const Instance& inst, const std::string& name)
 {
@@ -89,50 +68,14 @@ std::uint64_t firstOf(const Instance& inst, const std::string& name)
     return v->elems[0].u;
 }
 
-OpResult enumerate(Host& host, const char* className)
-{
-    OpResult r = host.enumerateInstances(classPath(className));
-    EXPECT_TRUE(r.ok()) << className << ": " << r.message;
-    EXPECT_TRUE(r.strictErrors.empty()) << className << ": " << (r.strictErrors.empty() ? "" : r.strictErrors[0]);
-    return r;
-}
-
-// Starts the provider on a description (null: the default host) and waits
-// for its first build by a first request.
-void start(Host& host, const json* description)
-{
-    writeSettings(kLogsOn, "");
-    removeLog();
-    if (description != nullptr)
-        ASSERT_EQ(0, zorap_sim_load_json(description->dump().c_str()));
-    else
-        ASSERT_EQ(0, zorap_sim_load_default());
-    zorap_sim_reset();
-    prepareHost(host);
-    ASSERT_TRUE(host.enumerateInstanceNames(classPath(kPortController)).ok());
-}
-
 }  // namespace
 
 // ---- The default host ------------------------------------------------------------
 
-class FCDefaultHost : public ::testing::Test {
+class FCDefaultHost : public ProviderSuite<FCDefaultHost> {
 protected:
-    static void SetUpTestSuite()
-    {
-        host_ = new Host;
-        start(*host_, nullptr);
-    }
-    static void TearDownTestSuite()
-    {
-        delete host_;
-        host_ = nullptr;
-        zorap_sim_reset();
-    }
-    void TearDown() override { zorap_sim_reset(); }
-    static Host* host_;
+    static void SetUpTestSuite() { startSuite(kLogsOn, nullptr, kPortController); }
 };
-Host* FCDefaultHost::host_ = nullptr;
 
 TEST_F(FCDefaultHost, FCPortsShowTheirPropertiesInOrderWithTheLibraryValues)
 {
@@ -400,7 +343,7 @@ TEST(FCHosts, SerialsThatDifferInCaseMakeTwoControllersFoundByEitherForm)
     json description =
         fctest::host(json::array({fctest::fcAdapter(1, "RSX-1620", 2, "abc1"), fctest::fcAdapter(2, "RSX-1620", 2, "ABC1")}));
     Host host;
-    start(host, &description);
+    startProvider(host, kLogsOn, description.dump().c_str(), kPortController);
 
     OpResult controllers = enumerate(host, kPortController);
     ASSERT_EQ(controllers.instances.size(), 2u);
@@ -420,7 +363,7 @@ TEST(FCHosts, SixtyFourAdaptersOfFourFCFunctionsEach)
 {
     json description = fctest::wideHost();
     Host host;
-    start(host, &description);
+    startProvider(host, kLogsOn, description.dump().c_str(), kPortController);
 
     OpResult names = host.enumerateInstanceNames(classPath(kFCPort));
     ASSERT_TRUE(names.ok()) << names.message;

@@ -4,17 +4,14 @@
 // are private, so the settings file and the log are the test's own.
 #include <gtest/gtest.h>
 
-#include <sys/stat.h>
-
 #include <algorithm>
-#include <cstdio>
-#include <fstream>
-#include <memory>
 #include <string>
 #include <vector>
 
-#include "cimhost/host.h"
+#include "provider_env.h"
 #include "zorap_sim_control.h"
+
+using namespace provtest;
 
 using cimhost::Host;
 using cimhost::Instance;
@@ -24,44 +21,7 @@ using cimhost::Value;
 
 namespace {
 
-const char kNamespace[] = "root/vexlan_cmpi";
-const char kSettingsDir[] = "/opt/Vexlan_Corporation/CNAProviders";
-const char kLogPath[] = "/opt/Vexlan_Corporation/CNAProviders/log/Vexlan_CNA_Provider.log";
 const char kLogsOn[] = "DebugLog=1\nErrorLog=1\n";
-
-void writeFile(const std::string& path, const std::string& text)
-{
-    std::ofstream out(path, std::ios::trunc);
-    out << text;
-}
-
-// The settings file that the provider's constructor reads, with the log
-// directory beside it.
-void writeSettings(const std::string& text)
-{
-    mkdir("/opt/Vexlan_Corporation", 0755);
-    mkdir(kSettingsDir, 0755);
-    mkdir("/opt/Vexlan_Corporation/CNAProviders/log", 0755);
-    writeFile(std::string(kSettingsDir) + "/vexlancna.properties", text);
-}
-
-int countLog(const std::string& text)
-{
-    std::ifstream in(kLogPath);
-    int n = 0;
-    for (std::string line; std::getline(in, line);)
-        if (line.find(text) != std::string::npos)
-            ++n;
-    return n;
-}
-
-ObjectPath classPath(const std::string& className)
-{
-    ObjectPath p;
-    p.nameSpace = kNamespace;
-    p.className = className;
-    return p;
-}
 
 ObjectPath keyPath(const std::string& className, const std::string& key, const Value& value)
 {
@@ -73,28 +33,6 @@ ObjectPath keyPath(const std::string& className, const std::string& key, const V
 ObjectPath keyPath(const std::string& className, const std::string& key, const std::string& text)
 {
     return keyPath(className, key, Value::fromString(text));
-}
-
-std::vector<std::string> names(const Instance& inst)
-{
-    std::vector<std::string> n;
-    for (const auto& p : inst.properties)
-        n.push_back(p.first);
-    return n;
-}
-
-std::vector<std::string> keyNames(const ObjectPath& path)
-{
-    std::vector<std::string> n;
-    for (const auto& k : path.keys)
-        n.push_back(k.first);
-    return n;
-}
-
-std::string text(const Instance& inst, const std::string& name)
-{
-    const Value* v = inst.property(name);
-    return v != nullptr ? v->s : "<absent>";
 }
 
 std::uint64_t number(const Instance& inst, const std::string& name)
@@ -113,86 +51,42 @@ std::string single(const Instance& inst, const std::string& name)
     return e.type == cimhost::Type::String ? e.s : std::to_string(e.u);
 }
 
-// One provider load per test suite: the adapter description is chosen first,
-// then the host loads the library from the build and makes the first request.
-class ProviderHost {
-public:
-    explicit ProviderHost(const std::string& settings)
-    {
-        writeSettings(settings);
-        std::remove(kLogPath);
-        host_.setStrict(true);
-        host_.setDefaultNamespace(kNamespace);
-        cimhost::Status st = host_.loadMof(VEXLAN_MOF_DIR);
-        if (!st.ok())
-            throw std::runtime_error("class definitions: " + st.message);
-        st = host_.load(PROVIDER_LIBRARY, "Vexlan_CNA_Provider");
-        if (!st.ok())
-            throw std::runtime_error("provider: " + st.message);
-    }
-    Host& operator*() { return host_; }
-    Host* operator->() { return &host_; }
-
-private:
-    Host host_;
-};
-
-OpResult enumerate(Host& host, const std::string& className)
-{
-    OpResult r = host.enumerateInstances(classPath(className));
-    EXPECT_TRUE(r.ok()) << className << ": " << r.message;
-    EXPECT_TRUE(r.strictErrors.empty()) << className << ": " << r.strictErrors.front();
-    return r;
-}
-
 }  // namespace
 
 // ---- The NIC side of the default host ----------------------------------------------
 
-class NicDefaultHost : public ::testing::Test {
+class NicDefaultHost : public ProviderSuite<NicDefaultHost> {
 protected:
-    static void SetUpTestSuite()
-    {
-        zorap_sim_load_default();
-        host_ = new ProviderHost(kLogsOn);
-    }
-    static void TearDownTestSuite()
-    {
-        delete host_;
-        host_ = nullptr;
-    }
-    static Host& host() { return **host_; }
-    static ProviderHost* host_;
+    static void SetUpTestSuite() { startSuite(kLogsOn, nullptr, nullptr); }
 };
-ProviderHost* NicDefaultHost::host_ = nullptr;
 
 TEST_F(NicDefaultHost, EthernetPortsInTheirPropertyOrderWithFCoELinkage)
 {
     OpResult r = enumerate(host(), "Vexlan_NIC_EthernetPort2");
     ASSERT_EQ(r.instances.size(), 2u);
     const Instance& p = r.instances[0];
-    EXPECT_EQ(names(p), (std::vector<std::string>{
+    EXPECT_EQ(propertyNames(p), (std::vector<std::string>{
                             "SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID",
                             "LinkTechnology", "PermanentAddress", "PortNumber", "PortType", "OperationalStatus",
                             "StatusDescriptions", "Caption", "Description", "ElementName", "Name", "MaxSpeed",
                             "ActiveMaximumTransmissionUnit", "Speed", "FC_WWN", "FC_PortID", "FC_ENodeMACAddress"}));
-    EXPECT_EQ(text(p, "SystemCreationClassName"), "Vexlan_Adapter_ComputerSystem");
-    EXPECT_EQ(text(p, "CreationClassName"), "Vexlan_NIC_EthernetPort2");
+    EXPECT_EQ(propertyText(p, "SystemCreationClassName"), "Vexlan_Adapter_ComputerSystem");
+    EXPECT_EQ(propertyText(p, "CreationClassName"), "Vexlan_NIC_EthernetPort2");
     for (const char* mac : {"DeviceID", "PermanentAddress", "Caption", "ElementName", "Name"})
-        EXPECT_EQ(text(p, mac), "027E5A244700") << mac;
+        EXPECT_EQ(propertyText(p, mac), "027E5A244700") << mac;
     EXPECT_EQ(number(p, "LinkTechnology"), 2u);
     EXPECT_EQ(number(p, "PortType"), 105u);
     EXPECT_EQ(number(p, "PortNumber"), 0u);
     EXPECT_EQ(single(p, "OperationalStatus"), "2");
     EXPECT_EQ(single(p, "StatusDescriptions"), "Link Up");
-    EXPECT_EQ(text(p, "Description"), "Vexlan CNA Ethernet Port");
+    EXPECT_EQ(propertyText(p, "Description"), "Vexlan CNA Ethernet Port");
     EXPECT_EQ(number(p, "MaxSpeed"), 10625000000u);
     EXPECT_EQ(number(p, "Speed"), 10625000000u);
     EXPECT_EQ(number(p, "ActiveMaximumTransmissionUnit"), 1500u);
-    EXPECT_EQ(text(p, "FC_WWN"), "31-00-02-7E-5A-24-47-93");
-    EXPECT_EQ(text(p, "FC_PortID"), "0A-1B-01");
-    EXPECT_EQ(text(p, "FC_ENodeMACAddress"), "027E5A244701");
-    EXPECT_EQ(text(r.instances[1], "DeviceID"), "027E5A244702");
+    EXPECT_EQ(propertyText(p, "FC_WWN"), "31-00-02-7E-5A-24-47-93");
+    EXPECT_EQ(propertyText(p, "FC_PortID"), "0A-1B-01");
+    EXPECT_EQ(propertyText(p, "FC_ENodeMACAddress"), "027E5A244701");
+    EXPECT_EQ(propertyText(r.instances[1], "DeviceID"), "027E5A244702");
     EXPECT_EQ(number(r.instances[1], "ActiveMaximumTransmissionUnit"), 9000u);
 
     OpResult n = host().enumerateInstanceNames(classPath("Vexlan_NIC_EthernetPort2"));
@@ -207,21 +101,21 @@ TEST_F(NicDefaultHost, NetworkPortsKeyedBySerialAndPortNumber)
     OpResult r = enumerate(host(), "Vexlan_NIC_NetworkPort");
     ASSERT_EQ(r.instances.size(), 2u);
     const Instance& p = r.instances[1];
-    EXPECT_EQ(names(p), (std::vector<std::string>{
+    EXPECT_EQ(propertyNames(p), (std::vector<std::string>{
                             "SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID",
                             "LinkTechnology", "PermanentAddress", "PortType", "PortNumber", "OperationalStatus",
                             "StatusDescriptions", "Caption", "Description", "ElementName", "Name", "MaxSpeed",
                             "ActiveMaximumTransmissionUnit", "Speed"}));
-    EXPECT_EQ(text(p, "DeviceID"), "VXC2447M0193_1");
-    EXPECT_EQ(text(p, "Name"), "027E5A244702");
-    EXPECT_EQ(text(p, "Description"), "Vexlan CNA Network Port");
+    EXPECT_EQ(propertyText(p, "DeviceID"), "VXC2447M0193_1");
+    EXPECT_EQ(propertyText(p, "Name"), "027E5A244702");
+    EXPECT_EQ(propertyText(p, "Description"), "Vexlan CNA Network Port");
     EXPECT_EQ(number(p, "Speed"), 10000u);
     EXPECT_EQ(number(p, "PortNumber"), 1u);
 
     OpResult g = host().getInstance(keyPath("Vexlan_NIC_NetworkPort", "DeviceID", "vxc2447m0193_1"));
     ASSERT_TRUE(g.ok()) << g.message;
     ASSERT_EQ(g.instances.size(), 1u);
-    EXPECT_EQ(text(g.instances[0], "DeviceID"), "VXC2447M0193_1");
+    EXPECT_EQ(propertyText(g.instances[0], "DeviceID"), "VXC2447M0193_1");
 }
 
 TEST_F(NicDefaultHost, PortControllerPerAdapterWithNicFunctions)
@@ -229,28 +123,28 @@ TEST_F(NicDefaultHost, PortControllerPerAdapterWithNicFunctions)
     OpResult r = enumerate(host(), "Vexlan_NIC_PortController");
     ASSERT_EQ(r.instances.size(), 1u);
     const Instance& c = r.instances[0];
-    EXPECT_EQ(names(c), (std::vector<std::string>{
+    EXPECT_EQ(propertyNames(c), (std::vector<std::string>{
                             "SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID", "Caption",
                             "Description", "Name", "ControllerType", "ProtocolSupported", "MaxNumberControlled",
                             "EnabledState", "RequestedState", "ElementName", "OperationalStatus",
                             "StatusDescriptions", "FC_WWN"}));
-    EXPECT_EQ(text(c, "DeviceID"), "VXC2447M0193_NIC");
-    EXPECT_EQ(text(c, "Caption"), "Vexlan CNA");
-    EXPECT_EQ(text(c, "Description"), "Vexlan Converged Network Adapter");
-    EXPECT_EQ(text(c, "Name"), "VXC2402");
+    EXPECT_EQ(propertyText(c, "DeviceID"), "VXC2447M0193_NIC");
+    EXPECT_EQ(propertyText(c, "Caption"), "Vexlan CNA");
+    EXPECT_EQ(propertyText(c, "Description"), "Vexlan Converged Network Adapter");
+    EXPECT_EQ(propertyText(c, "Name"), "VXC2402");
     EXPECT_EQ(number(c, "ControllerType"), 2u);
     EXPECT_EQ(number(c, "ProtocolSupported"), 1u);
     EXPECT_EQ(number(c, "MaxNumberControlled"), 0u);
     EXPECT_EQ(number(c, "EnabledState"), 5u);
     EXPECT_EQ(number(c, "RequestedState"), 12u);
-    EXPECT_EQ(text(c, "ElementName"), "CNA PortController");
+    EXPECT_EQ(propertyText(c, "ElementName"), "CNA PortController");
     EXPECT_EQ(single(c, "StatusDescriptions"), "OK");
-    EXPECT_EQ(text(c, "FC_WWN"), "3000027E5A24") << "six bytes of the adapter's node WWN";
+    EXPECT_EQ(propertyText(c, "FC_WWN"), "3000027E5A24") << "six bytes of the adapter's node WWN";
 
     OpResult g = host().getInstance(keyPath("Vexlan_NIC_PortController", "DeviceID", "VXC2447M0193_nic"));
     ASSERT_TRUE(g.ok()) << g.message;
     ASSERT_EQ(g.instances.size(), 1u);
-    EXPECT_EQ(text(g.instances[0], "DeviceID"), "VXC2447M0193_NIC");
+    EXPECT_EQ(propertyText(g.instances[0], "DeviceID"), "VXC2447M0193_NIC");
 }
 
 TEST_F(NicDefaultHost, EndpointsAndCapabilitiesShareThePortMac)
@@ -262,51 +156,51 @@ TEST_F(NicDefaultHost, EndpointsAndCapabilitiesShareThePortMac)
     ASSERT_EQ(ip.instances.size(), 2u);
     ASSERT_EQ(caps.instances.size(), 2u);
     for (std::size_t i = 0; i < 2; ++i) {
-        EXPECT_EQ(text(lan.instances[i], "Name"), text(ip.instances[i], "Name"));
-        EXPECT_EQ(text(ip.instances[i], "Name"), text(caps.instances[i], "InstanceID"));
+        EXPECT_EQ(propertyText(lan.instances[i], "Name"), propertyText(ip.instances[i], "Name"));
+        EXPECT_EQ(propertyText(ip.instances[i], "Name"), propertyText(caps.instances[i], "InstanceID"));
     }
 
     const Instance& l = lan.instances[1];
-    EXPECT_EQ(names(l), (std::vector<std::string>{"SystemCreationClassName", "SystemName", "CreationClassName",
+    EXPECT_EQ(propertyNames(l), (std::vector<std::string>{"SystemCreationClassName", "SystemName", "CreationClassName",
                                                   "Name", "NameFormat", "LANType", "MaxDataSize", "MACAddress",
                                                   "ElementName", "Caption"}));
-    EXPECT_EQ(text(l, "Name"), "027E5A244702");
-    EXPECT_EQ(text(l, "NameFormat"), "MAC based");
+    EXPECT_EQ(propertyText(l, "Name"), "027E5A244702");
+    EXPECT_EQ(propertyText(l, "NameFormat"), "MAC based");
     EXPECT_EQ(number(l, "LANType"), 2u);
     EXPECT_EQ(number(l, "MaxDataSize"), 9000u);
-    EXPECT_EQ(text(l, "MACAddress"), "027E5A244702");
-    EXPECT_EQ(text(l, "ElementName"), "LANEndPoint");
-    EXPECT_EQ(text(l, "Caption"), "Vexlan LANEndPoint");
+    EXPECT_EQ(propertyText(l, "MACAddress"), "027E5A244702");
+    EXPECT_EQ(propertyText(l, "ElementName"), "LANEndPoint");
+    EXPECT_EQ(propertyText(l, "Caption"), "Vexlan LANEndPoint");
 
     const Instance& e = ip.instances[0];
-    EXPECT_EQ(names(e), (std::vector<std::string>{"SystemCreationClassName", "SystemName", "CreationClassName",
+    EXPECT_EQ(propertyNames(e), (std::vector<std::string>{"SystemCreationClassName", "SystemName", "CreationClassName",
                                                   "Name", "AddressOrigin", "IPv4Address", "SubnetMask",
                                                   "IPv6Address", "ProtocolIFType", "Status", "HealthState",
                                                   "ElementName"}));
     EXPECT_EQ(number(e, "AddressOrigin"), 4u);
-    EXPECT_EQ(text(e, "IPv4Address"), "192.168.40.21");
-    EXPECT_EQ(text(e, "SubnetMask"), "255.255.255.0");
-    EXPECT_EQ(text(e, "IPv6Address"), "fe80::7e:5aff:fe24:4700") << "the first of the port's IPv6 addresses";
+    EXPECT_EQ(propertyText(e, "IPv4Address"), "192.168.40.21");
+    EXPECT_EQ(propertyText(e, "SubnetMask"), "255.255.255.0");
+    EXPECT_EQ(propertyText(e, "IPv6Address"), "fe80::7e:5aff:fe24:4700") << "the first of the port's IPv6 addresses";
     EXPECT_EQ(number(e, "ProtocolIFType"), 6u);
-    EXPECT_EQ(text(e, "Status"), "OK");
+    EXPECT_EQ(propertyText(e, "Status"), "OK");
     EXPECT_EQ(number(e, "HealthState"), 5u);
-    EXPECT_EQ(text(e, "ElementName"), "IPProtocolEndPoint");
+    EXPECT_EQ(propertyText(e, "ElementName"), "IPProtocolEndPoint");
 
     const Instance& c = caps.instances[0];
-    EXPECT_EQ(names(c),
+    EXPECT_EQ(propertyNames(c),
               (std::vector<std::string>{"InstanceID", "RequestedStatesSupported", "ElementName", "Caption"}));
     EXPECT_EQ(single(c, "RequestedStatesSupported"), "12");
-    EXPECT_EQ(text(c, "ElementName"), "IPProtocolEndPointCapabilities");
-    EXPECT_EQ(text(c, "Caption"), "027E5A244700");
+    EXPECT_EQ(propertyText(c, "ElementName"), "IPProtocolEndPointCapabilities");
+    EXPECT_EQ(propertyText(c, "Caption"), "027E5A244700");
 
     // Keys in lower case find the port; the answer carries the upper-case text.
     OpResult g = host().getInstance(keyPath("Vexlan_NIC_IPProtocolEndpointCapabilities", "InstanceID", "027e5a244702"));
     ASSERT_EQ(g.instances.size(), 1u) << g.message;
-    EXPECT_EQ(text(g.instances[0], "InstanceID"), "027E5A244702");
+    EXPECT_EQ(propertyText(g.instances[0], "InstanceID"), "027E5A244702");
     for (const char* cls : {"Vexlan_NIC_LANEndpoint", "Vexlan_NIC_IPProtocolEndpoint"}) {
         g = host().getInstance(keyPath(cls, "Name", "027e5a244700"));
         ASSERT_EQ(g.instances.size(), 1u) << cls << ": " << g.message;
-        EXPECT_EQ(text(g.instances[0], "Name"), "027E5A244700") << cls;
+        EXPECT_EQ(propertyText(g.instances[0], "Name"), "027E5A244700") << cls;
     }
 
     // The remote access point has no route: its class answers empty.
@@ -360,7 +254,7 @@ TEST_F(NicDefaultHost, PropertyListKeepsTheKeys)
                                            std::vector<std::string>{"Speed"});
     ASSERT_TRUE(r.ok()) << r.message;
     ASSERT_EQ(r.instances.size(), 2u);
-    EXPECT_EQ(names(r.instances[0]),
+    EXPECT_EQ(propertyNames(r.instances[0]),
               (std::vector<std::string>{"SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID",
                                         "Speed"}));
 }
@@ -377,21 +271,21 @@ TEST_F(NicDefaultHost, NicProfileChainOfEightWithTwoSixes)
     OpResult r = enumerate(host(), "Vexlan_NIC_RegisteredProfile");
     ASSERT_EQ(r.instances.size(), 8u);
     const Instance& ip = r.instances[2];
-    EXPECT_EQ(names(ip), (std::vector<std::string>{"InstanceID", "Caption", "Description", "ElementName",
+    EXPECT_EQ(propertyNames(ip), (std::vector<std::string>{"InstanceID", "Caption", "Description", "ElementName",
                                                    "RegisteredOrganization", "RegisteredName", "RegisteredVersion",
                                                    "AdvertiseTypes", "AdvertiseTypeDescriptions"}));
-    EXPECT_EQ(text(ip, "Caption"), "Vexlan NIC IP Interface Profile");
-    EXPECT_EQ(text(ip, "ElementName"), "IP Interface Profile");
-    EXPECT_EQ(text(ip, "RegisteredVersion"), "1.0.1");
+    EXPECT_EQ(propertyText(ip, "Caption"), "Vexlan NIC IP Interface Profile");
+    EXPECT_EQ(propertyText(ip, "ElementName"), "IP Interface Profile");
+    EXPECT_EQ(propertyText(ip, "RegisteredVersion"), "1.0.1");
     EXPECT_EQ(number(ip, "RegisteredOrganization"), 2u);
     EXPECT_EQ(single(ip, "AdvertiseTypes"), "3");
     EXPECT_EQ(single(ip, "AdvertiseTypeDescriptions"), "slp");
-    EXPECT_EQ(text(r.instances[6], "RegisteredName"), "Vexlan_SoftwareUpdate");
+    EXPECT_EQ(propertyText(r.instances[6], "RegisteredName"), "Vexlan_SoftwareUpdate");
 
     OpResult six = host().getInstance(keyPath("Vexlan_NIC_RegisteredProfile", "InstanceID", "6"));
     ASSERT_EQ(six.instances.size(), 1u) << six.message;
-    EXPECT_EQ(text(six.instances[0], "ElementName"), "Software Inventory Profile");
-    EXPECT_EQ(text(six.instances[0], "RegisteredName"), "Vexlan_SoftwareInventory");
+    EXPECT_EQ(propertyText(six.instances[0], "ElementName"), "Software Inventory Profile");
+    EXPECT_EQ(propertyText(six.instances[0], "RegisteredName"), "Vexlan_SoftwareInventory");
 }
 
 TEST_F(NicDefaultHost, ObjectManagerCommunicationMechanismAndNamespaces)
@@ -399,13 +293,13 @@ TEST_F(NicDefaultHost, ObjectManagerCommunicationMechanismAndNamespaces)
     OpResult om = enumerate(host(), "Vexlan_FCHBA_ObjectManager");
     ASSERT_EQ(om.instances.size(), 1u);
     const Instance& m = om.instances[0];
-    EXPECT_EQ(names(m), (std::vector<std::string>{"SystemCreationClassName", "SystemName", "CreationClassName",
+    EXPECT_EQ(propertyNames(m), (std::vector<std::string>{"SystemCreationClassName", "SystemName", "CreationClassName",
                                                   "Name", "ElementName", "Description", "OperationalStatus",
                                                   "StatusDescriptions", "Started"}));
-    const std::string hostName = text(m, "SystemName");
-    EXPECT_EQ(text(m, "Name"), "pegasus:" + hostName);
-    EXPECT_EQ(text(m, "ElementName"), "Pegasus CIM Server");
-    EXPECT_EQ(text(m, "Description"), "Pegasus CIM Server");
+    const std::string hostName = propertyText(m, "SystemName");
+    EXPECT_EQ(propertyText(m, "Name"), "pegasus:" + hostName);
+    EXPECT_EQ(propertyText(m, "ElementName"), "Pegasus CIM Server");
+    EXPECT_EQ(propertyText(m, "Description"), "Pegasus CIM Server");
     EXPECT_TRUE(m.property("Started") != nullptr && m.property("Started")->b);
     OpResult omPath = host().enumerateInstanceNames(classPath("Vexlan_FCHBA_ObjectManager"));
     ASSERT_EQ(omPath.paths.size(), 1u);
@@ -417,15 +311,15 @@ TEST_F(NicDefaultHost, ObjectManagerCommunicationMechanismAndNamespaces)
     OpResult cm = enumerate(host(), "Vexlan_FCHBA_CIMXMLCommMech");
     ASSERT_EQ(cm.instances.size(), 1u);
     const Instance& c = cm.instances[0];
-    EXPECT_EQ(names(c), (std::vector<std::string>{
+    EXPECT_EQ(propertyNames(c), (std::vector<std::string>{
                             "SystemCreationClassName", "SystemName", "CreationClassName", "Name", "ElementName",
                             "CommunicationMechanism", "OtherCommunicationMechanismDescription", "Version",
                             "OperationalStatus", "StatusDescriptions", "FunctionalProfilesSupported",
                             "FunctionalProfileDescriptions", "AuthenticationMechanismsSupported",
                             "AuthenticationMechanismDescriptions", "MultipleOperationsSupported", "CIMValidated"}));
-    EXPECT_EQ(text(c, "Name"), "CIMXML Communication Mechanism");
-    EXPECT_EQ(text(c, "OtherCommunicationMechanismDescription"), "") << "present and empty";
-    EXPECT_EQ(text(c, "Version"), "1.0");
+    EXPECT_EQ(propertyText(c, "Name"), "CIMXML Communication Mechanism");
+    EXPECT_EQ(propertyText(c, "OtherCommunicationMechanismDescription"), "") << "present and empty";
+    EXPECT_EQ(propertyText(c, "Version"), "1.0");
     ASSERT_EQ(c.property("FunctionalProfileDescriptions")->elems.size(), 3u);
     EXPECT_EQ(c.property("FunctionalProfileDescriptions")->elems[1].s, "Association Traversal");
     EXPECT_EQ(c.property("FunctionalProfilesSupported")->elems[2].u, 9u);
@@ -435,15 +329,15 @@ TEST_F(NicDefaultHost, ObjectManagerCommunicationMechanismAndNamespaces)
 
     OpResult ns = enumerate(host(), "Vexlan_FCHBA_Namespace");
     ASSERT_EQ(ns.instances.size(), 2u);
-    EXPECT_EQ(text(ns.instances[0], "Name"), "root/vexlan_cmpi");
-    EXPECT_EQ(text(ns.instances[1], "Name"), "root/PG_InterOp");
-    EXPECT_EQ(text(ns.instances[1], "ObjectManagerName"), "pegasus:" + hostName);
+    EXPECT_EQ(propertyText(ns.instances[0], "Name"), "root/vexlan_cmpi");
+    EXPECT_EQ(propertyText(ns.instances[1], "Name"), "root/PG_InterOp");
+    EXPECT_EQ(propertyText(ns.instances[1], "ObjectManagerName"), "pegasus:" + hostName);
     EXPECT_EQ(number(ns.instances[1], "ClassType"), 2u);
     EXPECT_EQ(number(ns.instances[1], "ClassInfo"), 1u);
-    EXPECT_EQ(text(ns.instances[1], "DescriptionOfClassInfo"), "Unknown Version");
+    EXPECT_EQ(propertyText(ns.instances[1], "DescriptionOfClassInfo"), "Unknown Version");
     OpResult nsGet = host().getInstance(keyPath("Vexlan_FCHBA_Namespace", "Name", "ROOT/VEXLAN_CMPI"));
     ASSERT_EQ(nsGet.instances.size(), 1u) << nsGet.message;
-    EXPECT_EQ(text(nsGet.instances[0], "Name"), "root/vexlan_cmpi");
+    EXPECT_EQ(propertyText(nsGet.instances[0], "Name"), "root/vexlan_cmpi");
     OpResult nsNames = host().enumerateInstanceNames(classPath("Vexlan_FCHBA_Namespace"));
     ASSERT_EQ(nsNames.paths.size(), 2u);
     EXPECT_EQ(keyNames(nsNames.paths[1]),
@@ -484,22 +378,10 @@ const char kTestAdapters[] = R"({
 
 }  // namespace
 
-class NicTestAdapters : public ::testing::Test {
+class NicTestAdapters : public ProviderSuite<NicTestAdapters> {
 protected:
-    static void SetUpTestSuite()
-    {
-        ASSERT_EQ(zorap_sim_load_json(kTestAdapters), 0);
-        host_ = new ProviderHost(kLogsOn);
-    }
-    static void TearDownTestSuite()
-    {
-        delete host_;
-        host_ = nullptr;
-    }
-    static Host& host() { return **host_; }
-    static ProviderHost* host_;
+    static void SetUpTestSuite() { startSuite(kLogsOn, kTestAdapters, nullptr); }
 };
-ProviderHost* NicTestAdapters::host_ = nullptr;
 
 TEST_F(NicTestAdapters, LinkStatesAndSpeeds)
 {
@@ -523,8 +405,8 @@ TEST_F(NicTestAdapters, LinkStatesAndSpeeds)
     };
     for (std::size_t i = 0; i < 6; ++i) {
         const auto& x = expected[i];
-        EXPECT_EQ(text(eth.instances[i], "DeviceID"), x.mac) << i;
-        EXPECT_EQ(text(net.instances[i], "Name"), x.mac) << i;
+        EXPECT_EQ(propertyText(eth.instances[i], "DeviceID"), x.mac) << i;
+        EXPECT_EQ(propertyText(net.instances[i], "Name"), x.mac) << i;
         for (const OpResult* r : {&eth, &net}) {
             EXPECT_EQ(single(r->instances[i], "OperationalStatus"), x.status) << x.mac;
             EXPECT_EQ(single(r->instances[i], "StatusDescriptions"), x.description) << x.mac;
@@ -533,34 +415,34 @@ TEST_F(NicTestAdapters, LinkStatesAndSpeeds)
         EXPECT_EQ(number(net.instances[i], "Speed"), x.networkSpeed) << x.mac;
         EXPECT_EQ(number(eth.instances[i], "MaxSpeed"), 10625000000u);
     }
-    EXPECT_EQ(text(net.instances[4], "DeviceID"), "VXN0001_4");
-    EXPECT_EQ(text(net.instances[5], "DeviceID"), "VXN0001_0");
+    EXPECT_EQ(propertyText(net.instances[4], "DeviceID"), "VXN0001_4");
+    EXPECT_EQ(propertyText(net.instances[5], "DeviceID"), "VXN0001_0");
 }
 
 TEST_F(NicTestAdapters, FCoELinkagePresentAndAbsent)
 {
     OpResult eth = enumerate(host(), "Vexlan_NIC_EthernetPort2");
     ASSERT_EQ(eth.instances.size(), 6u);
-    EXPECT_EQ(text(eth.instances[0], "FC_WWN"), "31-00-00-00-00-00-01-00");
-    EXPECT_EQ(text(eth.instances[0], "FC_PortID"), "01-02-03");
-    EXPECT_EQ(text(eth.instances[0], "FC_ENodeMACAddress"), "020000000101");
+    EXPECT_EQ(propertyText(eth.instances[0], "FC_WWN"), "31-00-00-00-00-00-01-00");
+    EXPECT_EQ(propertyText(eth.instances[0], "FC_PortID"), "01-02-03");
+    EXPECT_EQ(propertyText(eth.instances[0], "FC_ENodeMACAddress"), "020000000101");
     for (const char* fc : {"FC_WWN", "FC_PortID", "FC_ENodeMACAddress"})
-        EXPECT_EQ(text(eth.instances[1], fc), "") << fc << " is present and empty";
+        EXPECT_EQ(propertyText(eth.instances[1], fc), "") << fc << " is present and empty";
 }
 
 TEST_F(NicTestAdapters, AddressesPresentEmptyOrAbsent)
 {
     OpResult ip = enumerate(host(), "Vexlan_NIC_IPProtocolEndpoint");
     ASSERT_EQ(ip.instances.size(), 6u);
-    EXPECT_EQ(text(ip.instances[0], "IPv4Address"), "10.1.2.3");
-    EXPECT_EQ(text(ip.instances[0], "SubnetMask"), "255.255.255.0");
-    EXPECT_EQ(text(ip.instances[0], "IPv6Address"), "fd00::1:2");
+    EXPECT_EQ(propertyText(ip.instances[0], "IPv4Address"), "10.1.2.3");
+    EXPECT_EQ(propertyText(ip.instances[0], "SubnetMask"), "255.255.255.0");
+    EXPECT_EQ(propertyText(ip.instances[0], "IPv6Address"), "fd00::1:2");
     // No IPv4 address: the record's type is 0 and the text is empty, present.
-    EXPECT_EQ(text(ip.instances[1], "IPv4Address"), "");
-    EXPECT_EQ(text(ip.instances[1], "SubnetMask"), "");
+    EXPECT_EQ(propertyText(ip.instances[1], "IPv4Address"), "");
+    EXPECT_EQ(propertyText(ip.instances[1], "SubnetMask"), "");
     // No IPv6 address: the property is absent.
     EXPECT_EQ(ip.instances[1].property("IPv6Address"), nullptr);
-    EXPECT_EQ(names(ip.instances[1]).size(), 11u);
+    EXPECT_EQ(propertyNames(ip.instances[1]).size(), 11u);
 }
 
 TEST_F(NicTestAdapters, LowerCaseMacKeysFindTheirPort)
@@ -579,7 +461,7 @@ TEST_F(NicTestAdapters, LowerCaseMacKeysFindTheirPort)
         OpResult g = host().getInstance(keyPath(c.cls, c.key, "02abcdef0108"));
         ASSERT_TRUE(g.ok()) << c.cls << ": " << g.message;
         ASSERT_EQ(g.instances.size(), 1u) << c.cls;
-        EXPECT_EQ(text(g.instances[0], c.answer), "02ABCDEF0108") << c.cls;
+        EXPECT_EQ(propertyText(g.instances[0], c.answer), "02ABCDEF0108") << c.cls;
     }
     OpResult lan = host().getInstance(keyPath("Vexlan_NIC_LANEndpoint", "Name", "02abcdef0108"));
     EXPECT_EQ(number(lan.instances[0], "MaxDataSize"), 9000u);
@@ -589,58 +471,50 @@ TEST_F(NicTestAdapters, TwoAdaptersWithOneSerial)
 {
     OpResult pc = enumerate(host(), "Vexlan_NIC_PortController");
     ASSERT_EQ(pc.instances.size(), 2u) << "one per adapter with NIC functions; the FC adapter has none";
-    EXPECT_EQ(text(pc.instances[0], "DeviceID"), "VXN0001_NIC");
-    EXPECT_EQ(text(pc.instances[1], "DeviceID"), "VXN0001_NIC");
-    EXPECT_EQ(text(pc.instances[0], "FC_WWN"), "301122334455");
-    EXPECT_EQ(text(pc.instances[1], "FC_WWN"), "000000000000");
+    EXPECT_EQ(propertyText(pc.instances[0], "DeviceID"), "VXN0001_NIC");
+    EXPECT_EQ(propertyText(pc.instances[1], "DeviceID"), "VXN0001_NIC");
+    EXPECT_EQ(propertyText(pc.instances[0], "FC_WWN"), "301122334455");
+    EXPECT_EQ(propertyText(pc.instances[1], "FC_WWN"), "000000000000");
 
     OpResult g = host().getInstance(keyPath("Vexlan_NIC_PortController", "DeviceID", "vxn0001_nic"));
     ASSERT_EQ(g.instances.size(), 1u) << g.message;
-    EXPECT_EQ(text(g.instances[0], "Name"), "VXN4-A") << "the first adapter answers";
+    EXPECT_EQ(propertyText(g.instances[0], "Name"), "VXN4-A") << "the first adapter answers";
 
     // Both adapters' first ports share the NetworkPort key: the first answers.
     OpResult n = host().getInstance(keyPath("Vexlan_NIC_NetworkPort", "DeviceID", "VXN0001_0"));
     ASSERT_EQ(n.instances.size(), 1u) << n.message;
-    EXPECT_EQ(text(n.instances[0], "Name"), "020000000100");
+    EXPECT_EQ(propertyText(n.instances[0], "Name"), "020000000100");
 }
 
 // ---- Configured texts ------------------------------------------------------------------
 
-class NicConfiguredTexts : public ::testing::Test {
+class NicConfiguredTexts : public ProviderSuite<NicConfiguredTexts> {
 protected:
     static void SetUpTestSuite()
     {
-        zorap_sim_load_default();
-        host_ = new ProviderHost("ErrorLog=1\n"
-                                 "CIMOMNameVersion=Vexlan 100%% CIM %s%s%n %d\n"
-                                 "InteropNamespace=root/interop\n"
-                                 "CIMSchemaVersion=2.41.0\n");
+        startSuite("ErrorLog=1\n"
+                   "CIMOMNameVersion=Vexlan 100%% CIM %s%s%n %d\n"
+                   "InteropNamespace=root/interop\n"
+                   "CIMSchemaVersion=2.41.0\n",
+                   nullptr, nullptr);
     }
-    static void TearDownTestSuite()
-    {
-        delete host_;
-        host_ = nullptr;
-    }
-    static Host& host() { return **host_; }
-    static ProviderHost* host_;
 };
-ProviderHost* NicConfiguredTexts::host_ = nullptr;
 
 TEST_F(NicConfiguredTexts, ServerNameShownAsConfiguredWithPercentSignsLiteral)
 {
     OpResult om = enumerate(host(), "Vexlan_FCHBA_ObjectManager");
     ASSERT_EQ(om.instances.size(), 1u);
-    EXPECT_EQ(text(om.instances[0], "ElementName"), "Vexlan 100% CIM %s%s%n %d");
-    EXPECT_EQ(text(om.instances[0], "Description"), "Vexlan 100% CIM %s%s%n %d");
+    EXPECT_EQ(propertyText(om.instances[0], "ElementName"), "Vexlan 100% CIM %s%s%n %d");
+    EXPECT_EQ(propertyText(om.instances[0], "Description"), "Vexlan 100% CIM %s%s%n %d");
 }
 
 TEST_F(NicConfiguredTexts, InteropNamespaceRowFollowsTheSettings)
 {
     OpResult ns = enumerate(host(), "Vexlan_FCHBA_Namespace");
     ASSERT_EQ(ns.instances.size(), 2u);
-    EXPECT_EQ(text(ns.instances[0], "Name"), "root/vexlan_cmpi");
-    EXPECT_EQ(text(ns.instances[1], "Name"), "root/interop");
-    EXPECT_EQ(text(ns.instances[1], "DescriptionOfClassInfo"), "2.41.0");
+    EXPECT_EQ(propertyText(ns.instances[0], "Name"), "root/vexlan_cmpi");
+    EXPECT_EQ(propertyText(ns.instances[1], "Name"), "root/interop");
+    EXPECT_EQ(propertyText(ns.instances[1], "DescriptionOfClassInfo"), "2.41.0");
     OpResult g = host().getInstance(keyPath("Vexlan_FCHBA_Namespace", "Name", "Root/Interop"));
     ASSERT_EQ(g.instances.size(), 1u) << g.message;
     OpResult miss = host().getInstance(keyPath("Vexlan_FCHBA_Namespace", "Name", "root/PG_InterOp"));

@@ -53,26 +53,6 @@ ObjectPath systemPath(const char* className, const char* keyName, const std::str
                                 {keyName, key}});
 }
 
-Names keyNames(const ObjectPath& p)
-{
-    Names names;
-    for (const auto& k : p.keys)
-        names.push_back(k.first);
-    return names;
-}
-
-const Value& scalar(const Instance& inst, const std::string& name, Type type)
-{
-    static const Value missing;
-    const Value* v = inst.property(name);
-    EXPECT_NE(v, nullptr) << name;
-    if (v == nullptr)
-        return missing;
-    EXPECT_EQ(v->type, type) << name;
-    EXPECT_FALSE(v->array) << name;
-    return *v;
-}
-
 // The elements of an array property of the given element type.
 std::vector<Value> elements(const Instance& inst, const std::string& name, Type type)
 {
@@ -85,14 +65,6 @@ std::vector<Value> elements(const Instance& inst, const std::string& name, Type 
     return v->elems;
 }
 
-OpResult enumerate(Host& host, const char* className)
-{
-    OpResult r = host.enumerateInstances(classPath(className));
-    EXPECT_TRUE(r.ok()) << className << ": " << r.message;
-    EXPECT_TRUE(r.strictErrors.empty()) << className << ": " << (r.strictErrors.empty() ? "" : r.strictErrors[0]);
-    return r;
-}
-
 std::vector<std::string> texts(const OpResult& r, const std::string& name)
 {
     std::vector<std::string> out;
@@ -101,40 +73,14 @@ std::vector<std::string> texts(const OpResult& r, const std::string& name)
     return out;
 }
 
-void start(Host& host, const json* description)
-{
-    writeSettings(kLogsOn, "");
-    removeLog();
-    if (description != nullptr)
-        ASSERT_EQ(0, zorap_sim_load_json(description->dump().c_str()));
-    else
-        ASSERT_EQ(0, zorap_sim_load_default());
-    zorap_sim_reset();
-    prepareHost(host);
-    ASSERT_TRUE(host.enumerateInstanceNames(classPath(kController)).ok());
-}
-
 }  // namespace
 
 // ---- The default host ------------------------------------------------------------
 
-class PhysicalDefaultHost : public ::testing::Test {
+class PhysicalDefaultHost : public ProviderSuite<PhysicalDefaultHost> {
 protected:
-    static void SetUpTestSuite()
-    {
-        host_ = new Host;
-        start(*host_, nullptr);
-    }
-    static void TearDownTestSuite()
-    {
-        delete host_;
-        host_ = nullptr;
-        zorap_sim_reset();
-    }
-    void TearDown() override { zorap_sim_reset(); }
-    static Host* host_;
+    static void SetUpTestSuite() { startSuite(kLogsOn, nullptr, kController); }
 };
-Host* PhysicalDefaultHost::host_ = nullptr;
 
 TEST_F(PhysicalDefaultHost, ControllerAndEndpointsOnePerFCFunction)
 {
@@ -561,7 +507,7 @@ TEST(PhysicalHosts, SixtyFourAdaptersOfFourFCFunctionsEach)
 {
     json description = fctest::wideHost();
     Host host;
-    start(host, &description);
+    startProvider(host, kLogsOn, description.dump().c_str(), kController);
     EXPECT_EQ(enumerate(host, kController).instances.size(), 256u);
     EXPECT_EQ(enumerate(host, kEndpointHBA).instances.size(), 256u);
     EXPECT_EQ(enumerate(host, kPackage).instances.size(), 64u);

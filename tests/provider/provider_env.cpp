@@ -147,4 +147,48 @@ std::vector<std::string> propertyNames(const cimhost::Instance& inst)
     return names;
 }
 
+std::vector<std::string> keyNames(const cimhost::ObjectPath& path)
+{
+    std::vector<std::string> names;
+    for (const auto& k : path.keys)
+        names.push_back(k.first);
+    return names;
+}
+
+const cimhost::Value& scalar(const cimhost::Instance& inst, const std::string& name, cimhost::Type type)
+{
+    static const cimhost::Value missing;
+    const cimhost::Value* v = inst.property(name);
+    EXPECT_NE(v, nullptr) << name;
+    if (v == nullptr)
+        return missing;
+    EXPECT_EQ(v->type, type) << name;
+    EXPECT_FALSE(v->array) << name;
+    return *v;
+}
+
+cimhost::OpResult enumerate(cimhost::Host& host, const std::string& className)
+{
+    cimhost::OpResult r = host.enumerateInstances(classPath(className));
+    EXPECT_TRUE(r.ok()) << className << ": " << r.message;
+    EXPECT_TRUE(r.strictErrors.empty()) << className << ": " << (r.strictErrors.empty() ? "" : r.strictErrors[0]);
+    return r;
+}
+
+void startProvider(cimhost::Host& host, const std::string& optSettings, const char* description,
+                   const char* firstClass)
+{
+    writeSettings(optSettings, "");
+    removeLog();
+    if (description != nullptr)
+        ASSERT_EQ(0, zorap_sim_load_json(description));
+    else
+        ASSERT_EQ(0, zorap_sim_load_default());
+    zorap_sim_reset();
+    prepareHost(host);
+    if (firstClass != nullptr) {
+        ASSERT_TRUE(host.enumerateInstanceNames(classPath(firstClass)).ok());
+    }
+}
+
 }  // namespace provtest

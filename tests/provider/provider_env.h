@@ -8,7 +8,10 @@
 #include <string>
 #include <vector>
 
+#include <gtest/gtest.h>
+
 #include "cimhost/host.h"
+#include "zorap_sim_control.h"
 
 namespace provtest {
 
@@ -52,5 +55,44 @@ int threadCount();
 
 std::string propertyText(const cimhost::Instance& inst, const std::string& name);
 std::vector<std::string> propertyNames(const cimhost::Instance& inst);
+
+std::vector<std::string> keyNames(const cimhost::ObjectPath& path);
+
+// A scalar property, checked for its CIM type (a missing one fails the test
+// and gives an empty value).
+const cimhost::Value& scalar(const cimhost::Instance& inst, const std::string& name, cimhost::Type type);
+
+// enumerateInstances, expected to succeed with nothing for strict mode to
+// object to.
+cimhost::OpResult enumerate(cimhost::Host& host, const std::string& className);
+
+// Starts the provider with `optSettings` as the settings under /opt, no log
+// yet and the adapter description `description` (JSON; null: the default
+// host). With `firstClass` a first enumerateInstanceNames of that class makes
+// the provider build its lists before the test goes on.
+void startProvider(cimhost::Host& host, const std::string& optSettings, const char* description,
+                   const char* firstClass);
+
+// A suite that shares one provider load: its SetUpTestSuite calls
+// startSuite(); the host goes at the suite's end, and the adapter library's
+// injected faults are cleared after every test.
+template <class Suite>
+class ProviderSuite : public ::testing::Test {
+protected:
+    static void startSuite(const std::string& optSettings, const char* description, const char* firstClass)
+    {
+        host_ = new cimhost::Host;
+        startProvider(*host_, optSettings, description, firstClass);
+    }
+    static void TearDownTestSuite()
+    {
+        delete host_;
+        host_ = nullptr;
+        zorap_sim_reset();
+    }
+    void TearDown() override { zorap_sim_reset(); }
+    static cimhost::Host& host() { return *host_; }
+    static inline cimhost::Host* host_ = nullptr;
+};
 
 }  // namespace provtest
