@@ -256,17 +256,12 @@ const PropertyRow<PhysicalConnectorEntry> kProperties[] = {
     {"SFPStatus", CMPI_uint16, CLASS_VALUE(PhysicalConnectorEntry, CmpiData(static_cast<CMPIUint16>(e.sfp.SFPStatus)))},
 };
 
-// The property filter keeps Tag alone, while the path also carries
-// CreationClassName.
-const char* const kFilterKeys[] = {"Tag", nullptr};
-const char* const kPathKeys[] = {"CreationClassName", "Tag", nullptr};
-
 const ClassModule<PhysicalConnectorEntry> kPhysicalConnector =
     ClassModule<PhysicalConnectorEntry>("PhysicalConnector")
         .list(g_PhysicalConnectorList, ListKind::Dense)
         .key("Tag", [](const PhysicalConnectorEntry& e) -> const char* { return e.tag; })
-        .filterKeys(kFilterKeys)
-        .pathKeys(kPathKeys)
+        .filterKeys(kPhysicalTagFilterKeys)
+        .pathKeys(kPhysicalTagPathKeys)
         .properties(kProperties)
         .enumerationsTestValid();
 
@@ -278,21 +273,4 @@ VEXLAN_LIST_CLASS_OPERATIONS(PhysicalConnector, kPhysicalConnector)
 // The NIC side's way in: the slot whose tag is the port's, the library's
 // records looked up anew for each slot.
 // ---------------------------------------------------------------------------
-int findSlot_Nic_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port)
-{
-    return findNicTagSlot(g_PhysicalConnectorList, calcTag_PhysicalConnector, cna, port);
-}
-
-CmpiObjectPath makePath_Nic_PhysicalConnector(const char* className, const char* nameSpace, _CNAStruc* cna,
-                                              _CNAPortStruc* port)
-{
-    PHYSICAL_DEBUG("Vexlan_NIC_PhysicalConnector makePath_PhysicalConnector was called\n");
-    return classmodule::pathOfSlot(makePath_PhysicalConnector, findSlot_Nic_PhysicalConnector(cna, port), className, nameSpace);
-}
-
-CmpiInstance makeInstance_Nic_PhysicalConnector(const char* className, const char* nameSpace,
-                                                const char** properties, _CNAStruc* cna, _CNAPortStruc* port)
-{
-    return classmodule::instanceOfSlot(makeInstance_PhysicalConnector, findSlot_Nic_PhysicalConnector(cna, port), className, nameSpace,
-                                       properties);
-}
+VEXLAN_PHYSICAL_NIC_OPERATIONS(PhysicalConnector)

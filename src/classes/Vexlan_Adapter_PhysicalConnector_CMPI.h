@@ -20,6 +20,12 @@ struct PhysicalConnectorEntry {
 
 extern ClassList<PhysicalConnectorEntry> g_PhysicalConnectorList;
 
+// The keys of the two tag classes (PhysicalConnector, PhysicalPort): the
+// property filter keeps Tag alone, while the path also carries
+// CreationClassName.
+inline const char* const kPhysicalTagFilterKeys[] = {"Tag", nullptr};
+inline const char* const kPhysicalTagPathKeys[] = {"CreationClassName", "Tag", nullptr};
+
 // Size of the tag texts that the Create and calcTag functions write (`out`
 // must hold it), and of each part that the Parse functions write.
 constexpr std::size_t kPhysicalTagSize = 128;
@@ -64,12 +70,36 @@ void removePhysicalConnectorList();
 
 VEXLAN_DECLARE_LIST_CLASS_OPERATIONS(PhysicalConnector);
 
-// The first slot whose tag is that of the NIC port, or -1.
-int findSlot_Nic_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port);
-// The indexed operations on that slot; with none, a null handle (isNull()).
-CmpiObjectPath makePath_Nic_PhysicalConnector(const char* className, const char* nameSpace, _CNAStruc* cna,
-                                              _CNAPortStruc* port);
-CmpiInstance makeInstance_Nic_PhysicalConnector(const char* className, const char* nameSpace,
-                                                const char** properties, _CNAStruc* cna, _CNAPortStruc* port);
+// The NIC side's way into the tag list of X (PhysicalConnector,
+// PhysicalPort): findSlot_Nic_X, the first slot whose tag is that of the NIC
+// port (worked out anew for each slot) or -1, and the indexed operations on
+// that slot; with none, a null handle (isNull()).
+#define VEXLAN_DECLARE_PHYSICAL_NIC_OPERATIONS(X)                                                          \
+    int findSlot_Nic_##X(_CNAStruc* cna, _CNAPortStruc* port);                                            \
+    CmpiObjectPath makePath_Nic_##X(const char* className, const char* nameSpace, _CNAStruc* cna,        \
+                                    _CNAPortStruc* port);                                                 \
+    CmpiInstance makeInstance_Nic_##X(const char* className, const char* nameSpace, const char** properties, \
+                                      _CNAStruc* cna, _CNAPortStruc* port)
+
+// Their definitions, from g_XList, calcTag_X, makePath_X and makeInstance_X.
+#define VEXLAN_PHYSICAL_NIC_OPERATIONS(X)                                                                  \
+    int findSlot_Nic_##X(_CNAStruc* cna, _CNAPortStruc* port)                                             \
+    {                                                                                                     \
+        return findNicTagSlot(g_##X##List, calcTag_##X, cna, port);                                       \
+    }                                                                                                     \
+    CmpiObjectPath makePath_Nic_##X(const char* className, const char* nameSpace, _CNAStruc* cna,        \
+                                    _CNAPortStruc* port)                                                  \
+    {                                                                                                     \
+        PHYSICAL_DEBUG("Vexlan_NIC_" #X " makePath_" #X " was called\n");                                \
+        return classmodule::pathOfSlot(makePath_##X, findSlot_Nic_##X(cna, port), className, nameSpace);  \
+    }                                                                                                     \
+    CmpiInstance makeInstance_Nic_##X(const char* className, const char* nameSpace, const char** properties, \
+                                      _CNAStruc* cna, _CNAPortStruc* port)                                \
+    {                                                                                                     \
+        return classmodule::instanceOfSlot(makeInstance_##X, findSlot_Nic_##X(cna, port), className,      \
+                                           nameSpace, properties);                                        \
+    }
+
+VEXLAN_DECLARE_PHYSICAL_NIC_OPERATIONS(PhysicalConnector);
 
 #endif

@@ -113,17 +113,12 @@ const PropertyRow<PhysicalPortEntry> kProperties[] = {
     {"PortNumber", CMPI_uint16, CLASS_VALUE(PhysicalPortEntry, CmpiData(static_cast<CMPIUint16>(e.portNumber)))},
 };
 
-// The property filter keeps Tag alone, while the path also carries
-// CreationClassName.
-const char* const kFilterKeys[] = {"Tag", nullptr};
-const char* const kPathKeys[] = {"CreationClassName", "Tag", nullptr};
-
 const ClassModule<PhysicalPortEntry> kPhysicalPort =
     ClassModule<PhysicalPortEntry>("PhysicalPort")
         .list(g_PhysicalPortList, ListKind::Dense)
         .key("Tag", [](const PhysicalPortEntry& e) -> const char* { return e.tag; })
-        .filterKeys(kFilterKeys)
-        .pathKeys(kPathKeys)
+        .filterKeys(kPhysicalTagFilterKeys)
+        .pathKeys(kPhysicalTagPathKeys)
         .properties(kProperties)
         .enumerationsTestValid();
 
@@ -131,21 +126,4 @@ const ClassModule<PhysicalPortEntry> kPhysicalPort =
 
 VEXLAN_LIST_CLASS_OPERATIONS(PhysicalPort, kPhysicalPort)
 
-int findSlot_Nic_PhysicalPort(_CNAStruc* cna, _CNAPortStruc* port)
-{
-    return findNicTagSlot(g_PhysicalPortList, calcTag_PhysicalPort, cna, port);
-}
-
-CmpiObjectPath makePath_Nic_PhysicalPort(const char* className, const char* nameSpace, _CNAStruc* cna,
-                                         _CNAPortStruc* port)
-{
-    PHYSICAL_DEBUG("Vexlan_NIC_PhysicalPort makePath_PhysicalPort was called\n");
-    return classmodule::pathOfSlot(makePath_PhysicalPort, findSlot_Nic_PhysicalPort(cna, port), className, nameSpace);
-}
-
-CmpiInstance makeInstance_Nic_PhysicalPort(const char* className, const char* nameSpace, const char** properties,
-                                           _CNAStruc* cna, _CNAPortStruc* port)
-{
-    return classmodule::instanceOfSlot(makeInstance_PhysicalPort, findSlot_Nic_PhysicalPort(cna, port), className, nameSpace,
-                                       properties);
-}
+VEXLAN_PHYSICAL_NIC_OPERATIONS(PhysicalPort)

@@ -32,12 +32,7 @@ void removePhysicalPortList();
 
 VEXLAN_DECLARE_LIST_CLASS_OPERATIONS(PhysicalPort);
 
-// The first slot whose tag is that of the NIC port, or -1.
-int findSlot_Nic_PhysicalPort(_CNAStruc* cna, _CNAPortStruc* port);
-// The indexed operations on that slot; with none, a null handle (isNull()).
-CmpiObjectPath makePath_Nic_PhysicalPort(const char* className, const char* nameSpace, _CNAStruc* cna,
-                                         _CNAPortStruc* port);
-CmpiInstance makeInstance_Nic_PhysicalPort(const char* className, const char* nameSpace, const char** properties,
-                                           _CNAStruc* cna, _CNAPortStruc* port);
+// findSlot_Nic_PhysicalPort and the NIC-side operations on its slot.
+VEXLAN_DECLARE_PHYSICAL_NIC_OPERATIONS(PhysicalPort);
 
 #endif
