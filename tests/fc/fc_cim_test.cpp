@@ -25,7 +25,6 @@ using fctest::json;
 
 namespace {
 
-const char kLogsOn[] = "DebugLog=1\nErrorLog=1\n";
 const char kFCPort[] = "Vexlan_FCHBA_FCPort";
 const char kPortController[] = "Vexlan_FCHBA_PortController";
 const char kLogicalPortGroup[] = "Vexlan_FCHBA_LogicalPortGroup";

@@ -21,8 +21,6 @@ using cimhost::Value;
 
 namespace {
 
-const char kLogsOn[] = "DebugLog=1\nErrorLog=1\n";
-
 ObjectPath keyPath(const std::string& className, const std::string& key, const Value& value)
 {
     ObjectPath p = classPath(className);

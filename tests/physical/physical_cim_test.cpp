@@ -24,7 +24,6 @@ using fctest::json;
 
 namespace {
 
-const char kLogsOn[] = "DebugLog=1\nErrorLog=1\n";
 const char kController[] = "Vexlan_FCHBA_SCSIProtocolController";
 const char kEndpointHBA[] = "Vexlan_FCHBA_SCSIProtocolEndpointHBA";
 const char kEndpointTarget[] = "Vexlan_FCHBA_SCSIProtocolEndpointTarget";

@@ -18,6 +18,8 @@ namespace provtest {
 constexpr const char* kNamespace = "root/vexlan_cmpi";
 constexpr const char* kProviderName = "Vexlan_CNA_Provider";
 extern const char* const kLogPath;
+// Settings that switch the debug and the error log on.
+constexpr const char* kLogsOn = "DebugLog=1\nErrorLog=1\n";
 
 // Creates the log directory and writes the two settings files: the one the
 // provider's constructor reads under /opt (log switches) and the one in the

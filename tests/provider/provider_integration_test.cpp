@@ -18,8 +18,6 @@ using std::chrono::seconds;
 
 namespace {
 
-const char kLogsOn[] = "DebugLog=1\nErrorLog=1\n";
-
 unsigned long calls(zorap_sim_function fn)
 {
     return zorap_sim_call_count(fn);
