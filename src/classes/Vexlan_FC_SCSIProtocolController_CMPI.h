@@ -81,4 +81,18 @@ inline const PropertyRow<SCSIPortNameEntry> kSCSIEndpointProperties[] = {
     {"OperationalStatus", CMPI_uint16A, CLASS_VALUE(SCSIPortNameEntry, uint16Array({2}))},
 };
 
+
+// The module of a SCSI endpoint class: a full list keyed by Name, with the
+// endpoint keys and rows.
+template <const char* ClassName, CMPIUint16 Role>
+ClassModule<SCSIPortNameEntry> scsiEndpointModule(const char* stem, ClassList<SCSIPortNameEntry>& list)
+{
+    return ClassModule<SCSIPortNameEntry>(stem)
+        .list(list, ListKind::Full)
+        .key("Name", [](const SCSIPortNameEntry& e) -> const char* { return e.name; })
+        .filterKeys(kSCSIEndpointKeys)
+        .pathKeys(kSCSIEndpointKeys)
+        .properties(kSCSIEndpointProperties<ClassName, Role>);
+}
+
 #endif

@@ -19,12 +19,7 @@ namespace {
 constexpr char kClassName[] = "Vexlan_FCHBA_SCSIProtocolEndpointHBA";
 
 const ClassModule<SCSIPortNameEntry> kSCSIProtocolEndpointHBA =
-    ClassModule<SCSIPortNameEntry>("SCSIProtocolEndpointHBA")
-        .list(g_SCSIProtocolEndpointHBAList, ListKind::Full)
-        .key("Name", [](const SCSIPortNameEntry& e) -> const char* { return e.name; })
-        .filterKeys(kSCSIEndpointKeys)
-        .pathKeys(kSCSIEndpointKeys)
-        .properties(kSCSIEndpointProperties<kClassName, 2>);
+    scsiEndpointModule<kClassName, 2>("SCSIProtocolEndpointHBA", g_SCSIProtocolEndpointHBAList);
 
 }  // namespace
 

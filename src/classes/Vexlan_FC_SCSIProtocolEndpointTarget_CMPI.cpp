@@ -42,12 +42,7 @@ namespace {
 constexpr char kClassName[] = "Vexlan_FCHBA_SCSIProtocolEndpointTarget";
 
 const ClassModule<SCSIPortNameEntry> kSCSIProtocolEndpointTarget =
-    ClassModule<SCSIPortNameEntry>("SCSIProtocolEndpointTarget")
-        .list(g_SCSIProtocolEndpointTargetList, ListKind::Full)
-        .key("Name", [](const SCSIPortNameEntry& e) -> const char* { return e.name; })
-        .filterKeys(kSCSIEndpointKeys)
-        .pathKeys(kSCSIEndpointKeys)
-        .properties(kSCSIEndpointProperties<kClassName, 3>);
+    scsiEndpointModule<kClassName, 3>("SCSIProtocolEndpointTarget", g_SCSIProtocolEndpointTargetList);
 
 }  // namespace
 
