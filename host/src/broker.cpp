@@ -852,11 +852,15 @@ CMPIStatus rsPath(const CMPIResult* r, const CMPIObjectPath* op) {
 
 CMPIStatus rsDone(const CMPIResult* r) {
     EncResult* e = asResult(r);
-    return guardedStatus(resultOk(e), [&] {
+    bool tooFew = false;
+    CMPIStatus st = guardedStatus(resultOk(e), [&] {
         std::lock_guard<std::mutex> g(e->m);
         e->sink->done = true;
-        return CMPI_RC_OK;
+        tooFew = e->expectsOneInstance && e->core->refuseEmptyGetInstance.load() && e->sink->instances.empty();
+        return tooFew ? CMPI_RC_ERR_FAILED : CMPI_RC_OK;
     });
+    if (tooFew) st.msg = &newString(e->core, "Too few objects delivered.")->enc;
+    return st;
 }
 
 

@@ -283,6 +283,7 @@ void Host::setFlavour(Flavour f) { impl_->flavour = f; }
 Flavour Host::flavour() const { return impl_->flavour; }
 void Host::setStrict(bool on) { impl_->strict = on; }
 bool Host::strict() const { return impl_->strict; }
+void Host::setRefuseEmptyGetInstance(bool on) { impl_->refuseEmptyGetInstance = on; }
 void Host::setDefaultNamespace(const std::string& ns) { impl_->defaultNs = ns; }
 const std::string& Host::defaultNamespace() const { return impl_->defaultNs; }
 ClassRepository& Host::classes() { return impl_->repo; }
@@ -425,7 +426,8 @@ namespace {
 // calls `call`, and collects the status. The request's broker objects go
 // when it ends.
 template <class Mi, class Call>
-OpResult runOp(Host::Impl& c, MiType type, const ObjectPath& path, ResultKind kind, Call call) {
+OpResult runOp(Host::Impl& c, MiType type, const ObjectPath& path, ResultKind kind, Call call,
+               bool expectsOneInstance = false) {
     OpResult r;
     try {
         std::shared_lock<std::shared_mutex> lk(c.opLock);
@@ -434,6 +436,7 @@ OpResult runOp(Host::Impl& c, MiType type, const ObjectPath& path, ResultKind ki
         if (!mi) return r;
         EncContext* ctx = newContext(&c, c.nsOf(path));
         EncResult* res = newResult(&c, kind, &r);
+        res->expectsOneInstance = expectsOneInstance;
         EncPath* op = newPath(&c, c.withNs(path));
         const CMPIStatus st = call(static_cast<Mi*>(mi), &ctx->enc, &res->enc, &op->enc);
         r.rc = st.rc;
@@ -471,7 +474,8 @@ OpResult Host::getInstance(const ObjectPath& path, const PropertyList& props) {
                                  [&](CMPIInstanceMI* mi, const CMPIContext* ctx, const CMPIResult* res,
                                      const CMPIObjectPath* op) {
                                      return mi->ft->getInstance(mi, ctx, res, op, pl.get());
-                                 });
+                                 },
+                                 /*expectsOneInstance=*/true);
 }
 
 OpResult Host::createInstance(const ObjectPath& path, const Instance& inst) {

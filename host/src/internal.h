@@ -96,6 +96,8 @@ struct EncResult : Obj {
     ResultKind kind = ResultKind::Instances;
     std::mutex m;
     OpResult* sink = nullptr;
+    // A GetInstance result: see Host::setRefuseEmptyGetInstance.
+    bool expectsOneInstance = false;
 };
 
 struct EncSelectExp : Obj {
@@ -187,6 +189,7 @@ struct Host::Impl {
     // Read by provider threads (newInstance, deliverIndication) too.
     std::atomic<Flavour> flavour{Flavour::Pegasus};
     std::atomic<bool> strict{false};
+    std::atomic<bool> refuseEmptyGetInstance{false};
     std::string defaultNs = "root/cimv2";
     ClassRepository repo;
     std::vector<Registration> registrations;

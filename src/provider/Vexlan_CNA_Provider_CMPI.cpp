@@ -96,6 +96,22 @@ void walkRoutes(const CmpiObjectPath& cop, Call&& call)
     }
 }
 
+// Ends the result on a path where the request already failed. A server may
+// refuse returnDone for a GetInstance that delivered nothing (OpenPegasus
+// answers "Too few objects delivered"); that refusal must not replace the
+// request's own status, so it is logged and the caller returns its status.
+void returnDoneAfterError(const char* name, CmpiResult& rslt) noexcept
+{
+    try {
+        rslt.returnDone();
+    } catch (const CmpiStatus& st) {
+        if (g_EnableDebugPrint)
+            Vexlan_FC_Utils_CMPI::DebugPrint("Vexlan_CNA_Provider %s: returnDone refused: %d %s", name,
+                                             static_cast<int>(st.rc()), st.msg() != nullptr ? st.msg() : "");
+    } catch (...) {
+    }
+}
+
 // The common flow of enumInstanceNames, enumInstances and getInstance, under
 // provider_lock from the first step to the last.
 template <class Call>
@@ -110,7 +126,7 @@ CmpiStatus dispatchInstanceRequest(const char* name, CmpiResult& rslt, const Cmp
                 if (g_EnableLogError)
                     Vexlan_FC_Utils_CMPI::LogError("Vexlan_CNA_Provider %s: Error getting classname, status.rc=%d!",
                                                    name, static_cast<int>(rc.rc));
-                rslt.returnDone();
+                returnDoneAfterError(name, rslt);
                 return CmpiStatus(rc);
             }
             if (g_EnableDebugPrint)
@@ -122,12 +138,12 @@ CmpiStatus dispatchInstanceRequest(const char* name, CmpiResult& rslt, const Cmp
             if (g_EnableLogError)
                 Vexlan_FC_Utils_CMPI::LogError("Vexlan_CNA_Provider %s caught exception status: %d %s", name,
                                                static_cast<int>(st.rc()), st.msg() != nullptr ? st.msg() : "");
-            rslt.returnDone();
+            returnDoneAfterError(name, rslt);
             return st;
         } catch (...) {
             if (g_EnableLogError)
                 Vexlan_FC_Utils_CMPI::LogError("Vexlan_CNA_Provider %s detected an unknown exception", name);
-            rslt.returnDone();
+            returnDoneAfterError(name, rslt);
             std::string text = std::string("Vexlan_CNA_Provider ") + name + " detected an unknown exception";
             return CmpiStatus(CMPI_RC_ERR_FAILED, text.c_str());
         }

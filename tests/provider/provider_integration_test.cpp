@@ -242,6 +242,17 @@ TEST_F(ComputerSystem, AHugeKeyIsNotFoundAndItsLogLineIsCut)
     EXPECT_EQ(seen, 2);
 }
 
+TEST_F(ComputerSystem, AMissStaysNotFoundWhenTheServerRefusesAnEmptyGetInstance)
+{
+    // OpenPegasus refuses returnDone of a GetInstance that delivered nothing;
+    // the request's own NOT_FOUND must still be what the client sees.
+    host_->setRefuseEmptyGetInstance(true);
+    OpResult r = host_->getInstance(hostPath(Value::fromString("no-such-host")));
+    host_->setRefuseEmptyGetInstance(false);
+    EXPECT_EQ(r.rc, CMPI_RC_ERR_NOT_FOUND);
+    EXPECT_EQ(r.message, "no-such-host");
+}
+
 TEST_F(ComputerSystem, ANumericKeyGivesSuccessWithoutInstance)
 {
     removeLog();

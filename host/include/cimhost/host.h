@@ -110,6 +110,11 @@ public:
     Flavour flavour() const;
     void setStrict(bool on);
     bool strict() const;
+    // OpenPegasus refuses returnDone of a GetInstance that delivered no
+    // instance ("Too few objects delivered.", CMPI_RC_ERR_FAILED). Off by
+    // default; on, the host answers returnDone that way, so a test can check
+    // what a provider makes of the refusal.
+    void setRefuseEmptyGetInstance(bool on);
     void setDefaultNamespace(const std::string& ns);   // "root/cimv2" unless set
     const std::string& defaultNamespace() const;
 
