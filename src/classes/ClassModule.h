@@ -157,6 +157,66 @@ bool walkProtocols(Visit&& visit)
 
 void buildLine(bool entering, const char* stem, int index);
 
+// The rows named by a null-terminated key list, in its order; null where no
+// row has the name.
+template <class Entry>
+std::vector<const PropertyRow<Entry>*> rowsOfKeys(const char* const* keys, const PropertyRow<Entry>* rows,
+                                                  std::size_t rowCount)
+{
+    std::vector<const PropertyRow<Entry>*> found;
+    if (keys == nullptr)
+        return found;
+    for (std::size_t k = 0; keys[k] != nullptr; ++k) {
+        const PropertyRow<Entry>* row = nullptr;
+        for (std::size_t i = 0; i < rowCount && row == nullptr; ++i)
+            if (std::strcmp(rows[i].name, keys[k]) == 0)
+                row = &rows[i];
+        found.push_back(row);
+    }
+    return found;
+}
+
+// makePath of both module kinds: the path on (nameSpace, className) with the
+// keys from their rows in order; a missing row or an unset value is left out.
+template <class Entry>
+CmpiObjectPath pathFromRows(const char* className, const char* nameSpace,
+                            const std::vector<const PropertyRow<Entry>*>& keyRows, const Entry& entry)
+{
+    CmpiObjectPath path(nameSpace, className);
+    for (const PropertyRow<Entry>* row : keyRows) {
+        if (row == nullptr)
+            continue;
+        PropertyValue value = row->value(entry);
+        if (!value)
+            continue;
+        checkType(row->name, row->type, *value);
+        path.setKey(row->name, *value);
+    }
+    return path;
+}
+
+// makeInstance of both module kinds: an instance on a key-less path, the
+// property filter with `filterKeys`, then every row in order.
+template <class Entry>
+CmpiInstance instanceFromRows(const char* className, const char* nameSpace, const char** properties,
+                              const char* const* filterKeys, const PropertyRow<Entry>* rows, std::size_t rowCount,
+                              const Entry& entry)
+{
+    CmpiObjectPath path(nameSpace, className);
+    CmpiInstance instance(path);
+    if (properties != nullptr)
+        instance.setPropertyFilter(properties, const_cast<const char**>(filterKeys));
+    for (std::size_t i = 0; i < rowCount; ++i) {
+        const PropertyRow<Entry>& row = rows[i];
+        PropertyValue value = row.value(entry);
+        if (!value)
+            continue;
+        checkType(row.name, row.type, *value);
+        instance.setProperty(row.name, *value);
+    }
+    return instance;
+}
+
 // The start of a build of one slot per adapter or per physical port: the
 // library's adapter list, with `list` holding that many zeroed slots,
 // `capacity` their number and the list's count 0 for a dense fill. Null when
@@ -330,18 +390,7 @@ public:
     // No test of `valid` or of the index: the caller guarantees it.
     CmpiObjectPath makePath(const char* className, const char* nameSpace, int index) const
     {
-        CmpiObjectPath path(nameSpace, className);
-        const Entry& entry = slot(index);
-        for (const PropertyRow<Entry>* row : pathKeyRows_) {
-            if (row == nullptr)
-                continue;
-            PropertyValue value = row->value(entry);
-            if (!value)
-                continue;
-            classmodule::checkType(row->name, row->type, *value);
-            path.setKey(row->name, *value);
-        }
-        return path;
+        return classmodule::pathFromRows(className, nameSpace, pathKeyRows_, slot(index));
     }
 
     // makeInstance_X: an instance on a key-less path, the property filter with
@@ -349,20 +398,8 @@ public:
     CmpiInstance makeInstance(const char* className, const char* nameSpace, const char** properties,
                               int index) const
     {
-        CmpiObjectPath path(nameSpace, className);
-        CmpiInstance instance(path);
-        if (properties != nullptr)
-            instance.setPropertyFilter(properties, const_cast<const char**>(filterKeys_));
-        const Entry& entry = slot(index);
-        for (std::size_t i = 0; i < rowCount_; ++i) {
-            const PropertyRow<Entry>& row = rows_[i];
-            PropertyValue value = row.value(entry);
-            if (!value)
-                continue;
-            classmodule::checkType(row.name, row.type, *value);
-            instance.setProperty(row.name, *value);
-        }
-        return instance;
+        return classmodule::instanceFromRows(className, nameSpace, properties, filterKeys_, rows_, rowCount_,
+                                             slot(index));
     }
 
     CmpiStatus enumInstances(const CmpiContext&, CmpiResult& result, const CmpiObjectPath& path,
@@ -495,19 +532,7 @@ private:
         return CmpiStatus(CMPI_RC_OK);
     }
 
-    void resolvePathKeys()
-    {
-        pathKeyRows_.clear();
-        if (pathKeyNames_ == nullptr)
-            return;
-        for (std::size_t k = 0; pathKeyNames_[k] != nullptr; ++k) {
-            const PropertyRow<Entry>* found = nullptr;
-            for (std::size_t i = 0; i < rowCount_ && found == nullptr; ++i)
-                if (std::string(rows_[i].name) == pathKeyNames_[k])
-                    found = &rows_[i];
-            pathKeyRows_.push_back(found);
-        }
-    }
+    void resolvePathKeys() { pathKeyRows_ = classmodule::rowsOfKeys(pathKeyNames_, rows_, rowCount_); }
 
     const char* stem_;
     ClassList<Entry>* list_ = nullptr;

@@ -66,16 +66,7 @@ NicLinkStatus nicLinkStatus(const _CNAPortStruc* port)
 
 void NicClassModule::resolvePathKeys()
 {
-    pathKeyRows_.clear();
-    if (keys_ == nullptr)
-        return;
-    for (std::size_t k = 0; keys_[k] != nullptr; ++k) {
-        const PropertyRow<NicRecord>* found = nullptr;
-        for (std::size_t i = 0; i < rowCount_ && found == nullptr; ++i)
-            if (std::strcmp(rows_[i].name, keys_[k]) == 0)
-                found = &rows_[i];
-        pathKeyRows_.push_back(found);
-    }
+    pathKeyRows_ = classmodule::rowsOfKeys(keys_, rows_, rowCount_);
 }
 
 std::vector<std::string> NicClassModule::tableFaults() const
@@ -136,36 +127,14 @@ CmpiObjectPath NicClassModule::makePath(const char* className, const char* nameS
                                         const NicRecord& record) const
 {
     debugLine(makePathEntry_);
-    CmpiObjectPath path(nameSpace, className);
-    for (const PropertyRow<NicRecord>* row : pathKeyRows_) {
-        if (row == nullptr)
-            continue;
-        PropertyValue value = row->value(record);
-        if (!value)
-            continue;
-        classmodule::checkType(row->name, row->type, *value);
-        path.setKey(row->name, *value);
-    }
-    return path;
+    return classmodule::pathFromRows(className, nameSpace, pathKeyRows_, record);
 }
 
 CmpiInstance NicClassModule::makeInstance(const char* className, const char* nameSpace, const char** properties,
                                           const NicRecord& record) const
 {
     debugLine(makeInstanceEntry_);
-    CmpiObjectPath path(nameSpace, className);
-    CmpiInstance instance(path);
-    if (properties != nullptr)
-        instance.setPropertyFilter(properties, const_cast<const char**>(keys_));
-    for (std::size_t i = 0; i < rowCount_; ++i) {
-        const PropertyRow<NicRecord>& row = rows_[i];
-        PropertyValue value = row.value(record);
-        if (!value)
-            continue;
-        classmodule::checkType(row.name, row.type, *value);
-        instance.setProperty(row.name, *value);
-    }
-    return instance;
+    return classmodule::instanceFromRows(className, nameSpace, properties, keys_, rows_, rowCount_, record);
 }
 
 // Name space first, then class name, each through the raw path handle with
