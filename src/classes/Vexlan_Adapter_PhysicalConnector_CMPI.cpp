@@ -85,9 +85,8 @@ void nicConnectorTag(char* out, const _CNAPortStruc* port, const _zorap_adapter_
 
 }  // namespace
 
-int calcTag_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port, char* out)
+int calcNicTag(_CNAStruc* cna, _CNAPortStruc* port, char* out, NicTagFunction tagOf)
 {
-    PHYSICAL_DEBUG("Vexlan_NIC_PhysicalConnector makeInstance_PhysicalConnector was called\n");
     if (out == nullptr)
         return 0;
     out[0] = '\0';
@@ -96,8 +95,14 @@ int calcTag_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port, char* out)
     _zorap_protocol_t* protocol = nullptr;
     if (!getZORAPStructs(cna, port, &adapter, &phy, &protocol))
         return 0;
-    nicConnectorTag(out, port, adapter, phy);
+    tagOf(out, port, adapter, phy);
     return 1;
+}
+
+int calcTag_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port, char* out)
+{
+    PHYSICAL_DEBUG("Vexlan_NIC_PhysicalConnector makeInstance_PhysicalConnector was called\n");
+    return calcNicTag(cna, port, out, nicConnectorTag);
 }
 
 // ---------------------------------------------------------------------------

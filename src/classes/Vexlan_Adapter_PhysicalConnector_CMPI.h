@@ -62,6 +62,12 @@ int findNicTagSlot(const ClassList<Entry>& list, int (*calcTag)(_CNAStruc*, _CNA
     return -1;
 }
 
+// A NIC port's tag by `tagOf` from the library records of the port
+// (getZORAPStructs): 1 on success, else 0 with `out` empty.
+using NicTagFunction = void (*)(char* out, const _CNAPortStruc* port, const _zorap_adapter_t* adapter,
+                                const _zorap_phy_port_t* phy);
+int calcNicTag(_CNAStruc* cna, _CNAPortStruc* port, char* out, NicTagFunction tagOf);
+
 // The connector tag of a NIC port: 1 on success, else 0 with `out` empty.
 int calcTag_PhysicalConnector(_CNAStruc* cna, _CNAPortStruc* port, char* out);
 

@@ -42,16 +42,8 @@ void portTag(char* out, const _zorap_adapter_t* adapter, const _zorap_phy_port_t
 int calcTag_PhysicalPort(_CNAStruc* cna, _CNAPortStruc* port, char* out)
 {
     PHYSICAL_DEBUG("Vexlan_NIC_PhysicalPort makeInstance_PhysicalPort was called\n");
-    if (out == nullptr)
-        return 0;
-    out[0] = '\0';
-    _zorap_adapter_t* adapter = nullptr;
-    _zorap_phy_port_t* phy = nullptr;
-    _zorap_protocol_t* protocol = nullptr;
-    if (!getZORAPStructs(cna, port, &adapter, &phy, &protocol))
-        return 0;
-    portTag(out, adapter, phy);
-    return 1;
+    return calcNicTag(cna, port, out, [](char* tag, const _CNAPortStruc*, const _zorap_adapter_t* adapter,
+                                         const _zorap_phy_port_t* phy) { portTag(tag, adapter, phy); });
 }
 
 void buildPhysicalPortList()
