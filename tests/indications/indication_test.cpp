@@ -492,6 +492,7 @@ TEST(Stress, AlarmsRequestsFiltersAndRebuildsTogetherThenACleanStop)
     // (The log turns over too fast here to count its lines.)
     EXPECT_GE(calls(ZORAP_FN_SwapBackupToMainAdapterList), 1u);
     EXPECT_GE(host.counters().indicationsDelivered + host.counters().indicationsDropped, 1);
+    EXPECT_EQ(host.counters().indicationsFromUnattachedThreads, 0);
 
     // Alarms go on during the stop; nothing is delivered after cleanup, and
     // the callback is gone before the library shuts down.
