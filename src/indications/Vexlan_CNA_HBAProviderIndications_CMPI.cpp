@@ -5,6 +5,7 @@
 
 #include <pthread.h>
 
+#include <cstdarg>
 #include <cstdio>
 #include <cstring>
 #include <deque>
@@ -20,13 +21,9 @@
 
 std::atomic<std::uint32_t> g_indicationIdentifier{0};
 
-namespace {
+using indication::debug;
 
-#define debug(...)                                         \
-    do {                                                   \
-        if (g_EnableDebugPrint)                            \
-            Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__); \
-    } while (0)
+namespace {
 
 const char kAdapterStatusClass[] = "VexlanCNA_AlertIndication_AdapterStatusChange";
 const char kFCPortClass[] = "Vexlan_FCHBA_FCPort";
@@ -237,6 +234,18 @@ namespace indication {
 
 const char kIndicationNamespace[] = "root/vexlan_cmpi";
 const char kDeliveryNamespace[] = "root/PG_InterOp";
+
+void debug(const char* format, ...)
+{
+    if (!g_EnableDebugPrint)
+        return;
+    char text[kVexlanLogMessageSize];
+    va_list args;
+    va_start(args, format);
+    std::vsnprintf(text, sizeof(text), format, args);
+    va_end(args);
+    Vexlan_FC_Utils_CMPI::DebugPrint("%s", text);
+}
 
 BrokerMark::BrokerMark(const CmpiBroker* broker)
 {

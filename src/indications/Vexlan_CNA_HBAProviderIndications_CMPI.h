@@ -52,6 +52,9 @@ void runPendingAlarms(ThreadArgs& args);
 // ---- What both kinds of alert share ---------------------------------------------
 namespace indication {
 
+// A debug log line when the debug log is on (the line cut as DebugPrint cuts it).
+void debug(const char* format, ...) __attribute__((format(printf, 1, 2)));
+
 // The namespace of the indication's path and the one it is delivered to.
 extern const char kIndicationNamespace[];   // "root/vexlan_cmpi"
 extern const char kDeliveryNamespace[];     // "root/PG_InterOp"

@@ -11,13 +11,9 @@
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
-namespace {
+using indication::debug;
 
-#define debug(...)                                         \
-    do {                                                   \
-        if (g_EnableDebugPrint)                            \
-            Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__); \
-    } while (0)
+namespace {
 
 // The two columns of a link alert: alarm type 1 is link up, 2 link down.
 struct PortAlert {
