@@ -431,7 +431,6 @@ void debugLine(const char* text)
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("%s", text);
 }
-
 }  // namespace
 
 CmpiStatus Vexlan_CNA_Provider::authorizeFilter(const CmpiContext&, const CmpiSelectExp&, const char*,
