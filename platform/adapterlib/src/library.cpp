@@ -1193,6 +1193,7 @@ __attribute__((destructor)) static void zorap_sim_unload() {
         zorap_sim::releaseAll(L.model);
         zorap_sim::releaseAll(L.source);
         zorap_sim::releaseAll(L.modelPath);
+        zorap_sim::releaseAll(L.modelConfiguration);
         zorap_sim::releaseAll(L.handles);
         // Blocks still handed out are the caller's leak; the set that knew
         // them goes, so that a leak checker sees them.
