@@ -296,7 +296,7 @@ void Arena::forget(Obj* o) {
     o->arena = nullptr;
 }
 
-RequestScope::RequestScope(Host::Impl* core) : core_(core), id_(core->pushArena()) {}
+RequestScope::RequestScope(Host::Impl* core) : core_(core), id_(core->pushArena(true)) {}
 RequestScope::~RequestScope() { core_->popArena(id_); }
 
 bool EncInstance::wanted(const std::string& name) const {
@@ -899,7 +899,7 @@ CMPIContext* bPrepareAttach(const CMPIBroker* mb, const CMPIContext* ctx) {
 CMPIStatus bAttach(const CMPIBroker* mb, const CMPIContext* ctx) {
     Host::Impl* core = coreOf(mb);
     return guardedStatus(core && asContext(ctx), [&] {
-        core->pushArena();
+        core->pushArena(true);
         return CMPI_RC_OK;
     });
 }
@@ -928,7 +928,7 @@ CMPIStatus bDeliver(const CMPIBroker* mb, const CMPIContext*, const char* ns, co
     Host::Impl* core = coreOf(mb);
     EncInstance* i = asInstance(ind);
     return guardedStatus(core && i, [&] {
-        core->deliver(ns ? ns : "", i->inst);
+        core->deliver(ns ? ns : "", i->inst, core->onServerThread());
         return CMPI_RC_OK;
     });
 }
@@ -1496,9 +1496,18 @@ Arena* Host::Impl::currentArena() {
     return lifeArena.get();
 }
 
-unsigned long long Host::Impl::pushArena() {
+bool Host::Impl::onServerThread() {
+    std::lock_guard<std::mutex> g(arenaLock);
+    for (unsigned long long id : detail::tlsArenas) {
+        auto found = arenas.find(id);
+        if (found != arenas.end() && found->second->threadScope) return true;
+    }
+    return false;
+}
+
+unsigned long long Host::Impl::pushArena(bool threadScope) {
     const unsigned long long id = detail::gNextArenaId.fetch_add(1);
-    auto arena = std::make_unique<Arena>(id);
+    auto arena = std::make_unique<Arena>(id, threadScope);
     {
         std::lock_guard<std::mutex> g(arenaLock);
         arenas[id] = arena.get();

@@ -232,7 +232,7 @@ void* Host::Impl::getMi(MiType type, const std::string& cls, OpResult& r) {
     return mi;
 }
 
-void Host::Impl::deliver(const std::string& ns, Instance inst) {
+void Host::Impl::deliver(const std::string& ns, Instance inst, bool serverThread) {
     // OpenPegasus takes the namespace from the indication's own path.
     const std::string target =
         flavour == Flavour::Pegasus && !inst.path.nameSpace.empty() ? inst.path.nameSpace : ns;
@@ -242,6 +242,16 @@ void Host::Impl::deliver(const std::string& ns, Instance inst) {
     ind.instance = std::move(inst);
     ind.instance.path = instancePath(this, ind.instance);
     if (strict) ind.error = checkInstance(repo, ind.instance);
+    // A real server may crash on a broker call from a thread it does not know.
+    if (!serverThread) {
+        const std::string fault = "deliverIndication on a thread that is neither a request thread nor attached";
+        log("cimhost: " + fault);
+        {
+            std::lock_guard<std::mutex> g(counterLock);
+            counters.indicationsFromUnattachedThreads++;
+        }
+        if (strict) ind.error = ind.error.empty() ? fault : ind.error + "; " + fault;
+    }
     std::function<void(const Indication&)> l;
     bool matched = false;
     {

@@ -33,11 +33,14 @@ struct Obj {
 // Owns broker objects until the request, the attached thread or the loaded
 // provider that they belong to ends. release() takes one out early.
 struct Arena {
-    explicit Arena(unsigned long long i) : id(i) {}
+    explicit Arena(unsigned long long i, bool scope = false) : id(i), threadScope(scope) {}
     ~Arena();
     void adopt(Obj* o);
     void forget(Obj* o);
     const unsigned long long id;
+    // A request's or an attached thread's arena (not one of mark): the
+    // thread may make broker calls.
+    const bool threadScope;
     std::mutex m;
     std::unordered_set<Obj*> objs;
 };
@@ -212,7 +215,9 @@ struct Host::Impl {
     std::mutex mallocLock;
 
     Arena* currentArena();
-    unsigned long long pushArena();              // on this thread
+    unsigned long long pushArena(bool threadScope = false);   // on this thread
+    // True on a request thread or an attached thread of this host.
+    bool onServerThread();
     void popArena(unsigned long long id);        // and free it
     void freeAllArenas();
 
@@ -224,7 +229,8 @@ struct Host::Impl {
     std::vector<ActiveFilter> filters;
     int nextFilterId = 1;
     bool indicationsEnabled = false;
-    void deliver(const std::string& ns, Instance inst);
+    // `serverThread`: delivered on a request thread or an attached thread.
+    void deliver(const std::string& ns, Instance inst, bool serverThread);
 
     mutable std::mutex counterLock;
     Counters counters;

@@ -355,6 +355,29 @@ TEST_F(HostTest, PegasusDeliversFromTheProviderThreadByThePathsNamespace) {
                                         "deActivateFilter Tiny_Event last=1", "disableIndications"}));
 }
 
+TEST_F(HostTest, ADeliveryFromAThreadThatNeverAttachedIsFlagged) {
+    int id = 0;
+    ASSERT_TRUE(h.activateFilter("SELECT * FROM Tiny_Event WHERE Seq = 7", "root/tiny", id).ok());
+    // Events 1..3 come from the provider's attached thread.
+    Indication ind;
+    for (int k = 0; k < 3; ++k) {
+        ASSERT_TRUE(h.waitIndication(ind, 5s));
+        EXPECT_TRUE(ind.error.empty()) << ind.error;
+    }
+    EXPECT_EQ(h.counters().indicationsFromUnattachedThreads, 0);
+    ASSERT_TRUE(h.invokeMethod(p("Tiny_Thing.Name=\"alpha\",Id=1"), "DeliverStray", {}).ok());
+    while (h.waitIndication(ind, 1s) && ind.instance.property("Seq")->u != 7) {
+    }
+    EXPECT_EQ(ind.instance.property("Seq")->u, 7u);
+    EXPECT_NE(ind.error.find("neither a request thread nor attached"), std::string::npos) << ind.error;
+    EXPECT_EQ(h.counters().indicationsFromUnattachedThreads, 1);
+    const auto lines = h.logLines();
+    EXPECT_NE(std::find_if(lines.begin(), lines.end(),
+                           [](const std::string& l) { return l.find("neither a request thread") != std::string::npos; }),
+              lines.end());
+    ASSERT_TRUE(h.deactivateFilter(id).ok());
+}
+
 TEST(HostIndications, SfcbAuthorizesPollsAndTakesTheNamespaceArgument) {
     Host h;
     h.setFlavour(Flavour::Sfcb);

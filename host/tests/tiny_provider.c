@@ -509,6 +509,16 @@ static CMPIStatus methCleanup(CMPIMethodMI *mi, const CMPIContext *ctx, CMPIBool
     return cleanupAny(ctx, t);
 }
 
+static void deliverEvent(const char *pathNs, const char *deliverNs, CMPIUint32 seq);
+
+/* Event 7 from a thread of the provider's own that never attached: what a
+ * real server may not survive. */
+static void *strayDelivery(void *arg) {
+    (void)arg;
+    deliverEvent(NS, NS, 7);
+    return NULL;
+}
+
 static CMPIStatus invokeMethod(CMPIMethodMI *mi, const CMPIContext *ctx, const CMPIResult *rslt,
                                const CMPIObjectPath *op, const char *method, const CMPIArgs *in, CMPIArgs *out) {
     CMPIValue v;
@@ -551,6 +561,12 @@ static CMPIStatus invokeMethod(CMPIMethodMI *mi, const CMPIContext *ctx, const C
         char log[256] = "";
         v.uint32 = probe(ctx, log, sizeof log);
         out->ft->addArg(out, "Log", (const CMPIValue *)log, CMPI_chars);
+        rslt->ft->returnData(rslt, &v, CMPI_uint32);
+    } else if (strcmp(method, "DeliverStray") == 0) {
+        pthread_t stray;
+        pthread_create(&stray, NULL, strayDelivery, NULL);
+        pthread_join(stray, NULL);
+        v.uint32 = 0;
         rslt->ft->returnData(rslt, &v, CMPI_uint32);
     } else if (strcmp(method, "Fail") == 0) {
         return err(CMPI_RC_ERR_FAILED, "Fail was asked to fail");

@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <cstring>
 
+#include "inventory/AdapterFunc_LinkWatch.h"
 #include "inventory/AdapterWalk.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
@@ -124,20 +125,7 @@ void Initialize_CNA_Port(_zorap_protocol_t* protocol, _CNAPortStruc* port)
         ZORAP_FreeMem(linkage);
     }
 
-    unsigned char buffer[ZORAP_DMI_BUFFER_SIZE];
-    std::uint32_t length = sizeof(buffer);
-    if (ZORAP_GetTransceiverDMIData(interfaceName, &length, buffer) != 0) {
-        port->hasTransceiver = false;
-        if (g_EnableDebugPrint)
-            Vexlan_FC_Utils_CMPI::DebugPrint("No Transceiver on portID %u", port->portNumber);
-    } else {
-        port->hasTransceiver = true;
-        if (length > sizeof(buffer))
-            length = sizeof(buffer);
-        parseSFPFields(buffer, length, &port->sfpFields);
-        if (g_EnableDebugPrint)
-            Vexlan_FC_Utils_CMPI::DebugPrint("Transceiver on portID %u", port->portNumber);
-    }
+    Read_CNA_Port_Transceiver(interfaceName, port);
 
     port->portExtra = protocol->nicPortExtra;
 }

@@ -6,6 +6,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <cstdio>
 #include <cstdlib>
 #include <ctime>
 
@@ -421,39 +422,75 @@ CmpiStatus Vexlan_CNA_Provider::referenceNames(const CmpiContext&, CmpiResult& r
 }
 
 // ---- Indications ------------------------------------------------------------------------
-// Every filter is accepted; the subscription gate itself comes with the
-// indications.
+// The subscription gate: one process-wide switch, on while at least one filter
+// is active. Every filter is accepted and its query is never looked at.
+
+namespace {
+void debugLine(const char* text)
+{
+    if (g_EnableDebugPrint)
+        Vexlan_FC_Utils_CMPI::DebugPrint("%s", text);
+}
+}  // namespace
 
 CmpiStatus Vexlan_CNA_Provider::authorizeFilter(const CmpiContext&, const CmpiSelectExp&, const char*,
                                                 const CmpiObjectPath&, const char*)
 {
+    debugLine("Entering Vexlan_CNA_Provider authorizeFilter\n");
     return CmpiStatus(CMPI_RC_OK);
 }
 
 CmpiStatus Vexlan_CNA_Provider::mustPoll(const CmpiContext&, const CmpiSelectExp&, const char*,
                                          const CmpiObjectPath&)
 {
+    debugLine("Entering Vexlan_CNA_Provider mustPoll\n");
     return CmpiStatus(CMPI_RC_OK);
 }
 
 CmpiStatus Vexlan_CNA_Provider::activateFilter(const CmpiContext&, const CmpiSelectExp&, const char*,
                                                const CmpiObjectPath&, CMPIBoolean)
 {
+    debugLine("Entering Vexlan_CNA_Provider activateFilter\n");
+    m_bIndicationEnabled = true;
+    // The count lines are formatted first and written as texts of their own.
+    char text[64];
+    snprintf(text, sizeof(text), "Number of subscriptions is: %d\n", ++m_numSubscriptions);
+    debugLine(text);
     return CmpiStatus(CMPI_RC_OK);
 }
 
 CmpiStatus Vexlan_CNA_Provider::deActivateFilter(const CmpiContext&, const CmpiSelectExp&, const char*,
                                                  const CmpiObjectPath&, CMPIBoolean)
 {
+    debugLine("Entering Vexlan_CNA_Provider deActivateFilter\n");
+    // Only a count of exactly 0 closes the gate: after an unbalanced
+    // deactivation the count goes below 0 and the switch stays as it was.
+    const int before = m_numSubscriptions.fetch_sub(1);
+    char text[64];
+    snprintf(text, sizeof(text), "Number of subscriptions still available is: %d\n", before);
+    debugLine(text);
+    if (before - 1 == 0)
+        m_bIndicationEnabled = false;
     return CmpiStatus(CMPI_RC_OK);
 }
 
 CmpiStatus Vexlan_CNA_Provider::enableIndications()
 {
+    debugLine("Entering Vexlan_CNA_Provider enableIndications\n");
+    // Waits for the end of the first build, over which the polling thread
+    // holds this mutex.
+    {
+        ProviderLockGuard lock(&linux_enable_indications_mutex);
+        m_bIndicationEnabled = true;
+    }
+    debugLine("enableIndications: Indication enabled\n");
     return CmpiStatus(CMPI_RC_OK);
 }
 
 CmpiStatus Vexlan_CNA_Provider::disableIndications()
 {
+    debugLine("Entering Vexlan_CNA_Provider disableIndications\n");
+    m_bIndicationEnabled = false;
+    debugLine("disableIndications:Indications disabled\n");
     return CmpiStatus(CMPI_RC_OK);
 }

@@ -22,6 +22,8 @@
 #include "CmpiImpl.h"
 
 class Vexlan_CNA_Provider;
+struct _CNAStruc;
+struct _CNAPortStruc;
 
 // The polling thread's block, inside the provider object.
 struct ThreadArgs {
@@ -30,7 +32,8 @@ struct ThreadArgs {
     Vexlan_CNA_Provider* provider;
     pthread_t threadId;
     pthread_mutex_t mutex;           // guards threadExited and stopRequested
-    pthread_cond_t changed;          // signalled when either of them is set
+    pthread_cond_t changed;          // signalled when either of them is set, and when
+                                     // an adapter alarm is handed to the thread
     bool threadExited;               // set by the thread as its last act
     bool stopRequested;              // set by stopPollingLoop
 };
@@ -117,6 +120,14 @@ public:
     // Removes every list and shuts the adapter library down, under provider_lock.
     void cleanupAgent();
 
+    // Indications (src/indications), both on the polling thread under
+    // provider_lock. An adapter alarm on an FC port: compares the port's live
+    // state with the FC port list and, when it changed, rebuilds the list and
+    // sends an adapter status alert. A NIC link change found by the link
+    // watch: alarm type 1 sends a link up alert, 2 a link down alert.
+    void m_generateIndication(unsigned int deviceNum, int alarmType, int rsltParam, unsigned char* strParam);
+    void generatePortAlertIndication(int alarmType, _CNAStruc* adapter, _CNAPortStruc* port);
+
     // Set by the polling thread: initializing as the first build begins,
     // initialized when it has finished. Read without a lock by invokeMethod
     // and cleanup.
@@ -130,6 +141,7 @@ public:
     static pthread_mutex_t provider_write_lock;
     static pthread_mutex_t linux_enable_indications_mutex;
     static pthread_mutex_t properties_file_lock;
+    // The subscription gate: on while at least one filter is active.
     static std::atomic<bool> m_bIndicationEnabled;
     static std::atomic<int> m_numSubscriptions;
 

@@ -9,6 +9,7 @@
 #include <ctime>
 
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
+#include "indications/Vexlan_CNA_HBAProviderIndications_CMPI.h"
 #include "inventory/AdapterFunc.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
 #include "provider/Vexlan_CNA_Provider_Tables.h"
@@ -135,7 +136,8 @@ void pollRound(Vexlan_CNA_Provider& provider, ThreadArgs& args, time_t& lastPoll
     }
 }
 
-// Waits up to a second for a stop request; true when one was made.
+// Waits up to a second for a stop request; true when one was made. An
+// adapter alarm handed to the thread ends the wait at once.
 bool waitForStop(ThreadArgs& args)
 {
     ProviderLockGuard lock(&args.mutex);
@@ -143,7 +145,7 @@ bool waitForStop(ThreadArgs& args)
         struct timespec until;
         clock_gettime(CLOCK_REALTIME, &until);
         until.tv_sec += 1;
-        while (!args.stopRequested) {
+        while (!args.stopRequested && !alarmsPending()) {
             if (pthread_cond_timedwait(&args.changed, &args.mutex, &until) == ETIMEDOUT)
                 break;
         }
@@ -172,6 +174,8 @@ void* AdapterPollingLoop(void* rawArgs)
             Vexlan_FC_Utils_CMPI::LogError("AdapterPollingLoop() attachThread failed, status.rc=%d!",
                                            static_cast<int>(st.rc()));
     }
+    // From here on the thread receives the adapter library's alarms.
+    startAlarmHandOff(*args);
 
     // A failure inside a build must not end the process: it is logged, and
     // the thread goes on with what was built.
@@ -187,6 +191,7 @@ void* AdapterPollingLoop(void* rawArgs)
     time_t lastPoll = time(nullptr);
     for (;;) {
         try {
+            runPendingAlarms(*args);
             pollRound(provider, *args, lastPoll);
         } catch (...) {
             if (g_EnableLogError)
@@ -196,6 +201,7 @@ void* AdapterPollingLoop(void* rawArgs)
             break;
     }
 
+    stopAlarmHandOff();
     debug("AdapterPollingLoop() thread has been killed");
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("AdapterPollingLoop() calling detachThread(%p)",

@@ -32,6 +32,8 @@
 #include "classes/Vexlan_Adapter_Product_CMPI.h"
 #include "classes/Vexlan_Adapter_PhysicalConnector_CMPI.h"
 #include "classes/Vexlan_Adapter_PhysicalPort_CMPI.h"
+#include "indications/Vexlan_CNA_HBAProviderIndications_CMPI.h"
+#include "inventory/AdapterFunc_LinkWatch.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
 
 namespace {
@@ -57,11 +59,6 @@ CmpiStatus placeholderInvokeMethod(const CmpiContext&, CmpiResult&, const CmpiOb
 }
 void placeholderListOp() {}
 void placeholderStep() {}
-void placeholderLinkWatch(ThreadArgs&) {}
-int placeholderAlarm(unsigned int, int, int, unsigned char*)
-{
-    return 0;
-}
 
 constexpr ClassOps kPlaceholder = {placeholderEnumInstanceNames, placeholderEnumInstances, placeholderGetInstance};
 constexpr ListOps kNoList = {placeholderListOp, placeholderListOp};
@@ -197,8 +194,8 @@ namespace steps {
 constexpr void (*InitializeRegisteredProfileList)() = ::InitializeRegisteredProfileList;
 constexpr void (*Clear_RegisteredProfile_List)() = ::Clear_RegisteredProfile_List;
 constexpr void (*DeserializeConcreteJobToPrefFile)() = placeholderStep;
-constexpr void (*Update_CNA_List)(ThreadArgs&) = placeholderLinkWatch;
-constexpr ZORAP_ALARM_CALLBACK OSSGenerateHostNotificationAlarm = placeholderAlarm;
+constexpr void (*Update_CNA_List)(ThreadArgs&) = ::Update_CNA_List;
+constexpr ZORAP_ALARM_CALLBACK OSSGenerateHostNotificationAlarm = ::OSSGenerateHostNotificationAlarm;
 }  // namespace steps
 
 // ---- Instance routes -----------------------------------------------------------

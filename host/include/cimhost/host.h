@@ -96,6 +96,7 @@ struct Counters {
     int cleanupCalls = 0;
     int indicationsDelivered = 0;
     int indicationsDropped = 0;
+    int indicationsFromUnattachedThreads = 0;   // deliverIndication on a thread the host does not know
     std::vector<std::string> events;   // "activateFilter first=1", "enableIndications", ...
 };
 

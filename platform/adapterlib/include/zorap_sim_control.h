@@ -72,6 +72,15 @@ const char* zorap_sim_description_path(void);
 /* In each load the configuration counts as changed; the trees change at the
  * next ZORAP_Initialize or at ZORAP_UpdateBackupAdapterList and swap. */
 
+/* Look at the description file in use now, as ZORAP_DidConfigChange and the
+ * alarm thread (once a second) do: 0 when it is unchanged or JSON text is in
+ * use; 1 when it changed in live state only (FC port state and counters, NIC
+ * link state, speed and counters), which the per-device and per-interface
+ * calls now report, each FC port whose state changed having raised alarm
+ * type 0 for its port index; 2 when its configuration changed, which
+ * ZORAP_DidConfigChange reports and the next backup build reads. */
+int zorap_sim_check_description(void);
+
 /* --- Live state ---------------------------------------------------------- */
 
 /* Link state (1 up, 2 down, 3 testing, or any value) of a NIC interface. */

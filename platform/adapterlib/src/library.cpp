@@ -5,11 +5,17 @@
 // parsed host model with its live state), the main and backup trees, the
 // blocks handed out to callers, the alarm thread and the flash steering.
 // Locks, never nested except where noted:
+//   examineMu - one look at the description file at a time; taken before mu
 //   mu       - source, model, trees, configuration flag, allocations
 //   faultMu  - injected failures
 //   alarmMu  - alarm queue, callback, alarm thread
 //   flashMu  - next-flash setting, flash epoch
 // No lock is held while a caller's callback runs or while a flash write waits.
+//
+// A rewritten description file is looked at by ZORAP_DidConfigChange, by the
+// alarm thread once a second, and by zorap_sim_check_description: a change of
+// live state only is taken at once (livestate.h), any other is noted as a
+// configuration change for the next backup build.
 #include <dlfcn.h>
 #include <sys/stat.h>
 
@@ -30,6 +36,7 @@
 #include <unordered_set>
 
 #include "encode.h"
+#include "livestate.h"
 #include "model.h"
 #include "zorap_cna.h"
 #include "zorap_sim_control.h"
@@ -131,6 +138,7 @@ struct Loaded {
     std::string path;  // "" for text
     FileStamp stamp;
     bool ok = false;
+    std::string configuration;  // configurationOf() the text; "" when not read
 };
 
 // Reads a source; a bad description gives a message and an empty host.
@@ -162,6 +170,7 @@ Loaded readSource(const Source& src) {
     try {
         out.host = parseDescription(text);
         out.ok = true;
+        out.configuration = configurationOf(text);
     } catch (const std::bad_alloc&) {
         throw;
     } catch (const std::exception& e) {
@@ -186,6 +195,7 @@ struct Fault {
 class Library {
 public:
     // --- description, model and trees (mu) ---
+    std::mutex examineMu;
     std::mutex mu;
     bool initialized = false;
     uint32_t traceMask = 0;
@@ -194,6 +204,7 @@ public:
     uint64_t generation = 0;   // bumped at every model replacement
     Host model;
     std::string modelPath;
+    std::string modelConfiguration;  // configurationOf() the model's text
     FileStamp loadedStamp, notedStamp;
     bool configChanged = false;
     std::unique_ptr<Tree> main, backup;
@@ -269,6 +280,7 @@ public:
         assignHandles(l.host);
         model = std::move(l.host);
         modelPath = l.path;
+        modelConfiguration = std::move(l.configuration);
         loadedStamp = notedStamp = l.stamp;
         modelLoaded = true;
         ++generation;
@@ -337,13 +349,79 @@ public:
         return p;
     }
 
+    // Queues an alarm for the alarm thread; false (dropped) when no callback
+    // is registered.
+    bool queueAlarm(unsigned int device, int type, std::string text) {
+        {
+            std::lock_guard<std::mutex> l(alarmMu);
+            if (!callback || !alarmThread.joinable()) return false;
+            alarmQueue.push_back({device, type, std::move(text)});
+        }
+        alarmCv.notify_all();
+        return true;
+    }
+
+    enum class FileChange { None = 0, Live = 1, Configuration = 2 };
+
+    // Looks at the description file in use (nothing for JSON text). When it
+    // changed since it was last looked at and differs from the running
+    // description only in live state, the model takes the new live state, the
+    // file counts as loaded, and each FC port whose state changed raises alarm
+    // type 0 for its port index; no configuration change is reported, as a
+    // real library reports none when a port changes state. Any other change
+    // (or a file that can't be read) is noted as a configuration change.
+    FileChange examineDescription() {
+        std::lock_guard<std::mutex> once(examineMu);
+        Source src;
+        FileStamp now;
+        uint64_t gen;
+        {
+            std::lock_guard<std::mutex> g(mu);
+            if (!initialized || (source.kind != Source::File && source.kind != Source::Default))
+                return FileChange::None;
+            std::string path = source.kind == Source::File ? source.path : defaultPath();
+            now = stampOf(path);
+            if (path == modelPath && now == notedStamp) return FileChange::None;
+            notedStamp = now;
+            if (path != modelPath || modelConfiguration.empty()) {
+                configChanged = true;
+                return FileChange::Configuration;
+            }
+            src = source;
+            gen = generation;
+        }
+        // Read without mu, as a backup build does: the main tree stays usable.
+        Loaded fresh = readSource(src);
+        std::vector<PortStateChange> changes;
+        {
+            std::lock_guard<std::mutex> g(mu);
+            if (!fresh.ok || generation != gen || fresh.configuration != modelConfiguration) {
+                configChanged = true;
+                return FileChange::Configuration;
+            }
+            changes = takeLiveState(model, fresh.host);
+            loadedStamp = notedStamp = fresh.stamp;
+            trace("live state re-read from " + modelPath);
+        }
+        for (const PortStateChange& c : changes) queueAlarm(c.portIndex, 0, portStateAlarmText(c));
+        return FileChange::Live;
+    }
+
     // --- alarm thread ---
     // Each alarm thread serves one epoch; stopping bumps the epoch, so a
     // thread that had to be let go ends by itself when its callback returns.
     void alarmLoop(uint64_t epoch) {
         std::unique_lock<std::mutex> l(alarmMu);
         for (;;) {
-            alarmCv.wait(l, [&] { return alarmEpoch != epoch || !alarmQueue.empty(); });
+            // Between alarms the thread looks at the description file once a
+            // second, so a port state written there raises its alarm by itself.
+            if (!alarmCv.wait_for(l, std::chrono::seconds(1),
+                                  [&] { return alarmEpoch != epoch || !alarmQueue.empty(); })) {
+                l.unlock();
+                examineDescription();
+                l.lock();
+                continue;
+            }
             if (alarmEpoch != epoch) break;
             Alarm a = std::move(alarmQueue.front());
             alarmQueue.pop_front();
@@ -594,17 +672,9 @@ ZORAP_EXPORT int ZORAP_DidConfigChange(void) {
     Library& L = zorap_sim::lib();
     if (L.injected(ZORAP_FN_DidConfigChange, &code)) return static_cast<int>(code);
     try {
+        L.examineDescription();
         std::lock_guard<std::mutex> g(L.mu);
         if (!L.initialized) return 0;
-        if (L.source.kind != zorap_sim::Source::Text) {
-            std::string path =
-                L.source.kind == zorap_sim::Source::File ? L.source.path : zorap_sim::defaultPath();
-            zorap_sim::FileStamp now = zorap_sim::stampOf(path);
-            if (path != L.modelPath || now != L.notedStamp) {
-                L.notedStamp = now;
-                L.configChanged = true;
-            }
-        }
         return L.configChanged ? 1 : 0;
     } catch (...) {
         return 0;
@@ -1021,14 +1091,13 @@ ZORAP_EXPORT int zorap_sim_set_fc_port_stats(const char* portWWN, const uint32_t
 
 ZORAP_EXPORT int zorap_sim_raise_alarm(unsigned int deviceNumber, int coreAlarmType, const char* text) {
     return zorap_sim::control("zorap_sim_raise_alarm", [&](Library& L) {
-        {
-            std::lock_guard<std::mutex> l(L.alarmMu);
-            if (!L.callback || !L.alarmThread.joinable()) return -1;
-            L.alarmQueue.push_back({deviceNumber, coreAlarmType, text ? text : ""});
-        }
-        L.alarmCv.notify_all();
-        return 0;
+        return L.queueAlarm(deviceNumber, coreAlarmType, text ? text : "") ? 0 : -1;
     });
+}
+
+ZORAP_EXPORT int zorap_sim_check_description(void) {
+    return zorap_sim::control("zorap_sim_check_description",
+                              [](Library& L) { return static_cast<int>(L.examineDescription()); });
 }
 
 ZORAP_EXPORT int zorap_sim_wait_alarms_idle(uint32_t timeoutMs) {
@@ -1124,6 +1193,7 @@ __attribute__((destructor)) static void zorap_sim_unload() {
         zorap_sim::releaseAll(L.model);
         zorap_sim::releaseAll(L.source);
         zorap_sim::releaseAll(L.modelPath);
+        zorap_sim::releaseAll(L.modelConfiguration);
         zorap_sim::releaseAll(L.handles);
         // Blocks still handed out are the caller's leak; the set that knew
         // them goes, so that a leak checker sees them.

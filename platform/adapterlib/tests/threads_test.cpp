@@ -1,7 +1,11 @@
 // Work on the library's own threads and beside callers' threads: alarm
 // delivery, backup builds beside a reader, flash writes ended by shutdown.
+#include <unistd.h>
+
 #include <atomic>
 #include <chrono>
+#include <cstdio>
+#include <fstream>
 #include <condition_variable>
 #include <mutex>
 #include <thread>
@@ -83,6 +87,76 @@ TEST_F(AlarmTest, UnregisterAndUninitializeStopDelivery) {
     std::lock_guard<std::mutex> l(log.mu);
     EXPECT_TRUE(log.devices.empty());
     EXPECT_EQ(ZORAP_ERR_NOT_INITIALIZED, ZORAP_RegisterAlarmNotificationCallback(recordAlarm));
+}
+
+// A rewritten description file that differs only in live state changes what
+// the live calls answer without a configuration change, and an FC port whose
+// state changed raises alarm type 0 for its port index, by itself too.
+namespace {
+std::string replaced(std::string text, const std::string& from, const std::string& to) {
+    size_t at = text.find(from);
+    EXPECT_NE(std::string::npos, at) << from;
+    if (at != std::string::npos) text.replace(at, from.size(), to);
+    return text;
+}
+}  // namespace
+
+TEST_F(AlarmTest, ARewrittenDescriptionChangesLiveStateAndRaisesThePortsAlarm) {
+    char name[] = "/tmp/zorap_live_XXXXXX";
+    int fd = mkstemp(name);
+    ASSERT_GE(fd, 0);
+    close(fd);
+    const std::string path = name;
+    std::ofstream(path) << kHost;
+    ASSERT_EQ(0, zorap_sim_load_file(path.c_str()));
+    ASSERT_EQ(ZORAP_OK, ZORAP_RegisterAlarmNotificationCallback(recordAlarm));
+    ZORAP_ResetConfigChange();
+    EXPECT_EQ(0, zorap_sim_check_description());
+    const uint32_t handle = device(0, 0)->deviceHandle;
+
+    std::string live = replaced(kHost, R"("state": "online")", R"("state": "loopdown")");
+    live = replaced(live, R"("linkState": "up")", R"("linkState": "down")");
+    live = replaced(live, R"("ioCount": 100)", R"("ioCount": 555)");
+    std::ofstream(path) << live;
+    EXPECT_EQ(1, zorap_sim_check_description());
+    EXPECT_EQ(0, ZORAP_DidConfigChange());
+    _zorap_port_property_t prop{};
+    ASSERT_EQ(ZORAP_OK, ZORAP_GetHbaDevicePortProperty(handle, 0, &prop));
+    EXPECT_EQ(ZORAP_PORT_STATE_LOOPDOWN, prop.portStateCode);
+    _zorap_link_properties_t link{};
+    ASSERT_EQ(ZORAP_OK, ZORAP_GetLinkProperties("eth0", &link));
+    EXPECT_EQ(ZORAP_LINK_DOWN, link.linkState);
+    _tagZORAPSDMDevice stats = *device(0, 0);
+    ASSERT_EQ(ZORAP_OK, ZORAP_RefreshDeviceStats(&stats));
+    EXPECT_EQ(555u, stats.statIoCount);
+    EXPECT_EQ(ZORAP_PORT_STATE_ONLINE, device(0, 0)->portStateCode) << "the tree is a snapshot";
+    ASSERT_EQ(0, zorap_sim_wait_alarms_idle(5000));
+    {
+        std::lock_guard<std::mutex> l(log.mu);
+        EXPECT_EQ((std::vector<unsigned>{0}), log.devices);
+        EXPECT_EQ((std::vector<int>{0}), log.types);
+        ASSERT_EQ(1u, log.texts.size());
+        EXPECT_EQ("FC port 31:00:00:00:00:00:00:01 state 1 to 3", log.texts[0]);
+    }
+
+    // Back online, unasked: the alarm thread notices the file by itself.
+    std::ofstream(path) << replaced(live, R"("state": "loopdown", "portType")", R"("state": 1, "portType")");
+    {
+        std::unique_lock<std::mutex> l(log.mu);
+        EXPECT_TRUE(log.cv.wait_for(l, std::chrono::seconds(5), [&] { return log.devices.size() == 2; }));
+    }
+    EXPECT_EQ(0, ZORAP_DidConfigChange());
+    ASSERT_EQ(ZORAP_OK, ZORAP_GetHbaDevicePortProperty(handle, 0, &prop));
+    EXPECT_EQ(ZORAP_PORT_STATE_ONLINE, prop.portStateCode);
+
+    // Anything else is a configuration change, for the next backup build.
+    std::ofstream(path) << replaced(kHost, "SERIAL-A", "SERIAL-Z");
+    EXPECT_EQ(2, zorap_sim_check_description());
+    EXPECT_EQ(1, ZORAP_DidConfigChange());
+    EXPECT_EQ(0, zorap_sim_check_description());
+    std::lock_guard<std::mutex> l(log.mu);
+    EXPECT_EQ(2u, log.devices.size());
+    std::remove(path.c_str());
 }
 
 // A reader walks the main tree under its own lock, as the provider does,
