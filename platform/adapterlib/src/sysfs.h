@@ -42,7 +42,7 @@ std::map<Wwn, uint8_t> fcStatesOf(const Host& host);
 // Alarm type 0 for an FC port whose state code changed.
 struct PortAlarm {
     uint32_t portIndex = 0;
-    std::string text;  // "FC port 31:00:...: state 1 to 3"
+    std::string text;  // "FC port 31:00:... state 1 to 3"
 };
 PortAlarm portStateAlarm(const FcFunction& fc, uint8_t from);
 // Gives `model`'s FC ports the state codes of `states` (ports not in it keep
