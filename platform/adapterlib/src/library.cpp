@@ -406,7 +406,10 @@ public:
             if (!alarmCv.wait_for(l, std::chrono::seconds(1),
                                   [&] { return alarmEpoch != epoch || !alarmQueue.empty(); })) {
                 l.unlock();
-                examineSysfs(false);
+                try {
+                    examineSysfs(false);
+                } catch (...) {  // no memory: the next look tries again
+                }
                 l.lock();
                 continue;
             }

@@ -150,14 +150,28 @@ std::optional<PciAddress> parsePciAddress(const std::string& name) {
     return a;
 }
 
-// The directory of the nearest PCI function that holds `path`.
-std::optional<std::string> pciFunctionHolding(const std::string& path) {
+// The directory of the nearest PCI function that holds `path`, below root.
+std::optional<std::string> pciFunctionHolding(const std::string& root, const std::string& path) {
     std::string dir = path;
-    while (!dir.empty() && dir != "/") {
+    while (dir.size() > root.size() && dir.size() > 1) {
         if (parsePciAddress(baseName(dir))) return dir;
         dir = dir.substr(0, dir.rfind('/'));
     }
     return std::nullopt;
+}
+
+std::string fcHostDir(const std::string& root, const std::string& host) {
+    return under(root, "sys/class/fc_host/" + host);
+}
+
+// Every FC host's directory with its port WWN.
+std::vector<std::pair<std::string, Wwn>> fcHostsByWwn(const std::string& root) {
+    std::vector<std::pair<std::string, Wwn>> hosts;
+    for (const std::string& host : listDir(under(root, "sys/class/fc_host"))) {
+        std::string dir = fcHostDir(root, host);
+        if (auto wwn = readWwn(dir + "/port_name")) hosts.emplace_back(dir, *wwn);
+    }
+    return hosts;
 }
 
 // One PCI function that carries FC hosts or interfaces.
@@ -190,8 +204,8 @@ std::map<PciAddress, PciFunction> findPciFunctions(const std::string& root) {
     std::vector<unsigned long> n;
     for (const std::string& host : listDir(under(root, "sys/class/fc_host"))) {
         if (!parseNumbers(host, "host", "", n)) continue;
-        auto dir = resolveUnder(root, under(root, "sys/class/fc_host/" + host));
-        auto pci = dir ? pciFunctionHolding(*dir) : std::nullopt;
+        auto dir = resolveUnder(root, fcHostDir(root, host));
+        auto pci = dir ? pciFunctionHolding(root, *dir) : std::nullopt;
         if (pci) functionAt(*pci).fcHosts.emplace_back(n[0], host);
     }
     for (const std::string& name : listDir(under(root, "sys/class/net"))) {
@@ -240,16 +254,10 @@ void readNicLiveAt(const std::string& dir, NicFunction& nic) {
     nic.fullDuplex = readLine(dir + "/duplex") == "full" ? 1 : 0;
 }
 
-std::string fcHostDir(const std::string& root, const std::string& host) {
-    return under(root, "sys/class/fc_host/" + host);
-}
-
 // The fc_host directory whose port_name is the WWN.
 std::optional<std::string> fcHostDirOf(const std::string& root, const Wwn& portWwn) {
-    for (const std::string& host : listDir(under(root, "sys/class/fc_host"))) {
-        std::string dir = fcHostDir(root, host);
-        if (readWwn(dir + "/port_name") == portWwn) return dir;
-    }
+    for (const auto& host : fcHostsByWwn(root))
+        if (host.second == portWwn) return host.first;
     return std::nullopt;
 }
 
@@ -614,11 +622,8 @@ bool readNicLive(const std::string& root, NicFunction& nic) {
 
 std::map<Wwn, uint8_t> readFcStates(const std::string& root) {
     std::map<Wwn, uint8_t> states;
-    for (const std::string& host : listDir(under(root, "sys/class/fc_host"))) {
-        const std::string dir = fcHostDir(root, host);
-        if (auto wwn = readWwn(dir + "/port_name"))
-            states[*wwn] = static_cast<uint8_t>(codeOf(kPortStates, readLine(dir + "/port_state"), 0));
-    }
+    for (const auto& host : fcHostsByWwn(root))
+        states[host.second] = static_cast<uint8_t>(codeOf(kPortStates, readLine(host.first + "/port_state"), 0));
     return states;
 }
 
