@@ -6,7 +6,7 @@ JOBS       ?= $(shell nproc)
 PREFIX     ?= /usr/local
 GENERATOR  := $(shell command -v ninja >/dev/null 2>&1 && echo "-G Ninja")
 
-.PHONY: all deps build demo test test-asan test-tsan install clean
+.PHONY: all deps build demo demo-real test test-asan test-tsan install clean
 
 all: build
 
@@ -21,6 +21,10 @@ build: deps $(BUILD)/CMakeCache.txt
 
 demo: build
 	@scripts/demo.sh $(BUILD)
+
+# The same tour over this machine's real adapters (the adapter library's sysfs source).
+demo-real: build
+	@DEMO_SOURCE=sysfs scripts/demo.sh $(BUILD)
 
 # The plain build runs every test; the sanitizer builds run them again.
 test: build

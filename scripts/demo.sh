@@ -5,6 +5,8 @@
 # log. It runs with private /opt and /var/tmp (tests/isolate.sh), so it leaves no
 # files behind; where that is not possible it runs in a temporary working
 # directory with the provider's log off and creates nothing under the real /opt.
+# With DEMO_SOURCE=sysfs (make demo-real) the adapter library reads this
+# machine's real adapters from /sys instead: what it finds comes first.
 set -euo pipefail
 ROOT=$(cd "$(dirname "$0")/.." && pwd)
 if [ "${1:-}" = --inside ]; then BUILD=$2; else BUILD=$(cd "${1:-$ROOT/build}" && pwd); fi
@@ -17,8 +19,22 @@ tour_classes() {
     "$BUILD/share/vexlan-cna/classes.tsv"
 }
 
+# The adapters the tour shows: the simulated ones, or with DEMO_SOURCE=sysfs
+# this machine's, through an adapter description that chooses the sysfs source.
+SOURCE_TEXT="the default simulated adapters"
+choose_source() {
+  [ "${DEMO_SOURCE:-}" = sysfs ] || return 0
+  SOURCE_TEXT="this machine's real adapters (/sys)"
+  printf '{"source": "sysfs"}\n' > real-host.json
+  export ZORAP_SIM_ADAPTERS="$PWD/real-host.json"
+  echo "== what the adapter library reads from /sys (PCI functions with an FC host or a network interface)"
+  "$BUILD/bin/zorap_sim_dump" real-host.json || true
+  echo
+}
+
 run_tour() {
   local batch=tour.batch
+  choose_source
   {
     echo "# The host that carries the adapters"
     echo "ei root/vexlan_cmpi:Vexlan_Adapter_ComputerSystem"
@@ -27,7 +43,7 @@ run_tour() {
       echo "ein root/vexlan_cmpi:$cls"
     done
   } > "$batch"
-  echo "== cimhost: the provider against the default simulated adapters"
+  echo "== cimhost: the provider against $SOURCE_TEXT"
   "$BUILD/bin/cimhost" --strict -p "$BUILD/lib/libVexlan_CNA_Provider.so.1" -n Vexlan_CNA_Provider \
     -m "$BUILD/share/vexlan-cna/mof" -N root/vexlan_cmpi batch "$batch" > tour.out 2> tour.err || true
   # The host in full, then one line per class that answers: its instance

@@ -45,6 +45,8 @@ typedef uint32_t ZORAP_STATUS;
 #define ZORAP_ERR_NO_MEMORY          7u
 #define ZORAP_ERR_BUSY               8u  /* a flash write on this adapter is running */
 #define ZORAP_ERR_FLASH_FAILED       9u  /* the adapter refused the image            */
+#define ZORAP_ERR_NOT_SUPPORTED     10u  /* the source can't do this (flash writes
+                                            of the running system's adapters)     */
 
 /* protocolType values: every FC test is "less than 2". */
 #define ZORAP_PROTOCOL_FC    0u

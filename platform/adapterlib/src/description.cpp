@@ -13,6 +13,7 @@
 #include <set>
 
 #include "model.h"
+#include "sysfs.h"
 #include "zorap_chip_ids.h"
 #include "zorap_cna.h"
 
@@ -625,6 +626,15 @@ Host parseDescription(const std::string& jsonText) {
         throw DescriptionError(std::string("not valid JSON: ") + e.what());
     }
     Node root(doc, "$");
+    // {"source": "sysfs", "root": "/"}: the running system's adapters.
+    if (root.has("source")) {
+        root.allowKeys({"source", "root"});
+        std::string source = root.at("source").text(16);
+        if (source != "sysfs") fail("$.source", "expected \"sysfs\", got \"" + source + "\"");
+        std::string dir = root.text("root", 4095, "/");
+        if (dir.empty() || dir[0] != '/') fail("$.root", "expected an absolute directory, got \"" + dir + "\"");
+        return readSysfsHost(dir);
+    }
     root.allowKeys({"osName", "flash", "adapters"});
     Host h;
     h.osName = root.text("osName", ZORAP_OS_NAME_BUFFER_SIZE - 1, defaultOsName());

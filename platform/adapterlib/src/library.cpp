@@ -11,11 +11,17 @@
 //   alarmMu  - alarm queue, callback, alarm thread
 //   flashMu  - next-flash setting, flash epoch
 // No lock is held while a caller's callback runs or while a flash write waits.
+// mu may be held while alarmMu is taken to queue an alarm, never the reverse.
 //
 // A rewritten description file is looked at by ZORAP_DidConfigChange, by the
 // alarm thread once a second, and by zorap_sim_check_description: a change of
 // live state only is taken at once (livestate.h), any other is noted as a
 // configuration change for the next backup build.
+//
+// A host read from sysfs (sysfs.h) is looked at afresh: the live calls read
+// the live state of their function, the alarm thread the FC port states once
+// a second, ZORAP_DidConfigChange the whole tree, and every backup build
+// reads it again. Its flash is never written.
 #include <dlfcn.h>
 #include <sys/stat.h>
 
@@ -38,6 +44,8 @@
 #include "encode.h"
 #include "livestate.h"
 #include "model.h"
+#include "sysfs.h"
+#include "sysfs_files.h"
 #include "zorap_cna.h"
 #include "zorap_sim_control.h"
 
@@ -407,18 +415,61 @@ public:
         return FileChange::Live;
     }
 
+    void raise(const std::vector<PortAlarm>& alarms) {
+        for (const PortAlarm& a : alarms) queueAlarm(a.portIndex, 0, a.text);
+    }
+
+    // For a host read from sysfs, a live call reads its function's live
+    // state afresh; an FC port whose state changed raises its alarm. False
+    // when the function's FC host or interface is gone (mu held).
+    bool refreshLive(FcFunction& fc) {
+        if (!model.sysfs) return true;
+        const uint8_t before = fc.stateCode;
+        if (!readFcLive(model.sysfs->root, fc)) return false;
+        if (fc.stateCode != before) raise({portStateAlarm(fc, before)});
+        return true;
+    }
+    bool refreshLive(NicFunction& nic) { return !model.sysfs || readNicLive(model.sysfs->root, nic); }
+
+    // Looks at a host read from sysfs: the states of its FC ports (an alarm
+    // for each change) and, with `configuration`, whether its configuration
+    // changed. The tree is read without mu, as a backup build reads it.
+    void examineSysfs(bool configuration) {
+        std::string root, known;
+        uint64_t gen;
+        {
+            std::lock_guard<std::mutex> g(mu);
+            if (!initialized || !model.sysfs) return;
+            root = model.sysfs->root;
+            if (configuration) known = model.sysfs->configuration;
+            gen = generation;
+        }
+        const std::map<Wwn, uint8_t> states = readFcStates(root);
+        const std::string now = configuration ? readSysfsHost(root).sysfs->configuration : known;
+        std::lock_guard<std::mutex> g(mu);
+        if (generation != gen) return;
+        if (now != known) configChanged = true;
+        raise(takeFcStates(model, states));
+    }
+
     // --- alarm thread ---
     // Each alarm thread serves one epoch; stopping bumps the epoch, so a
     // thread that had to be let go ends by itself when its callback returns.
     void alarmLoop(uint64_t epoch) {
         std::unique_lock<std::mutex> l(alarmMu);
         for (;;) {
-            // Between alarms the thread looks at the description file once a
-            // second, so a port state written there raises its alarm by itself.
+            // Between alarms the thread looks at the description file and at
+            // the FC ports of a host read from sysfs once a second, so a port
+            // state written to the file, or a port that changes state, raises
+            // its alarm by itself.
             if (!alarmCv.wait_for(l, std::chrono::seconds(1),
                                   [&] { return alarmEpoch != epoch || !alarmQueue.empty(); })) {
                 l.unlock();
-                examineDescription();
+                try {
+                    examineDescription();
+                    examineSysfs(false);
+                } catch (...) {  // no memory: the next look tries again
+                }
                 l.lock();
                 continue;
             }
@@ -503,6 +554,7 @@ public:
         {
             std::lock_guard<std::mutex> g(mu);
             if (!initialized) return ZORAP_ERR_NOT_INITIALIZED;
+            if (model.sysfs) return ZORAP_ERR_NOT_SUPPORTED;  // the running system's flash is never written
             Adapter* a = nic ? findAdapterByInstance(adapterInstance) : findFc(deviceHandle).adapter;
             if (!a) return ZORAP_ERR_NOT_FOUND;
             instance = a->instance;
@@ -673,6 +725,7 @@ ZORAP_EXPORT int ZORAP_DidConfigChange(void) {
     if (L.injected(ZORAP_FN_DidConfigChange, &code)) return static_cast<int>(code);
     try {
         L.examineDescription();
+        L.examineSysfs(true);
         std::lock_guard<std::mutex> g(L.mu);
         if (!L.initialized) return 0;
         return L.configChanged ? 1 : 0;
@@ -704,6 +757,7 @@ ZORAP_EXPORT ZORAP_STATUS ZORAP_UpdateBackupAdapterList(void) {
                     src.kind == zorap_sim::Source::File ? src.path : zorap_sim::defaultPath();
                 reload = path != L.modelPath || zorap_sim::stampOf(path) != L.loadedStamp;
             }
+            reload = reload || L.model.sysfs.has_value();  // the running system is read again
         }
         // The file is read without the lock: the main tree stays usable.
         zorap_sim::Loaded loaded;
@@ -711,6 +765,10 @@ ZORAP_EXPORT ZORAP_STATUS ZORAP_UpdateBackupAdapterList(void) {
         std::lock_guard<std::mutex> g(L.mu);
         if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
         if (reload && L.generation == gen) {
+            // A port state that changed since the last look raises its alarm
+            // before the new host takes the state over.
+            if (L.model.sysfs && loaded.host.sysfs)
+                L.raise(zorap_sim::takeFcStates(L.model, zorap_sim::fcStatesOf(loaded.host)));
             zorap_sim::FileStamp keepNoted = L.notedStamp;
             L.install(std::move(loaded), false);
             L.notedStamp = keepNoted;  // a change not yet reported stays reportable
@@ -767,7 +825,7 @@ ZORAP_EXPORT ZORAP_STATUS ZORAP_GetHbaDevicePortProperty(uint32_t deviceHandle, 
         std::lock_guard<std::mutex> g(L.mu);
         if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
         auto ref = L.findFc(deviceHandle);
-        if (!ref.fc) return ZORAP_ERR_NOT_FOUND;
+        if (!ref.fc || !L.refreshLive(*ref.fc)) return ZORAP_ERR_NOT_FOUND;
         _zorap_port_property_t prop{};
         zorap_sim::encodePortProperty(*ref.fc, &prop);
         std::memcpy(portRecord, &prop, sizeof prop);
@@ -781,7 +839,7 @@ ZORAP_EXPORT ZORAP_STATUS ZORAP_RefreshDeviceStats(_tagZORAPSDMDevice* device) {
         std::lock_guard<std::mutex> g(L.mu);
         if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
         auto ref = L.findFc(device->deviceHandle);
-        if (!ref.fc) return ZORAP_ERR_NOT_FOUND;
+        if (!ref.fc || !L.refreshLive(*ref.fc)) return ZORAP_ERR_NOT_FOUND;
         zorap_sim::encodeFcStats(*ref.fc, device);
         return ZORAP_OK;
     });
@@ -901,7 +959,7 @@ ZORAP_EXPORT ZORAP_STATUS ZORAP_GetLinkProperties(const char* interfaceName,
         std::lock_guard<std::mutex> g(L.mu);
         if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
         auto ref = L.findNic(interfaceName);
-        if (!ref.nic) return ZORAP_ERR_NOT_FOUND;
+        if (!ref.nic || !L.refreshLive(*ref.nic)) return ZORAP_ERR_NOT_FOUND;
         zorap_sim::encodeLinkProperties(*ref.nic, properties);
         return ZORAP_OK;
     });
@@ -915,12 +973,19 @@ ZORAP_EXPORT ZORAP_STATUS ZORAP_GetTransceiverDMIData(const char* interfaceName,
         if (!L.initialized) return ZORAP_ERR_NOT_INITIALIZED;
         auto ref = L.findNic(interfaceName);
         if (!ref.nic) return ZORAP_ERR_NOT_FOUND;
-        if (!ref.port->transceiver) return ZORAP_ERR_NOT_PRESENT;
+        // The running system's module is read afresh through the kernel.
+        uint8_t pages[zorap_sim::kTransceiverPagesSize];
+        if (L.model.sysfs ? !zorap_sim::sysfs::modulePages(L.model.sysfs->root, interfaceName, pages)
+                          : !ref.port->transceiver)
+            return ZORAP_ERR_NOT_PRESENT;
         if (*length < zorap_sim::kTransceiverPagesSize) {
             *length = zorap_sim::kTransceiverPagesSize;
             return ZORAP_ERR_BUFFER_TOO_SMALL;
         }
-        zorap_sim::encodeTransceiverPages(*ref.port->transceiver, buffer);
+        if (L.model.sysfs)
+            std::memcpy(buffer, pages, sizeof pages);
+        else
+            zorap_sim::encodeTransceiverPages(*ref.port->transceiver, buffer);
         *length = zorap_sim::kTransceiverPagesSize;
         return ZORAP_OK;
     });

@@ -168,11 +168,22 @@ struct Adapter {
     std::vector<PhysPort> ports;
 };
 
+// Where a host read from the running system came from (sysfs.h): the root
+// directory of its sysfs and procfs, and its configuration (everything but
+// live state) in one comparable text.
+struct SysfsOrigin {
+    std::string root;
+    std::string configuration;
+};
+
 struct Host {
     std::string osName;
     uint32_t flashDurationMs = 1000;
     uint32_t flashResult = 0;
     std::vector<Adapter> adapters;
+    // Set for the sysfs source: live calls read the tree afresh, flash writes
+    // are refused.
+    std::optional<SysfsOrigin> sysfs;
 };
 
 // Reading a description (description.cpp).  Both throw DescriptionError.
