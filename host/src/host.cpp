@@ -382,7 +382,19 @@ Status Host::unload(bool terminating) {
             std::lock_guard<std::mutex> g(c.miLock);
             all.swap(c.mis);
         }
+        // sfcb keeps a list of (library, MI type) pairs already cleaned up and
+        // skips every further MI of a type on it: one cleanup per MI type,
+        // whatever the number of MIs its factory handed out. OpenPegasus
+        // cleans up every MI it made.
+        bool typeCleaned[4] = {false, false, false, false};
+        bool typeKept[4] = {false, false, false, false};
         for (const auto& e : all) {
+            const int t = static_cast<int>(e.type);
+            if (c.flavour == Flavour::Sfcb && typeCleaned[t]) {
+                if (typeKept[t]) kept.push_back(e);
+                continue;
+            }
+            typeCleaned[t] = true;
             const CMPIStatus st = callCleanup(e, &ctx->enc, terminating);
             {
                 std::lock_guard<std::mutex> g(c.counterLock);
@@ -392,6 +404,7 @@ Status Host::unload(bool terminating) {
             }
             if (!terminating && (st.rc == CMPI_RC_DO_NOT_UNLOAD || st.rc == CMPI_RC_NEVER_UNLOAD)) {
                 kept.push_back(e);
+                typeKept[t] = true;
             } else if (st.rc != CMPI_RC_OK && st.rc != CMPI_RC_DO_NOT_UNLOAD && st.rc != CMPI_RC_NEVER_UNLOAD) {
                 c.log(std::string("cleanup of ") + kMiNames[static_cast<int>(e.type)] + "MI returned " +
                       statusLine(Status{st.rc, msgOf(st)}));
@@ -405,22 +418,42 @@ Status Host::unload(bool terminating) {
         s.message = "provider " + c.name + " refused to be unloaded; the library stays loaded";
         return s;
     }
-    {
-        std::lock_guard<std::mutex> g(c.indLock);
-        c.filters.clear();
-        c.indicationsEnabled = false;
-    }
-    c.freeAllArenas();
+    c.closeLibrary();
+    return s;
+}
+
+Status Host::unloadWithoutCleanup() {
+    std::unique_lock<std::shared_mutex> lk(impl_->opLock);
+    Impl& c = *impl_;
+    if (!c.lib) return Status{};
     {
         std::lock_guard<std::mutex> g(c.miLock);
-        dlclose(c.lib);
-        c.lib = nullptr;
-        for (auto& f : c.factories) f = nullptr;
+        c.mis.clear();
     }
-    std::lock_guard<std::mutex> g(c.counterLock);
-    c.counters.unloads++;
-    c.counters.events.push_back("unload " + c.name);
-    return s;
+    c.closeLibrary();
+    return Status{};
+}
+
+// The library goes first: its unload code may still use objects the
+// provider kept (a prepared context its thread detaches with); they go after.
+void Host::Impl::closeLibrary() {
+    {
+        std::lock_guard<std::mutex> g(indLock);
+        filters.clear();
+        indicationsEnabled = false;
+    }
+    void* closing = nullptr;
+    {
+        std::lock_guard<std::mutex> g(miLock);
+        closing = lib;
+        lib = nullptr;
+        for (auto& f : factories) f = nullptr;
+    }
+    dlclose(closing);  // no host lock held: the library's unload code may call the broker
+    freeAllArenas();
+    std::lock_guard<std::mutex> g(counterLock);
+    counters.unloads++;
+    counters.events.push_back("unload " + name);
 }
 
 bool Host::loaded() const {

@@ -220,6 +220,8 @@ struct Host::Impl {
     bool onServerThread();
     void popArena(unsigned long long id);        // and free it
     void freeAllArenas();
+    // dlclose()s the library, then frees what it kept (opLock held).
+    void closeLibrary();
 
     // Indications.
     std::mutex indLock;

@@ -1,10 +1,9 @@
 // The four entry points of the library. A server looks them up by name and
 // may call them in any order and any number of times: the first constructs
 // and initialises the one provider object, the others attach to it, and each
-// raises its use count. The last cleanup (through the wrapper's
-// driveBaseCleanup) deletes it, so that factories called after that start a
-// new one.
-#include <deque>
+// MI type handed out counts once in its use count. The cleanup of the last
+// MI type (through the wrapper's driveBaseCleanup) deletes it, so that
+// factories called after that start a new one.
 #include <exception>
 #include <mutex>
 
@@ -18,18 +17,46 @@ CmpiProviderBase baseVexlan_CNA_Provider;
 // Two first calls on two threads must not make two providers.
 std::mutex factoryMutex;
 
-// Every factory call hands out an MI object of its own. A server may call one
-// factory many times (sfcb does, once per registered class) and then cleans up
-// every MI it got: as each MI's cleanup lowers the use count once, the count
-// reaches 0 at the last one, which stops the polling thread before the
-// library is unloaded. The objects stay until the library is unloaded.
-template <class MI>
-MI& newMI()
-{
-    static std::deque<MI> handedOut;
-    handedOut.emplace_back();
-    return handedOut.back();
-}
+// Runs when the library is unloaded (dlclose, or the end of the process).
+// A server that unloads the library without the cleanups that end the
+// provider object would leave its polling thread (and the adapter library's
+// alarm thread) running in unmapped code: stop and join them here, shut the
+// adapter library down and delete the object, so no code of the provider
+// runs after the unload whatever the server did. Declared after the base
+// and the mutex, so it goes before them.
+struct UnloadGuard {
+    UnloadGuard() = default;
+    UnloadGuard(const UnloadGuard&) = delete;
+    UnloadGuard& operator=(const UnloadGuard&) = delete;
+    ~UnloadGuard()
+    {
+        std::lock_guard<std::mutex> serial(factoryMutex);
+        CmpiBaseMI* provider = baseVexlan_CNA_Provider.getBaseMI();
+        if (provider == nullptr)
+            return;
+        baseVexlan_CNA_Provider.setBaseMI(nullptr);
+        provider->setProviderBase(nullptr);
+        try {
+            CmpiContext context;
+            provider->cleanup(context);
+        } catch (...) {
+        }
+        delete provider;
+    }
+} unloadGuard;
+
+// One MI structure per MI type, the same for every call of its factory.
+// The provider base counts each structure once per life of the provider
+// object (attachMI), so the object lives until every MI type handed out
+// has had its cleanup: OpenPegasus calls each factory once per load and
+// cleans up each MI; sfcb calls a factory once per registered class section
+// but cleans up once per library and MI type. The last of those cleanups
+// stops the polling thread and shuts the adapter library down before the
+// library is unloaded.
+CMPIInstanceMI instanceMI;
+CMPIAssociationMI associationMI;
+CMPIMethodMI methodMI;
+CMPIIndicationMI indicationMI;
 
 CMPIInstanceMIFT instMIFT = {
     CMPICurrentVersion,
@@ -89,13 +116,11 @@ void setStatus(CMPIStatus* rc, const CMPIBroker* mb, const CmpiStatus& st)
 
 // The body of all four factories.
 template <class MI, class FT>
-MI* createMI(FT* ft, const CMPIBroker* mb, const CMPIContext* ctx, CMPIStatus* rc)
+MI* createMI(MI& mi, FT* ft, const CMPIBroker* mb, const CMPIContext* ctx, CMPIStatus* rc)
 {
     std::lock_guard<std::mutex> serial(factoryMutex);
     try {
-        MI& mi = newMI<MI>();
         mi.ft = ft;
-        mi.hdl = nullptr;
         CmpiBaseMI* provider = baseVexlan_CNA_Provider.getBaseMI();
         if (provider == nullptr) {
             CmpiBroker broker(mb);
@@ -112,7 +137,7 @@ MI* createMI(FT* ft, const CMPIBroker* mb, const CMPIContext* ctx, CMPIStatus* r
             provider = created;
         }
         mi.hdl = static_cast<CmpiBaseMI*>(provider);
-        baseVexlan_CNA_Provider.incUseCount();
+        baseVexlan_CNA_Provider.attachMI(&mi);
         return &mi;
     } catch (const CmpiStatus& st) {
         setStatus(rc, mb, st);
@@ -130,25 +155,25 @@ CMPI_PROVIDER_FACTORY CMPIInstanceMI* Vexlan_CNA_Provider_Create_InstanceMI(cons
                                                                              const CMPIContext* ctx,
                                                                              CMPIStatus* rc)
 {
-    return createMI<CMPIInstanceMI>(&instMIFT, mb, ctx, rc);
+    return createMI<CMPIInstanceMI>(instanceMI, &instMIFT, mb, ctx, rc);
 }
 
 CMPI_PROVIDER_FACTORY CMPIAssociationMI* Vexlan_CNA_Provider_Create_AssociationMI(const CMPIBroker* mb,
                                                                                    const CMPIContext* ctx,
                                                                                    CMPIStatus* rc)
 {
-    return createMI<CMPIAssociationMI>(&assocMIFT, mb, ctx, rc);
+    return createMI<CMPIAssociationMI>(associationMI, &assocMIFT, mb, ctx, rc);
 }
 
 CMPI_PROVIDER_FACTORY CMPIMethodMI* Vexlan_CNA_Provider_Create_MethodMI(const CMPIBroker* mb,
                                                                          const CMPIContext* ctx, CMPIStatus* rc)
 {
-    return createMI<CMPIMethodMI>(&methMIFT, mb, ctx, rc);
+    return createMI<CMPIMethodMI>(methodMI, &methMIFT, mb, ctx, rc);
 }
 
 CMPI_PROVIDER_FACTORY CMPIIndicationMI* Vexlan_CNA_Provider_Create_IndicationMI(const CMPIBroker* mb,
                                                                                  const CMPIContext* ctx,
                                                                                  CMPIStatus* rc)
 {
-    return createMI<CMPIIndicationMI>(&indMIFT, mb, ctx, rc);
+    return createMI<CMPIIndicationMI>(indicationMI, &indMIFT, mb, ctx, rc);
 }

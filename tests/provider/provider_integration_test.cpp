@@ -99,11 +99,65 @@ TEST_F(Lifecycle, RepeatedFactoryCallsStartNoSecondThread)
     EXPECT_EQ(countLog("AdapterPollingLoop() starting"), 1);
     EXPECT_EQ(calls(ZORAP_FN_Initialize), 1u);
     EXPECT_EQ(threadCount(), threadsRunning);
-    // Three MIs of one type, three cleanups: the last one stops the provider.
+    // One MI type handed out three times, one cleanup (sfcb cleans up once
+    // per MI type): it stops the provider.
     ASSERT_TRUE(host.unload(true).ok());
+    EXPECT_EQ(host.counters().cleanupCalls, 1);
     EXPECT_EQ(countLog("***** Vexlan_CNA_Provider cleanup was called *****"), 1);
     EXPECT_EQ(countLog("AdapterPollingLoop() ending..."), 1);
+    EXPECT_EQ(countLog("Vexlan_CNA_Provider destructor complete"), 1);
+    EXPECT_EQ(calls(ZORAP_FN_Uninitialize), 1u);
     EXPECT_EQ(threadCount(), threadsBefore);
+}
+
+// sfcb calls a factory once per registered class section and provider type,
+// but cleans up once per library and MI type; an idle unload and a stop both
+// go that way. Every life must end with the provider's cleanup, its
+// destructor, the adapter library shut down and no thread left.
+TEST_F(Lifecycle, SfcbIdleUnloadsEndEveryLifeAfterRequestsToManyClasses)
+{
+    Host host;
+    prepareHost(host, cimhost::Flavour::Sfcb);
+    const int threadsBefore = threadCount();
+    for (int life = 1; life <= 2; ++life) {
+        for (const char* cls : {"Vexlan_Adapter_ComputerSystem", "Vexlan_FCHBA_FCPort", "Vexlan_FCHBA_PortController",
+                                "Vexlan_Adapter_PhysicalPackage", "Vexlan_NIC_EthernetPort2"})
+            ASSERT_TRUE(host.enumerateInstanceNames(classPath(cls)).ok()) << cls;
+        ASSERT_TRUE(host.associatorNames(hostPath(Value::fromString("x"))).ok());
+        EXPECT_EQ(host.invokeMethod(classPath("Vexlan_FCHBA_FCPort"), "NoSuchMethod", {}).rc, 0);
+        EXPECT_GE(host.counters().factoryCalls[0], 5 * life);
+        // An idle unload (terminating false), as after providerTimeoutInterval.
+        ASSERT_TRUE(host.unload(false).ok());
+        EXPECT_EQ(countLog("***** Vexlan_CNA_Provider cleanup was called *****"), life);
+        EXPECT_EQ(countLog("***** Vexlan_CNA_Provider cleanup done *****"), life);
+        EXPECT_EQ(countLog("Vexlan_CNA_Provider destructor complete"), life);
+        EXPECT_EQ(calls(ZORAP_FN_Uninitialize), static_cast<unsigned long>(life));
+        EXPECT_EQ(threadCount(), threadsBefore) << "life " << life;
+        ASSERT_TRUE(host.load(PROVIDER_LIBRARY, kProviderName).ok());
+    }
+}
+
+// A server that unloads the library without any cleanup: the library's own
+// unload code stops the polling thread and shuts the adapter library down.
+TEST_F(Lifecycle, AnUnloadWithoutCleanupLeavesNoThreadRunning)
+{
+    Host host;
+    prepareHost(host, cimhost::Flavour::Sfcb);
+    const int threadsBefore = threadCount();
+    ASSERT_EQ(enumerateHost(host).instances.size(), 1u);
+    EXPECT_GT(threadCount(), threadsBefore);
+    ASSERT_TRUE(host.unloadWithoutCleanup().ok());
+    EXPECT_EQ(host.counters().cleanupCalls, 0);
+    EXPECT_EQ(countLog("***** Vexlan_CNA_Provider cleanup was called *****"), 1);
+    EXPECT_EQ(countLog("AdapterPollingLoop() ending..."), 1);
+    EXPECT_EQ(countLog("Vexlan_CNA_Provider destructor complete"), 1);
+    EXPECT_EQ(calls(ZORAP_FN_Uninitialize), 1u);
+    EXPECT_EQ(threadCount(), threadsBefore);
+    // The next load starts a clean second life.
+    ASSERT_TRUE(host.load(PROVIDER_LIBRARY, kProviderName).ok());
+    ASSERT_EQ(enumerateHost(host).instances.size(), 1u);
+    ASSERT_TRUE(host.unload(true).ok());
+    EXPECT_EQ(countLog("Vexlan_CNA_Provider destructor complete"), 2);
 }
 
 TEST_F(Lifecycle, ReloadInOneProcessStartsCleanly)

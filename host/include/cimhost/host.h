@@ -137,6 +137,10 @@ public:
     // vetoed stay and the library stays loaded, and the status says so.
     // Otherwise the library is dlclose()d. Unloading an unloaded host is OK.
     Status unload(bool terminating = true);
+    // dlclose()s the library without calling any cleanup, as a server that
+    // lost track of its MIs would: what the provider still runs must end in
+    // its own unload code.
+    Status unloadWithoutCleanup();
     bool loaded() const;
     std::string providerName() const;
 

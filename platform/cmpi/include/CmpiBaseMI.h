@@ -9,9 +9,10 @@
 //     gets CMPI_RC_OK and nothing happens.
 //   - terminating false and isUnloadable() false: CMPI_RC_DO_NOT_UNLOAD,
 //     nothing else changes.  With terminating true the cleanup goes on.
-//   - Otherwise the use count of the provider base goes down by one: every
-//     cleanup counts, also when a server hands the same MI structure (got
-//     from several factory calls) to cleanup several times.  When the count
+//   - Otherwise the use count of the provider base goes down by one: once
+//     per MI structure attached with CmpiProviderBase::attachMI (a further
+//     cleanup of it in the same life changes nothing), and for every
+//     cleanup of an MI counted with incUseCount.  When the count
 //     reaches 0 the base and the handles of all MI structures cleaned up
 //     are cleared, cleanup(ctx) runs, the provider object is deleted and
 //     cleanup's status is returned.

@@ -5,11 +5,18 @@
 // factory asks getBaseMI(); the first finds none, makes the provider
 // object, links it with CmpiBaseMI::setProviderBase(&base) and stores it
 // with setBaseMI; every factory call then stores the object as its MI's
-// handle and calls incUseCount().  Each MI's cleanup comes through
-// CmpiBaseMI::driveBaseCleanup, which calls decUseCount(); the cleanup
-// that brings the count to 0 clears the base, calls the provider's
-// cleanup and deletes the object, so that factories called again later
-// (reload in the same process) start a new object.
+// handle and calls attachMI(mi) (or, in the classic way, incUseCount()).
+// Each MI's cleanup comes through CmpiBaseMI::driveBaseCleanup; the
+// cleanup that brings the count to 0 clears the base, calls the
+// provider's cleanup and deletes the object, so that factories called
+// again later (reload in the same process) start a new object.
+//
+// attachMI counts each MI structure once per life of the object, however
+// often a factory hands it out, and its cleanup counts it down once: a
+// library that keeps one MI structure per MI type then needs exactly one
+// cleanup per type, which is what both servers give (OpenPegasus cleans up
+// every MI it made, one per type; sfcb calls one factory per registered
+// class section but cleans up once per library and MI type).
 //
 // The class also holds the process-wide broker that handle classes use to
 // make new objects (CmpiObjectPath(ns, cls), CmpiArray(n, t), ...).  It is
@@ -36,6 +43,9 @@ public:
     CmpiBaseMI* getBaseMI();
     void setBaseMI(CmpiBaseMI* baseMI);
     void incUseCount();
+    // Counts the MI structure mi once in this life of the provider object:
+    // true when it was not counted yet.
+    bool attachMI(void* mi);
     // Lowers the count (not below 0) and returns the new count.
     int decUseCount();
     int getUseCount() const;
@@ -46,15 +56,23 @@ public:
 
 private:
     friend class CmpiBaseMI;
-    // One cleanup of the MI structure mi: lowers the count like
-    // decUseCount and notes mi; the cleanup that reaches 0 clears the
-    // handle of every MI structure noted in this life, so that none of
-    // them reaches the object about to be deleted.
+    // One cleanup of the MI structure mi.  An attached MI is counted down
+    // once (a further cleanup of it in the same life changes nothing); an
+    // MI counted by incUseCount lowers the count like decUseCount.  mi is
+    // noted; the cleanup that reaches 0 clears the handle of every MI
+    // structure noted in this life, so that none of them reaches the object
+    // about to be deleted.  Returns the count, or -1 when the cleanup
+    // changed nothing.
     int releaseMI(void* mi);
 
     mutable std::mutex mutex_;
     CmpiBaseMI* baseMI_;
     int useCount_;
+    struct Attached {
+        void* mi;
+        bool counted;  // attached and not cleaned up since
+    };
+    std::vector<Attached> attachedMIs_;  // every MI attached in this life
     std::vector<void*> cleanedMIs_;
 };
 

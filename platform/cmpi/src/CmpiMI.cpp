@@ -101,7 +101,7 @@ CMPIStatus CmpiBaseMI::cleanupMI(void* mi, const void* hdl, const CMPIContext* e
         CmpiProviderBase* pb = base->providerBase;
         if (pb == nullptr)
             return cStatus(mb, CMPI_RC_OK, nullptr);
-        if (pb->releaseMI(mi) > 0)
+        if (pb->releaseMI(mi) != 0)
             return cStatus(mb, CMPI_RC_OK, nullptr);
         pb->setBaseMI(nullptr);
         base->setProviderBase(nullptr);

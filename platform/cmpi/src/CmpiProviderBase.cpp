@@ -2,6 +2,7 @@
 // process-wide broker.
 #include "CmpiProviderBase.h"
 
+#include <algorithm>
 #include <atomic>
 
 namespace {
@@ -32,6 +33,19 @@ void CmpiProviderBase::incUseCount()
     ++useCount_;
 }
 
+bool CmpiProviderBase::attachMI(void* mi)
+{
+    std::lock_guard<std::mutex> lock(mutex_);
+    auto it = std::find_if(attachedMIs_.begin(), attachedMIs_.end(), [mi](const Attached& a) { return a.mi == mi; });
+    if (it == attachedMIs_.end())
+        it = attachedMIs_.insert(attachedMIs_.end(), Attached{mi, false});
+    if (it->counted)
+        return false;
+    it->counted = true;
+    ++useCount_;
+    return true;
+}
+
 int CmpiProviderBase::decUseCount()
 {
     std::lock_guard<std::mutex> lock(mutex_);
@@ -43,12 +57,15 @@ int CmpiProviderBase::decUseCount()
 int CmpiProviderBase::releaseMI(void* mi)
 {
     std::lock_guard<std::mutex> lock(mutex_);
+    auto it = std::find_if(attachedMIs_.begin(), attachedMIs_.end(), [mi](const Attached& a) { return a.mi == mi; });
+    if (it != attachedMIs_.end()) {
+        if (!it->counted)
+            return -1;  // cleaned up already in this life
+        it->counted = false;
+    }
     if (useCount_ > 0)
         --useCount_;
-    bool noted = false;
-    for (void* m : cleanedMIs_)
-        noted = noted || m == mi;
-    if (!noted)
+    if (std::find(cleanedMIs_.begin(), cleanedMIs_.end(), mi) == cleanedMIs_.end())
         cleanedMIs_.push_back(mi);
     if (useCount_ == 0) {
         // Every MI structure starts with its handle (CMPIInstanceMI's is a
@@ -56,6 +73,7 @@ int CmpiProviderBase::releaseMI(void* mi)
         for (void* m : cleanedMIs_)
             *static_cast<const void**>(m) = nullptr;
         cleanedMIs_.clear();
+        attachedMIs_.clear();
     }
     return useCount_;
 }
