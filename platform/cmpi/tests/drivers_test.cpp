@@ -113,6 +113,35 @@ TEST_F(Drivers, OneMiStructureFromManyFactoryCalls)
     EXPECT_EQ(inst.hdl, nullptr);
 }
 
+// With attachMI an MI structure counts once per life however often its
+// factory runs, and its first cleanup counts it down: one cleanup per MI type
+// ends the provider, as sfcb gives it; a repeated cleanup changes nothing; an
+// MI handed out again after its cleanup counts again.
+TEST_F(Drivers, AttachedMisCountOncePerLife)
+{
+    for (int i = 0; i < 3; ++i)
+        testFactory(inst, &testInstFT, fake::broker(), ctx, true);
+    testFactory(assoc, &testAssocFT, fake::broker(), ctx, true);
+    testFactory(meth, &testMethFT, fake::broker(), ctx, true);
+    EXPECT_EQ(testProviderBase.getUseCount(), 3);
+    EXPECT_EQ(inst.ft->cleanup(&inst, ctx, 0).rc, CMPI_RC_OK);
+    EXPECT_EQ(inst.ft->cleanup(&inst, ctx, 0).rc, CMPI_RC_OK);
+    EXPECT_EQ(testProviderBase.getUseCount(), 2);
+    testFactory(inst, &testInstFT, fake::broker(), ctx, true);
+    EXPECT_EQ(testProviderBase.getUseCount(), 3);
+    EXPECT_EQ(inst.ft->cleanup(&inst, ctx, 0).rc, CMPI_RC_OK);
+    EXPECT_EQ(assoc.ft->cleanup(&assoc, ctx, 0).rc, CMPI_RC_OK);
+    EXPECT_EQ(TestProvider::live, 1);
+    EXPECT_EQ(meth.ft->cleanup(&meth, ctx, 0).rc, CMPI_RC_OK);
+    EXPECT_EQ(TestProvider::live, 0);
+    EXPECT_EQ(TestProvider::cleanups, 1);
+    EXPECT_EQ(inst.hdl, nullptr);
+    EXPECT_EQ(meth.hdl, nullptr);
+    // A new life counts afresh.
+    testFactory(inst, &testInstFT, fake::broker(), ctx, true);
+    EXPECT_EQ(testProviderBase.getUseCount(), 1);
+}
+
 TEST_F(Drivers, UnloadVetoUnlessTerminating)
 {
     createAll();

@@ -87,9 +87,10 @@ extern CmpiProviderBase testProviderBase;
 
 // A factory as a provider library writes it: the first call makes and
 // initialises the provider, every call stores it as the MI's handle and
-// counts once.
+// counts once (incUseCount), or counts the MI structure once per life
+// (attachMI).
 template <class MI, class FT>
-MI* testFactory(MI& mi, FT* ft, const CMPIBroker* mb, const CMPIContext* ctx)
+MI* testFactory(MI& mi, FT* ft, const CMPIBroker* mb, const CMPIContext* ctx, bool attach = false)
 {
     mi.ft = ft;
     CmpiBaseMI* base = testProviderBase.getBaseMI();
@@ -103,7 +104,10 @@ MI* testFactory(MI& mi, FT* ft, const CMPIBroker* mb, const CMPIContext* ctx)
         testProviderBase.setBaseMI(base);
     }
     mi.hdl = base;
-    testProviderBase.incUseCount();
+    if (attach)
+        testProviderBase.attachMI(&mi);
+    else
+        testProviderBase.incUseCount();
     return &mi;
 }
 
