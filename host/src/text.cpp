@@ -284,10 +284,9 @@ bool parsePath(const std::string& textIn, ObjectPath& out, std::string& error, c
             const size_t vstart = pos;
             while (pos < text.size() && text[pos] != ',') ++pos;
             raw = text.substr(vstart, pos - vstart);
-            if (raw.empty()) {
-                error = "missing value of key " + name;
-                return false;
-            }
+            // `Key=` is the empty text: a batch line's word splitting turns
+            // `Key=""` into it, as a shell does on the command line.
+            quoted = raw.empty();
         }
         const PropertyDecl* decl = repo ? repo->findProperty(out.className, name) : nullptr;
         Value v;

@@ -77,6 +77,18 @@ TEST(PathText, ClassPathsAndSingletons) {
     EXPECT_EQ(formatPath(p), "Only");
 }
 
+// A batch line's word splitting turns Name="" into Name=, as a shell does:
+// both stand for the empty text.
+TEST(PathText, AnEmptyKeyValueIsTheEmptyText) {
+    const ClassRepository r = repo();
+    for (const char* text : {"root/a:T_Port.Name=", "root/a:T_Port.Name=\"\"", "root/a:T_Port.Name=,Num=3"}) {
+        ObjectPath p;
+        std::string err;
+        ASSERT_TRUE(parsePath(text, p, err, &r)) << text << ": " << err;
+        EXPECT_EQ(*p.key("Name"), Value::fromString("")) << text;
+    }
+}
+
 TEST(PathText, BadInputIsRefusedWithAReason) {
     const ClassRepository r = repo();
     const char* const bad[] = {
@@ -86,7 +98,7 @@ TEST(PathText, BadInputIsRefusedWithAReason) {
         "root a:T_Port",
         "root/a:T_Port.",
         "root/a:T_Port.Name",
-        "root/a:T_Port.Name=",
+        "root/a:T_Port.Num=",
         "root/a:T_Port.Name=\"open",
         "root/a:T_Port.Name=\"a\"Num=1",
         "root/a:T_Port.Num=70000",
