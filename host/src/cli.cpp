@@ -53,6 +53,9 @@ const char kUsage[] =
     "  -q, --query WQL          filter for listen (default SELECT * FROM CLASS)\n"
     "      --json               JSON output (shape in docs/cimhost.md)\n"
     "  -v, --verbose            copy the provider's log and trace lines to stderr\n"
+    "      --installed          use the provider installed beside this cimhost (the\n"
+    "                           default when no -p is given and one is found): its\n"
+    "                           library, MOF, namespace and sfcb registration\n"
     "  -h, --help               this text\n"
     "\n"
     "Verbs (paths in CIM text form, e.g. 'root/ns:Class.Key=\"v\",Num=5'):\n"
@@ -632,11 +635,17 @@ bool splitWords(const std::string& line, std::vector<std::string>& words, std::s
 }
 
 int runCli(const std::vector<std::string>& args, std::ostream& out, std::ostream& err) {
+    return runCli(args, out, err, nullptr);
+}
+
+int runCli(const std::vector<std::string>& args, std::ostream& out, std::ostream& err,
+           const InstalledProvider* installed) {
     std::mutex errLock;   // log lines come from provider threads too; outlives the host
     Session s;
     s.out = &out;
     s.err = &err;
     std::vector<std::string> words;
+    bool wantInstalled = false;
     // Process options first; per-operation ones are left for the verb.
     for (size_t k = 1; k < args.size(); ++k) {
         const std::string& a = args[k];
@@ -670,6 +679,8 @@ int runCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
             s.json = true;
         } else if (a == "-v" || a == "--verbose") {
             s.verbose = true;
+        } else if (a == "--installed") {
+            wantInstalled = true;
         } else if (a == "-N" || a == "--namespace") {
             if (!value(s.defaultNs)) return usage(s, "option " + a + " needs a value");
         } else {
@@ -680,6 +691,16 @@ int runCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
     std::string e;
     if (!takeOpOptions(s, words, o, e)) return usage(s, e);
     if (words.empty()) return usage(s, "no verb given (see --help)");
+    if (wantInstalled && (installed == nullptr || installed->library.empty()))
+        return fail(s, Status{kRcFailed, "no installed provider found beside this cimhost"});
+    if (s.provider.empty() && installed != nullptr && !installed->library.empty()) {
+        s.provider = installed->library;
+        if (s.name.empty()) s.name = installed->name;
+        if (s.mofs.empty()) s.mofs.push_back(installed->mofDir);
+        if (s.defaultNs.empty()) s.defaultNs = installed->nameSpace;
+        if (s.regs.empty() && s.flavour == Flavour::Sfcb && !installed->registration.empty())
+            s.regs.push_back(installed->registration);
+    }
 
     s.host.setStrict(s.strict);
     s.host.setFlavour(s.flavour);

@@ -157,6 +157,17 @@ check_load() {
   # Both flavours see the same objects.
   cmp -s "$tmp/pegasus.out" "$tmp/sfcb.out" || fail "the two flavours answer differently"
   "$prefix/$bindir/cimhost" --help | grep -q -- '--reg FILE' || fail "cimhost --help does not describe --reg"
+  # With no options the installed cimhost finds the installed provider, its
+  # class files and namespace; an empty key in a batch line is the empty text.
+  out=$tmp/plain.out err=$tmp/plain.err
+  if ! "$prefix/$bindir/cimhost" ein Vexlan_FCHBA_FCPort > "$out" 2> "$err"; then
+    fail "cimhost without options failed"; cat "$err"
+  fi
+  grep -q '^root/vexlan_cmpi:Vexlan_FCHBA_FCPort\..*DeviceID="VXA1631K0042_' "$out" ||
+    fail "cimhost without options does not show the installed provider's FC ports"
+  printf 'gi Vexlan_FCHBA_FCPort.SystemCreationClassName="Vexlan_Adapter_ComputerSystem",SystemName="x",CreationClassName="Vexlan_FCHBA_FCPort",DeviceID=""\n' |
+    "$prefix/$bindir/cimhost" --installed -f sfcb batch - > "$out" 2> "$err" || true
+  grep -q '^CMPI_RC_ERR_NOT_FOUND' "$err" || { fail "an empty key in a batch line is not looked up"; cat "$err"; }
 }
 
 case "$mode" in
