@@ -48,5 +48,10 @@ install: build
 	cmake --build $(BUILD) -j $(JOBS)
 	cmake --install $(BUILD) --prefix $(PREFIX)
 
+# The Debian package, from the plain build tree: $(BUILD)/vexlan-cna-provider_<version>_<arch>.deb
+deb: build
+	@scripts/install-deb-tools.sh
+	scripts/make-deb.sh $(BUILD) $(BUILD)
+
 clean:
 	rm -rf $(BUILD) $(ASAN_BUILD) $(TSAN_BUILD)

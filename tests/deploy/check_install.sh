@@ -13,6 +13,11 @@
 #       flavours: every registered class answers, and the default adapter
 #       description beside the installed adapter library is the one read.
 #       Run it under tests/isolate.sh (the provider writes under /opt).
+#   check_install.sh deb BUILD SOURCE BINDIR LIBDIR DATADIR MANDIR
+#       build the Debian package from the build tree (scripts/make-deb.sh):
+#       its file list, its control fields, no path of the build or source
+#       tree in it, and the unpacked package's cimhost finding the unpacked
+#       provider with no options (under tests/isolate.sh).
 set -euo pipefail
 mode=$1 build=$2 src=$3 bindir=$4 libdir=$5 datadir=$6 mandir=$7
 tmp=$(mktemp -d /tmp/vexlan-deploy.XXXXXX)
@@ -170,10 +175,53 @@ check_load() {
   grep -q '^CMPI_RC_ERR_NOT_FOUND' "$err" || { fail "an empty key in a batch line is not looked up"; cat "$err"; }
 }
 
+check_deb() {
+  command -v patchelf > /dev/null || { echo "SKIP: patchelf is missing (scripts/install-deb-tools.sh)"; exit 77; }
+  local deb
+  deb=$(CMAKE=${CMAKE:-cmake} "$src/scripts/make-deb.sh" "$build" "$tmp/out") || { fail "make-deb.sh failed"; return; }
+  [ -f "$deb" ] || { fail "no package written"; return; }
+  dpkg-deb -c "$deb" > "$tmp/list"
+  # Paths only, links without their targets.
+  awk '{ print $6 }' "$tmp/list" | sed 's|^\./||; s|/$||' | grep -v '^$' | sort > "$tmp/paths"
+  if grep -q -e "$build" -e "$src" -e '/tmp/' "$tmp/list"; then
+    fail "the package names a build path:"; grep -e "$build" -e "$src" -e '/tmp/' "$tmp/list"
+  fi
+  grep -qv '^usr' "$tmp/paths" && fail "files outside /usr: $(grep -v '^usr' "$tmp/paths")"
+  local want
+  for want in usr/bin/cimhost usr/lib/libVexlan_CNA_Provider.so usr/lib/libVexlan_CNA_Provider.so.1 \
+              usr/lib/libzorap_cna_provider.so.1 usr/lib/zorap_sim_adapters.json \
+              usr/share/vexlan-cna/Vexlan_CNA_Provider.mof usr/share/vexlan-cna/Vexlan_CNA_Provider_Interop.mof \
+              usr/share/vexlan-cna/Vexlan_CNA_Provider_Registration.mof usr/share/vexlan-cna/Vexlan_CNA_Provider.reg \
+              usr/share/vexlan-cna/mof/Vexlan_FCHBA_FCPort.mof usr/share/man/man8/vexlan-cna.8.gz \
+              usr/share/doc/vexlan-cna-provider/deploy.md usr/share/doc/vexlan-cna-provider/copyright; do
+    grep -qx "$want" "$tmp/paths" || fail "the package lacks $want"
+  done
+  grep -q 'libVexlan_CNA_Provider.so -> libVexlan_CNA_Provider.so.1' "$tmp/list" ||
+    fail "the unversioned link of the provider is missing"
+  local field text
+  for field in Package Version Architecture Depends Description; do
+    text=$(dpkg-deb -f "$deb" "$field")
+    [ -n "$text" ] || fail "control field $field is empty"
+  done
+  [[ "$text" == *sfcbstage* ]] || fail "the description does not tell how to register with sfcb"
+  [[ "$text" == *cimmof* ]] || fail "the description does not tell how to register with OpenPegasus"
+
+  # Unpacked, the package's cimhost finds the package's provider.
+  local root=$tmp/root
+  dpkg-deb -x "$deb" "$root"
+  [ -z "$(readelf -d "$root/usr/lib/libVexlan_CNA_Provider.so.1" | grep -E 'RPATH|RUNPATH')" ] ||
+    fail "the packaged provider keeps a run path"
+  if ! LD_LIBRARY_PATH=$root/usr/lib "$root/usr/bin/cimhost" --installed ein Vexlan_FCHBA_FCPort > "$tmp/deb.out" 2> "$tmp/deb.err"; then
+    fail "the packaged cimhost failed"; cat "$tmp/deb.err"
+  fi
+  grep -q '^root/vexlan_cmpi:Vexlan_FCHBA_FCPort\.' "$tmp/deb.out" || fail "the packaged cimhost shows no FC port"
+}
+
 case "$mode" in
   tree) check_tree ;;
   load) check_load ;;
-  *) echo "usage: $0 tree|load BUILD SOURCE BINDIR LIBDIR DATADIR MANDIR" >&2; exit 2 ;;
+  deb) check_deb ;;
+  *) echo "usage: $0 tree|load|deb BUILD SOURCE BINDIR LIBDIR DATADIR MANDIR" >&2; exit 2 ;;
 esac
 if [ "$failures" -gt 0 ]; then
   echo "$failures check(s) failed"
