@@ -113,6 +113,15 @@ void NicClassModule::forEach(const std::function<bool(const NicRecord&)>& visit)
                 return;
         }
         return;
+    case NicWalk::AdapterSoftware:
+        for (_CNAStruc* adapter = m_CNAList; adapter != nullptr; adapter = adapter->next)
+            for (int type : {2, 3}) {
+                record.adapter = adapter;
+                record.softwareType = type;
+                if (!visit(record))
+                    return;
+            }
+        return;
     case NicWalk::Profiles:
         for (_RegisteredProfile* node = m_RegisteredProfileList; node != nullptr; node = node->next) {
             record.profile = node;

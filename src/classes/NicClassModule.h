@@ -39,6 +39,7 @@ struct NicRecord {
     _CNAStruc* adapter = nullptr;
     _CNAPortStruc* port = nullptr;
     _RegisteredProfile* profile = nullptr;
+    int softwareType = 0;   // software identities: 2 driver, 3 flash firmware
 };
 
 // Which records a NIC class walks.
@@ -46,6 +47,7 @@ enum class NicWalk {
     Ports,      // every port of every adapter of m_CNAList, in chain order
     Adapters,   // every adapter of m_CNAList, ports or not
     Profiles,   // every node of m_RegisteredProfileList
+    AdapterSoftware,  // every adapter of m_CNAList twice: software type 2, then 3
 };
 
 // Room for a key text that the NIC modules and the associations format: a

@@ -13,6 +13,7 @@
 #include "inventory/AdapterFunc.h"
 #include "provider/Vexlan_CNA_Provider_Tables.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
+#include "update/FlashUpdate.h"
 #include "support/Vexlan_NIC_Properties.h"
 
 pthread_mutex_t Vexlan_CNA_Provider::provider_lock;
@@ -242,6 +243,9 @@ CmpiStatus Vexlan_CNA_Provider::cleanup(CmpiContext&)
 {
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider cleanup was called *****");
+    // A flash worker still writing is waited for: no code of the provider may
+    // run once the last cleanup has returned.
+    WaitForFlashWorkers();
     bool started = initializing || initialized;
     if (initializing) {
         while (!initialized)

@@ -20,6 +20,7 @@
 #include <vector>
 
 #include "CmpiImpl.h"
+#include "update/ConcreteJob.h"
 
 class Vexlan_CNA_Provider;
 struct _CNAStruc;
@@ -127,6 +128,21 @@ public:
     // watch: alarm type 1 sends a link up alert, 2 a link down alert.
     void m_generateIndication(unsigned int deviceNum, int alarmType, int rsltParam, unsigned char* strParam);
     void generatePortAlertIndication(int alarmType, _CNAStruc* adapter, _CNAPortStruc* port);
+
+    // Update jobs (src/update). The two start functions begin an
+    // asynchronous flash write on a worker thread of its own and enter its
+    // job in jobMap; false when no job id is free or the thread can't start.
+    // jobPath arrives with its name space and class and gets the InstanceID.
+    bool StartFCFlashUpdateThread(_tagZORAPSDMDevice* device, const unsigned char* fileName,
+                                  CmpiObjectPath& jobPath);
+    bool StartNICFlashUpdateThread(_CNAStruc* adapter, const unsigned char* fileName,
+                                   unsigned long long imageSize, CmpiObjectPath& jobPath);
+    // Forward to SerializeConcreteJobToPrefFile and DeserializeConcreteJobToPrefFile.
+    void SerializeConcreteJobInfo();
+    void DeserializeConcreteJobInfo();
+
+    // Every known update job by id, under jobStoreLock().
+    ConcreteJobMap jobMap;
 
     // Set by the polling thread: initializing as the first build begins,
     // initialized when it has finished. Read without a lock by invokeMethod

@@ -34,7 +34,13 @@
 #include "classes/Vexlan_Adapter_PhysicalPort_CMPI.h"
 #include "indications/Vexlan_CNA_HBAProviderIndications_CMPI.h"
 #include "inventory/AdapterFunc_LinkWatch.h"
+#include "classes/Vexlan_Adapter_ConcreteJob_CMPI.h"
+#include "classes/Vexlan_FCHBA_SoftwareIdentity_CMPI.h"
+#include "classes/Vexlan_FCHBA_SoftwareInstallationService_CMPI.h"
+#include "classes/Vexlan_NIC_SoftwareIdentity.h"
+#include "classes/Vexlan_NIC_SoftwareInstallationService.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "update/JobPersistence.h"
 
 namespace {
 
@@ -52,13 +58,7 @@ CmpiStatus placeholderGetInstance(const CmpiContext&, CmpiResult&, const CmpiObj
 {
     return CmpiStatus(CMPI_RC_OK);
 }
-CmpiStatus placeholderInvokeMethod(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char*,
-                                   const CmpiArgs&, CmpiArgs&)
-{
-    return CmpiStatus(CMPI_RC_OK);
-}
 void placeholderListOp() {}
-void placeholderStep() {}
 
 constexpr ClassOps kPlaceholder = {placeholderEnumInstanceNames, placeholderEnumInstances, placeholderGetInstance};
 constexpr ListOps kNoList = {placeholderListOp, placeholderListOp};
@@ -88,6 +88,13 @@ constexpr ClassOps PhysicalPort = CLASS_OPS(PhysicalPort);
 constexpr ClassOps StorageExtent = CLASS_OPS(StorageExtent);
 constexpr ClassOps SCSIProtocolEndpointHBA = CLASS_OPS(SCSIProtocolEndpointHBA);
 constexpr ClassOps SCSIProtocolEndpointTarget = CLASS_OPS(SCSIProtocolEndpointTarget);
+constexpr ClassOps SoftwareIdentity = CLASS_OPS(SoftwareIdentity);
+constexpr ClassOps SoftwareInstallationService = CLASS_OPS(SoftwareInstallationService);
+constexpr ClassOps SoftwareInstallationServiceCapabilities = CLASS_OPS(SoftwareInstallationServiceCapabilities);
+constexpr ClassOps ConcreteJob = CLASS_OPS(ConcreteJob);
+constexpr ClassOps Nic_SoftwareIdentity = CLASS_OPS(Nic_SoftwareIdentity);
+constexpr ClassOps Nic_SoftwareInstallationService = CLASS_OPS(Nic_SoftwareInstallationService);
+constexpr ClassOps Nic_SoftwareInstallationServiceCapabilities = CLASS_OPS(Nic_SoftwareInstallationServiceCapabilities);
 }  // namespace ops
 
 namespace lists {
@@ -109,6 +116,7 @@ constexpr ListOps PhysicalPortList = {::removePhysicalPortList, ::buildPhysicalP
 constexpr ListOps SCSIProtocolEndpointHBAList = {::removeSCSIProtocolEndpointHBAList, ::buildSCSIProtocolEndpointHBAList};
 constexpr ListOps SCSIProtocolEndpointTargetList = {::removeSCSIProtocolEndpointTargetList, ::buildSCSIProtocolEndpointTargetList};
 constexpr ListOps StorageExtentList = {::removeStorageExtentList, ::buildStorageExtentList};
+constexpr ListOps SoftwareIdentityList = {::removeSoftwareIdentityList, ::buildSoftwareIdentityList};
 }  // namespace lists
 
 // ---- Modules not built yet ---------------------------------------------------
@@ -120,7 +128,6 @@ constexpr ListOps StorageExtentList = {::removeStorageExtentList, ::buildStorage
 //     constexpr ListOps FCPortList = {::removeFCPortList, ::buildFCPortList};
 // and include its header above. The tables below name these constants.
 namespace ops {
-constexpr ClassOps SoftwareIdentity = kPlaceholder;
 constexpr ClassOps AssocComputerSystemPortController = kPlaceholder;
 constexpr ClassOps AssocComputerSystemSCSIProtocolController = kPlaceholder;
 constexpr ClassOps AssocComputerSystemFCPort = kPlaceholder;
@@ -142,19 +149,13 @@ constexpr ClassOps AssocComputerSystemCommMech = kPlaceholder;
 constexpr ClassOps AssocObjectManagerNamespace = kPlaceholder;
 constexpr ClassOps AssocPhysicalPackagePhysicalConnector = kPlaceholder;
 constexpr ClassOps AssocPhysicalPackagePhysicalPort = kPlaceholder;
-constexpr ClassOps SoftwareInstallationService = kPlaceholder;
-constexpr ClassOps SoftwareInstallationServiceCapabilities = kPlaceholder;
 constexpr ClassOps AssocSoftwareIdentitySoftwareInstallationService = kPlaceholder;
 constexpr ClassOps AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities = kPlaceholder;
 constexpr ClassOps AssocComputerSystemSoftwareInstallationService = kPlaceholder;
-constexpr ClassOps ConcreteJob = kPlaceholder;
 constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointHBA = kPlaceholder;
 constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointTarget = kPlaceholder;
 constexpr ClassOps AssocComputerSystemStorageExtent = kPlaceholder;
 constexpr ClassOps AssocFCPortSCSIProtocolEndpointHBA = kPlaceholder;
-constexpr ClassOps Nic_SoftwareIdentity = kPlaceholder;
-constexpr ClassOps Nic_SoftwareInstallationService = kPlaceholder;
-constexpr ClassOps Nic_SoftwareInstallationServiceCapabilities = kPlaceholder;
 constexpr ClassOps Nic_AssocComputerSystemPortController = kPlaceholder;
 constexpr ClassOps AssocComputerSystemEthernetPort = kPlaceholder;
 constexpr ClassOps AssocPortControllerEthernetPort = kPlaceholder;
@@ -178,22 +179,18 @@ constexpr ClassOps Nic_AssocComputerSystemSoftwareIdentity = kPlaceholder;
 }  // namespace ops
 
 namespace lists {
-constexpr ListOps SoftwareIdentityList = kNoList;
 constexpr ListOps AssocFCPortFCPortStatistics = kNoList;
 constexpr ListOps AssocComputerSystemSCSIProtocolEndpointTarget = kNoList;
 constexpr ListOps AssocComputerSystemStorageExtent = kNoList;
 constexpr ListOps AssocFCPortSCSIProtocolEndpointHBA = kNoList;
 }  // namespace lists
 
-namespace methods {
-constexpr InvokeMethodOp SoftwareInstallationService = placeholderInvokeMethod;
-constexpr InvokeMethodOp Nic_SoftwareInstallationService = placeholderInvokeMethod;
-}  // namespace methods
+
 
 namespace steps {
 constexpr void (*InitializeRegisteredProfileList)() = ::InitializeRegisteredProfileList;
 constexpr void (*Clear_RegisteredProfile_List)() = ::Clear_RegisteredProfile_List;
-constexpr void (*DeserializeConcreteJobToPrefFile)() = placeholderStep;
+constexpr void (*DeserializeConcreteJobToPrefFile)() = ::DeserializeConcreteJobToPrefFile;
 constexpr void (*Update_CNA_List)(ThreadArgs&) = ::Update_CNA_List;
 constexpr ZORAP_ALARM_CALLBACK OSSGenerateHostNotificationAlarm = ::OSSGenerateHostNotificationAlarm;
 }  // namespace steps
@@ -313,8 +310,8 @@ constexpr ListSequenceRow kListSequence[] = {
 
 // ---- Method routes ---------------------------------------------------------------
 constexpr MethodRoute kMethodRoutes[] = {
-    {"Vexlan_FCHBA_SoftwareInstallationService", methods::SoftwareInstallationService},
-    {"Vexlan_NIC_SoftwareInstallationService", methods::Nic_SoftwareInstallationService},
+    {"Vexlan_FCHBA_SoftwareInstallationService", ::invokeMethod_SoftwareInstallationService},
+    {"Vexlan_NIC_SoftwareInstallationService", ::invokeMethod_Nic_SoftwareInstallationService},
 };
 
 }  // namespace

@@ -37,6 +37,8 @@ CMPIStatus caughtStatus(const CMPIBroker* mb) noexcept
         throw;
     } catch (const CmpiStatus& st) {
         return st.status(mb);
+    } catch (const CMPIStatus& st) {
+        return st;  // a plain status thrown by the provider goes out as it stands
     } catch (const std::exception& e) {
         return cStatus(mb, CMPI_RC_ERR_FAILED, e.what());
     } catch (...) {

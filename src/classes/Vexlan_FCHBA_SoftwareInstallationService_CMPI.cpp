@@ -1,0 +1,315 @@
+// Vexlan_FCHBA_SoftwareInstallationService, its Capabilities, and the FC
+// flash update method "InstallFromURI".
+#include "classes/Vexlan_FCHBA_SoftwareInstallationService_CMPI.h"
+
+#include <strings.h>
+
+#include <cstdarg>
+#include <cstdio>
+#include <string>
+
+#include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
+#include "classes/Vexlan_FCHBA_SoftwareIdentity_CMPI.h"
+#include "classes/Vexlan_FC_FCPort_CMPI.h"
+#include "classes/Vexlan_FC_PortController_CMPI.h"
+#include "inventory/AdapterFunc.h"
+#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "support/Vexlan_FC_Utils_CMPI.h"
+#include "support/ossimpl.h"
+#include "update/InstallHelpers.h"
+
+namespace {
+
+const char kServiceName[] = "CNA_SW_INSTALLER";
+const char kOperation[] = "invokeMethod_SoftwareInstallationService";
+
+struct ServiceSlot {
+    unsigned char valid;
+};
+const ServiceSlot kSlot = {1};
+
+const PropertyRow<ServiceSlot> kServiceProperties[] = {
+    {"Name", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData(kServiceName))},
+    {"SystemCreationClassName", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("Vexlan_Adapter_ComputerSystem"))},
+    {"SystemName", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData(hostName_ComputerSystem))},
+    {"CreationClassName", CMPI_string,
+     CLASS_VALUE(ServiceSlot, CmpiData("Vexlan_FCHBA_SoftwareInstallationService"))},
+    {"Caption", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("CNA Flash Image Update Service"))},
+    {"Description", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("Updating CNA flash(boot code, firmwares...)"))},
+    {"ElementName", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("Updating Vexlan CNA flash Image"))},
+};
+const char* const kServiceKeys[] = {"SystemCreationClassName", "SystemName", "CreationClassName", "Name", nullptr};
+
+const ClassModule<ServiceSlot> kService = ClassModule<ServiceSlot>("SoftwareInstallationService")
+                                              .single(kSlot)
+                                              .key("Name", [](const ServiceSlot&) { return kServiceName; })
+                                              .filterKeys(kServiceKeys)
+                                              .pathKeys(kServiceKeys)
+                                              .properties(kServiceProperties);
+
+const PropertyRow<ServiceSlot> kCapabilitiesProperties[] = {
+    {"InstanceID", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData(kServiceName))},
+    {"Caption", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("CNA Flash Image Update Capabilities"))},
+    {"CanAddToCollection", CMPI_boolean, CLASS_VALUE(ServiceSlot, CmpiData(false))},
+    {"SupportedAsynchronousActions", CMPI_uint16A, CLASS_VALUE(ServiceSlot, uint16Array({5}))},
+    {"SupportedSynchronousActions", CMPI_uint16A, CLASS_VALUE(ServiceSlot, uint16Array({5}))},
+    {"SupportedURISchemes", CMPI_uint16A, CLASS_VALUE(ServiceSlot, uint16Array({3}))},
+    {"SupportedInstallOptions", CMPI_uint16A, CLASS_VALUE(ServiceSlot, uint16Array({32768, 5}))},
+    {"ElementName", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("Vexlan CNA Flash Image Update"))},
+    {"Description", CMPI_string,
+     CLASS_VALUE(ServiceSlot, CmpiData("Flash image includes boot code, ASIC and MPI Firmware"))},
+};
+const char* const kCapabilitiesKeys[] = {"InstanceID", nullptr};
+
+const ClassModule<ServiceSlot> kCapabilities =
+    ClassModule<ServiceSlot>("SoftwareInstallationServiceCapabilities")
+        .single(kSlot)
+        .key("InstanceID", [](const ServiceSlot&) { return kServiceName; })
+        .filterKeys(kCapabilitiesKeys)
+        .pathKeys(kCapabilitiesKeys)
+        .properties(kCapabilitiesProperties);
+
+const char* textOf(CMPIString* s)
+{
+    return s != nullptr && s->ft != nullptr ? s->ft->getCharPtr(s, nullptr) : nullptr;
+}
+
+// A failure of the method: the text formatted, written to the error log (or
+// with `debugOnly` to the debug output) behind "<operation>: Error: ", and
+// thrown with `code`; the method's catch turns it into the value 2.
+[[noreturn]] __attribute__((format(printf, 3, 4))) void fail(bool debugOnly, CMPIrc code, const char* format, ...)
+{
+    char text[1024];
+    va_list args;
+    va_start(args, format);
+    std::vsnprintf(text, sizeof(text), format, args);
+    va_end(args);
+    if (debugOnly) {
+        if (g_EnableDebugPrint)
+            Vexlan_FC_Utils_CMPI::DebugPrint("%s: Error: %s", kOperation, text);
+    } else if (g_EnableLogError) {
+        Vexlan_FC_Utils_CMPI::LogError("%s: Error: %s", kOperation, text);
+    }
+    throw CmpiStatus(code, text);
+}
+
+#define INSTALL_DEBUG(...)                                 \
+    do {                                                   \
+        if (g_EnableDebugPrint)                            \
+            Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__); \
+    } while (0)
+
+// The FC flash write while the caller waits; the lists of the software and
+// the FC ports are rebuilt afterwards so the new versions show.
+unsigned int updateSynchronously(_tagZORAPSDMDevice* device, const char* fileName, const char* serial)
+{
+    gbFlashUpdateInProgress = true;
+    const ZORAP_STATUS result =
+        ZORAP_doOptionROMUpdate(device, reinterpret_cast<const unsigned char*>(fileName), 0);
+    gbFlashUpdateInProgress = false;
+    if (result != 0)
+        fail(true, CMPI_RC_ERR_NOT_FOUND, "Failed to update flash image, ErrorCode=%d!", static_cast<int>(result));
+    INSTALL_DEBUG("****** Successfully updated flash image for Device with serial number %s", serial);
+    OSSSleep(5);
+    removeSoftwareIdentityList();
+    buildSoftwareIdentityList();
+    removeFCPortList();
+    buildFCPortList();
+    return 0;
+}
+
+}  // namespace
+
+CmpiStatus getInstanceOfService(const ServiceKeyTexts& texts, CmpiResult& rslt, const CmpiObjectPath& path,
+                                const char** properties, bool sendInstance,
+                                CmpiInstance (*make)(const char*, const char*, const char**))
+{
+    const std::string operation = texts.operation;
+    std::string keys[2];
+    const char* names[2] = {"Name", "SystemName"};
+    const char* readErrors[2] = {texts.nameKeyError, texts.systemNameKeyError};
+    CMPIObjectPath* enc = path.getEnc();
+    for (int k = 0; k < 2; ++k) {
+        if (readErrors[k] == nullptr) {
+            classmodule::KeyRead key = classmodule::readStringKey(path, names[k], operation);
+            if (!key.found)
+                return key.status;
+            keys[k] = key.text;
+            continue;
+        }
+        CMPIStatus rc = {CMPI_RC_OK, nullptr};
+        CMPIData data = enc->ft->getKey(enc, names[k], &rc);
+        if (rc.rc != CMPI_RC_OK) {
+            if (g_EnableLogError)
+                Vexlan_FC_Utils_CMPI::LogError("%s", readErrors[k]);
+            return CmpiStatus(rc);
+        }
+        if (data.type != CMPI_string) {
+            if (g_EnableLogError)
+                Vexlan_FC_Utils_CMPI::LogError("%s(%d)", texts.keyTypeError, static_cast<int>(data.type));
+            return CmpiStatus(rc);
+        }
+        const char* text = (data.state & CMPI_nullValue) ? nullptr : textOf(data.value.string);
+        keys[k] = text != nullptr ? text : "";
+    }
+    if (strcasecmp(keys[0].c_str(), kServiceName) != 0 || strcasecmp(keys[1].c_str(), hostName_ComputerSystem) != 0) {
+        if (g_EnableLogError)
+            Vexlan_FC_Utils_CMPI::LogError("%s: Error no matching instance found,                KeyValue=%s, "
+                                           "MatchingElement=%s, KeyValue2=%s, MatchingElement2=%s!",
+                                           operation.c_str(), keys[0].c_str(), kServiceName, keys[1].c_str(),
+                                           hostName_ComputerSystem);
+        throw CmpiStatus(CMPI_RC_ERR_NOT_FOUND, keys[0].c_str());
+    }
+    if (!sendInstance)
+        return CmpiStatus(CMPI_RC_OK);
+    classmodule::PathNames pathNames;
+    CmpiStatus st = classmodule::readPathNames(path, operation, pathNames);
+    if (st.rc() != CMPI_RC_OK)
+        return st;
+    rslt.returnData(make(pathNames.className, pathNames.nameSpace, properties));
+    return CmpiStatus(CMPI_RC_OK);
+}
+
+CmpiObjectPath makePath_SoftwareInstallationService(const char* className, const char* nameSpace)
+{
+    return kService.makePath(className, nameSpace, 0);
+}
+
+CmpiInstance makeInstance_SoftwareInstallationService(const char* className, const char* nameSpace,
+                                                      const char** properties)
+{
+    return kService.makeInstance(className, nameSpace, properties, 0);
+}
+
+CmpiStatus enumInstances_SoftwareInstallationService(const CmpiContext& ctx, CmpiResult& rslt,
+                                                     const CmpiObjectPath& path, const char** properties)
+{
+    return kService.enumInstances(ctx, rslt, path, properties);
+}
+
+CmpiStatus enumInstanceNames_SoftwareInstallationService(const CmpiContext& ctx, CmpiResult& rslt,
+                                                         const CmpiObjectPath& path)
+{
+    return kService.enumInstanceNames(ctx, rslt, path);
+}
+
+CmpiStatus getInstance_SoftwareInstallationService(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath& path,
+                                                   const char** properties, bool sendInstance)
+{
+    const ServiceKeyTexts texts = {"getInstance_SoftwareInstallationService", nullptr, nullptr, nullptr};
+    return getInstanceOfService(texts, rslt, path, properties, sendInstance, makeInstance_SoftwareInstallationService);
+}
+
+VEXLAN_SINGLE_CLASS_OPERATIONS(SoftwareInstallationServiceCapabilities, kCapabilities)
+
+CmpiStatus invokeMethod_SoftwareInstallationService(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath& ref,
+                                                    const char* methodName, const CmpiArgs& in, CmpiArgs& out)
+{
+    if (strcasecmp(methodName != nullptr ? methodName : "", "InstallFromURI") != 0) {
+        ReturnMethodValue(rslt, 1);
+        return CmpiStatus(CMPI_RC_OK);
+    }
+    // The first reading of the options stands outside the method's guard: a
+    // failure here goes to the caller as a status.
+    const CmpiData uri = in.getArg("URI");
+    const CmpiData target = in.getArg("Target");
+    {
+        const CmpiArray options = in.getArg("InstallOptions");
+        for (CMPICount i = 0; i < options.size(); ++i) {
+            const unsigned short value = options[static_cast<int>(i)];
+            INSTALL_DEBUG("invokeMethod_SoftwareInstallationService: installOptions[%d]=%d", static_cast<int>(i),
+                          static_cast<int>(value));
+        }
+    }
+    unsigned int value = 2;
+    try {
+        if (target.isNullValue() || target.isNotFound())
+            fail(false, CMPI_RC_ERR_INVALID_PARAMETER, "Target argument is NULL!");
+        if (uri.isNullValue() || uri.isNotFound())
+            fail(false, CMPI_RC_ERR_INVALID_PARAMETER, "URI argument is NULL!");
+
+        CMPIObjectPath* self = ref.getEnc();
+        CMPIStatus rc = {CMPI_RC_OK, nullptr};
+        self->ft->getClassName(self, &rc);
+        if (rc.rc != CMPI_RC_OK) {
+            if (g_EnableLogError)
+                Vexlan_FC_Utils_CMPI::LogError(
+                    "Vexlan_NIC_SoftwareInstallationService: Error getting classname, status.rc=%d!",
+                    static_cast<int>(rc.rc));
+            return CmpiStatus(rc);
+        }
+        const char* nameSpace = textOf(self->ft->getNameSpace(self, &rc));
+        if (rc.rc != CMPI_RC_OK) {
+            if (g_EnableLogError)
+                Vexlan_FC_Utils_CMPI::LogError(
+                    "Vexlan_NIC_SoftwareInstallationService: Error getting namespace, status.rc=%d!",
+                    static_cast<int>(rc.rc));
+            return CmpiStatus(rc);
+        }
+
+        const CmpiObjectPath targetPath = target;
+        const std::string targetClass = targetPath.getClassName().charPtr();
+        if (strcasecmp(targetClass.c_str(), "Vexlan_FCHBA_PortController") != 0)
+            fail(false, CMPI_RC_ERR_INVALID_CLASS, "Invalid Target class name, ClassName=%s, expect %s!",
+                 targetClass.c_str(), "Vexlan_FCHBA_PortController");
+
+        CMPIObjectPath* tp = targetPath.getEnc();
+        CMPIData key = tp->ft->getKey(tp, "DeviceID", &rc);
+        if (rc.rc != CMPI_RC_OK) {
+            // A status with a message leaves the method as it came.
+            if (rc.msg != nullptr)
+                throw rc;
+            fail(false, rc.rc, "Unable to get Key data from the object class, Key=%s!", "DeviceID");
+        }
+        if (key.type != CMPI_string)
+            fail(false, CMPI_RC_ERR_INVALID_PARAMETER, "Invalid Key data type, expect %s!", "CMPI_string");
+        const char* deviceIdText = (key.state & CMPI_nullValue) ? nullptr : textOf(key.value.string);
+        const std::string deviceId = deviceIdText != nullptr ? deviceIdText : "";
+
+        const char* uriText = uri;
+        if (uriText == nullptr)
+            fail(false, CMPI_RC_ERR_INVALID_PARAMETER, "URI argument is NULL!");
+        char fileName[kFlashFileNameSize];
+        if (!FlashFileNameOfURI(uriText, fileName) || !fileExists(fileName))
+            fail(false, CMPI_RC_ERR_INVALID_PARAMETER, "Invalid or unsupported URI!");
+
+        int index = -1;
+        std::string serial = deviceId;
+        if (!IsDeviceInPortControllerList(reinterpret_cast<unsigned char*>(&serial[0]), &index))
+            fail(true, CMPI_RC_ERR_NOT_FOUND, "Device with serial number %s is not found in PortController list!",
+                 deviceId.c_str());
+        if (index < 0)
+            fail(true, CMPI_RC_ERR_NOT_FOUND, "Device with serial number %s is not found in Device list!",
+                 deviceId.c_str());
+        _tagZORAPSDMDevice* device = g_PortControllerList.entries[index].device;
+
+        InstallOptions options;
+        try {
+            options = ReadInstallOptions(in.getArg("InstallOptions"));
+        } catch (...) {
+            fail(false, CMPI_RC_ERR_FAILED, "Caught an exception while saving InstallOptions data to local buffer!");
+        }
+
+        if (!options.asynchronous) {
+            value = updateSynchronously(device, fileName, deviceId.c_str());
+        } else {
+            CmpiObjectPath jobPath(nameSpace, "Vexlan_Adapter_ConcreteJob");
+            Vexlan_CNA_Provider* provider = g_Vexlan_CNA_Provider.load();
+            if (provider != nullptr &&
+                provider->StartFCFlashUpdateThread(device, reinterpret_cast<const unsigned char*>(fileName), jobPath)) {
+                out.setArg("Job", CmpiData(jobPath));
+                value = 4096;
+            } else {
+                INSTALL_DEBUG("invokeMethod_SoftwareInstallationService: Failed to create flash update job thread");
+                value = 2;
+            }
+        }
+    } catch (const CmpiStatus& st) {
+        INSTALL_DEBUG("Vexlan_FCHBA_Provider INSTALL_FROM_URI exception: %s %s", GetCMPIErrorString(st.rc()),
+                      st.hasMsg() ? st.msg() : "");
+        value = 2;
+    }
+    ReturnMethodValue(rslt, value);
+    INSTALL_DEBUG("Exiting  invokeMethod_SoftwareInstallationService");
+    return CmpiStatus(CMPI_RC_OK);
+}

@@ -1,0 +1,234 @@
+// The flash update workers and the two start functions of the provider.
+#include "update/FlashUpdate.h"
+
+#include <pthread.h>
+#include <time.h>
+
+#include <cstdio>
+#include <cstring>
+#include <list>
+#include <mutex>
+#include <new>
+
+#include "inventory/AdapterFunc.h"
+#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "support/Vexlan_FC_Utils_CMPI.h"
+#include "update/ConcreteJob.h"
+#include "update/JobPersistence.h"
+
+namespace {
+
+#define FLASH_DEBUG(...)                                   \
+    do {                                                   \
+        if (g_EnableDebugPrint)                            \
+            Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__); \
+    } while (0)
+#define FLASH_ERROR(...)                                 \
+    do {                                                 \
+        if (g_EnableLogError)                            \
+            Vexlan_FC_Utils_CMPI::LogError(__VA_ARGS__); \
+    } while (0)
+
+// The worker threads not yet joined. A worker marks itself finished as its
+// last act; finished ones are joined when the next job starts, all of them
+// (waiting for the running ones) when the provider is cleaned up.
+struct Worker {
+    pthread_t thread;
+    bool finished;
+};
+std::mutex workersLock;
+std::list<Worker> workers;
+
+void markFinished()
+{
+    std::lock_guard<std::mutex> guard(workersLock);
+    for (Worker& w : workers)
+        if (pthread_equal(w.thread, pthread_self()))
+            w.finished = true;
+}
+
+// Joins the workers that are done (all of them with `all`, waiting for the
+// rest). Never called by a worker.
+void joinWorkers(bool all)
+{
+    std::list<Worker> toJoin;
+    {
+        std::lock_guard<std::mutex> guard(workersLock);
+        for (auto it = workers.begin(); it != workers.end();) {
+            if (all || it->finished) {
+                toJoin.push_back(*it);
+                it = workers.erase(it);
+            } else {
+                ++it;
+            }
+        }
+    }
+    for (const Worker& w : toJoin)
+        pthread_join(w.thread, nullptr);
+}
+
+// "%s %s flash update with %s at %s." of the serial, the image and the local
+// time (ctime's text without its newline), cut to the 1024 bytes of the
+// description.
+std::string jobDescription(const char* side, const std::string& serial, const unsigned char* fileName)
+{
+    time_t now = time(nullptr);
+    char when[64] = {};
+    ctime_r(&now, when);
+    const std::size_t n = std::strlen(when);
+    if (n > 0)
+        when[n - 1] = '\0';
+    char text[1024] = {};
+    std::snprintf(text, sizeof(text), "%s %s flash update with %s at %s.", serial.c_str(), side,
+                  fileName != nullptr ? reinterpret_cast<const char*>(fileName) : "", when);
+    return text;
+}
+
+// Enters the job, starts its worker, saves the jobs and names the job in
+// `jobPath`. False, with the job taken back out, when no id is free or the
+// thread can't start.
+bool startJob(Vexlan_CNA_Provider& provider, Concrete_Job& job, void* (*proc)(void*), CmpiObjectPath& jobPath)
+{
+    joinWorkers(false);
+    std::lock_guard<std::recursive_mutex> guard(jobStoreLock());
+    job.id = PickNextJobIdIn(provider.jobMap);
+    if (job.id == kNoJobId) {
+        FLASH_ERROR("Flash update refused: every job id (0 to 65534) is taken.");
+        return false;
+    }
+    job.timeOfLastStateChange = JobTimeNow();
+    auto* heapJob = new (std::nothrow) Concrete_Job(job);
+    if (heapJob == nullptr)
+        return false;
+    // The worker's own copy is complete before it starts, and the map's entry
+    // stands before the worker can reach the map (it waits for this lock).
+    provider.jobMap.insert({job.id, job});
+    pthread_t thread;
+    {
+        std::lock_guard<std::mutex> workersGuard(workersLock);
+        pthread_attr_t attr;
+        pthread_attr_init(&attr);
+        const int rc = pthread_create(&thread, &attr, proc, heapJob);
+        pthread_attr_destroy(&attr);
+        if (rc != 0) {
+            FLASH_ERROR("Error %d creating the flash update job thread", rc);
+            provider.jobMap.erase(job.id);
+            delete heapJob;
+            return false;
+        }
+        workers.push_back(Worker{thread, false});
+    }
+    provider.jobMap[job.id].threadId = thread;
+    provider.SerializeConcreteJobInfo();
+    char id[256] = {};
+    std::snprintf(id, sizeof(id), "%u", job.id);
+    jobPath.setKey("InstanceID", CmpiData(id));
+    return true;
+}
+
+// The end of a worker: the job's final state in the map (twice, the second
+// time with the end time), the flag cleared, the jobs saved, the copy freed.
+void finishJob(Concrete_Job* job, unsigned int result)
+{
+    job->status = result == 0 ? 2 : 1;
+    job->result = result;
+    gbFlashUpdateInProgress = false;
+    Vexlan_CNA_Provider* provider = g_Vexlan_CNA_Provider.load();
+    {
+        std::lock_guard<std::recursive_mutex> guard(jobStoreLock());
+        if (provider != nullptr)
+            provider->jobMap[job->id] = *job;
+        job->timeOfLastStateChange = JobTimeNow();
+        if (provider != nullptr) {
+            provider->jobMap[job->id] = *job;
+            provider->SerializeConcreteJobInfo();
+        }
+    }
+    delete job;
+    markFinished();
+}
+
+// A worker started without its job (or with the other side's) ends at once.
+bool refuseWithoutJob(Concrete_Job* job, bool nic)
+{
+    if (job != nullptr && job->isNic == nic)
+        return false;
+    FLASH_ERROR(nic ? "**** Error: Thread context not established for NIC flash update thread"
+                    : "**** Error: Thread context not established for FC flash update thread");
+    gbFlashUpdateInProgress = false;
+    markFinished();
+    return true;
+}
+
+const unsigned char* bytesOf(const std::string& s)
+{
+    return reinterpret_cast<const unsigned char*>(s.c_str());
+}
+
+}  // namespace
+
+void* FCFlashUpdateProc(void* arg)
+{
+    auto* job = static_cast<Concrete_Job*>(arg);
+    if (refuseWithoutJob(job, false))
+        return nullptr;
+    FLASH_DEBUG("FCFlashUpdateProc: Will do asynchronous update on adapter with serial number = %s, with flash file = %s.",
+                job->serialNumber.c_str(), job->imageFile.c_str());
+    const ZORAP_STATUS result = ZORAP_doOptionROMUpdate(job->device, bytesOf(job->imageFile), 0);
+    FLASH_DEBUG("FCFlashUpdateProc: ZORAP_UpdateFlash returns %u", static_cast<unsigned>(result));
+    finishJob(job, static_cast<unsigned>(result));
+    return nullptr;
+}
+
+void* NICFlashUpdateProc(void* arg)
+{
+    auto* job = static_cast<Concrete_Job*>(arg);
+    if (refuseWithoutJob(job, true))
+        return nullptr;
+    FLASH_DEBUG("NICFlashUpdateProc: Will do asynchronous update on adapter with serial number = %s, index = %u, with "
+                "flash file = %s.",
+                job->serialNumber.c_str(), job->adapterInstance, job->imageFile.c_str());
+    const ZORAP_STATUS result = ZORAP_UpdateFlash(job->adapterInstance, bytesOf(job->imageFile), 0);
+    FLASH_DEBUG("NICFlashUpdateProc: ZORAP_UpdateFlash returns %u", static_cast<unsigned>(result));
+    finishJob(job, static_cast<unsigned>(result));
+    return nullptr;
+}
+
+void WaitForFlashWorkers()
+{
+    joinWorkers(true);
+}
+
+int FlashWorkerCount()
+{
+    std::lock_guard<std::mutex> guard(workersLock);
+    return static_cast<int>(workers.size());
+}
+
+bool Vexlan_CNA_Provider::StartFCFlashUpdateThread(_tagZORAPSDMDevice* device, const unsigned char* fileName,
+                                                   CmpiObjectPath& jobPath)
+{
+    Concrete_Job job;
+    job.isNic = false;
+    job.device = device;
+    job.imageFile = fileName != nullptr ? reinterpret_cast<const char*>(fileName) : "";
+    if (device != nullptr)
+        job.serialNumber.assign(device->deviceSerial, strnlen(device->deviceSerial, sizeof(device->deviceSerial)));
+    job.description = jobDescription("FC", job.serialNumber, fileName);
+    return startJob(*this, job, FCFlashUpdateProc, jobPath);
+}
+
+bool Vexlan_CNA_Provider::StartNICFlashUpdateThread(_CNAStruc* adapter, const unsigned char* fileName,
+                                                    unsigned long long, CmpiObjectPath& jobPath)
+{
+    Concrete_Job job;
+    job.isNic = true;
+    job.adapter = adapter;
+    job.imageFile = fileName != nullptr ? reinterpret_cast<const char*>(fileName) : "";
+    if (adapter != nullptr) {
+        job.serialNumber.assign(adapter->serialNumber, strnlen(adapter->serialNumber, sizeof(adapter->serialNumber)));
+        job.adapterInstance = adapter->adapterInstance;
+    }
+    job.description = jobDescription("NIC", job.serialNumber, fileName);
+    return startJob(*this, job, NICFlashUpdateProc, jobPath);
+}

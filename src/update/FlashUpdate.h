@@ -1,0 +1,20 @@
+// The flash update workers: one thread per asynchronous update, started by
+// Vexlan_CNA_Provider::StartFCFlashUpdateThread / StartNICFlashUpdateThread.
+// A worker writes the image through the adapter library, records the job's
+// end in the job map and the job file, and ends. It calls no broker service
+// and takes no provider lock.
+#ifndef VEXLAN_UPDATE_FLASHUPDATE_H
+#define VEXLAN_UPDATE_FLASHUPDATE_H
+
+// The thread procedures; the argument is the worker's own heap copy of its
+// Concrete_Job, which the worker deletes.
+void* FCFlashUpdateProc(void* job);
+void* NICFlashUpdateProc(void* job);
+
+// Joins every worker thread, waiting for those still writing; the provider's
+// cleanup calls it first, so no worker runs once the library may go.
+void WaitForFlashWorkers();
+// Number of workers not yet joined (running or finished).
+int FlashWorkerCount();
+
+#endif
