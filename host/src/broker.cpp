@@ -320,6 +320,10 @@ CMPIrc toValue(const CMPIValue* v, CMPIType type, Value& out) {
         }
         EncArray* a = asArray(v->array);
         if (!a) return CMPI_RC_ERR_INVALID_HANDLE;
+        if (a->bytes) {
+            out = Value::byteArray(*a->bytes);
+            return CMPI_RC_OK;
+        }
         out = Value::arrayOf(a->elemType, a->elems);
         return CMPI_RC_OK;
     }
@@ -345,7 +349,7 @@ CMPIData toData(Host::Impl* core, const Value& v) {
         return d;
     }
     if (v.array) {
-        d.value.array = &newArray(core, v.type, v.elems)->enc;
+        d.value.array = v.bytes ? &newByteArray(core, v.bytes)->enc : &newArray(core, v.type, v.elems)->enc;
         return d;
     }
     switch (v.type) {
@@ -469,6 +473,13 @@ EncArray* newArray(Host::Impl* core, Type elemType, std::vector<Value> elems) {
     return o;
 }
 
+EncArray* newByteArray(Host::Impl* core, std::shared_ptr<const std::vector<std::uint8_t>> bytes) {
+    auto* o = make<EncArray>(core);
+    o->elemType = Type::UInt8;
+    o->bytes = std::move(bytes);
+    return o;
+}
+
 namespace {
 
 // ---------------------------------------------------------------- CMPIString
@@ -561,7 +572,7 @@ CMPIArray* arClone(const CMPIArray* a, CMPIStatus* rc) { return cloneOf(asArray(
 
 CMPICount arSize(const CMPIArray* a, CMPIStatus* rc) {
     EncArray* e = asArray(a);
-    return guarded<CMPICount>(rc, e, [&] { return static_cast<CMPICount>(e->elems.size()); });
+    return guarded<CMPICount>(rc, e, [&] { return static_cast<CMPICount>(e->bytes ? e->bytes->size() : e->elems.size()); });
 }
 
 CMPIType arType(const CMPIArray* a, CMPIStatus* rc) {
@@ -572,6 +583,13 @@ CMPIType arType(const CMPIArray* a, CMPIStatus* rc) {
 CMPIData arGet(const CMPIArray* a, CMPICount index, CMPIStatus* rc) {
     EncArray* e = asArray(a);
     return guarded<CMPIData>(rc, e, [&] {
+        if (e->bytes) {
+            if (index >= e->bytes->size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_badValue);
+            CMPIData d = nullData(CMPI_goodValue);
+            d.type = CMPI_uint8;
+            d.value.uint8 = (*e->bytes)[index];
+            return d;
+        }
         if (index >= e->elems.size()) return setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY), nullData(CMPI_badValue);
         CMPIData d = toData(e->core, e->elems[index]);
         d.type = static_cast<CMPIType>(e->elemType);
@@ -582,6 +600,14 @@ CMPIData arGet(const CMPIArray* a, CMPICount index, CMPIStatus* rc) {
 CMPIStatus arSet(CMPIArray* a, CMPICount index, const CMPIValue* value, CMPIType type) {
     EncArray* e = asArray(a);
     return guardedStatus(e, [&] {
+        if (e->bytes) {
+            // The provider changes an element: the array takes its elements as Values.
+            std::vector<Value> elems;
+            elems.reserve(e->bytes->size());
+            for (std::uint8_t b : *e->bytes) elems.push_back(Value::fromUnsigned(Type::UInt8, b));
+            e->elems = std::move(elems);
+            e->bytes.reset();
+        }
         if (index >= e->elems.size()) return CMPI_RC_ERR_NO_SUCH_PROPERTY;
         if (type & CMPI_ARRAY) return CMPI_RC_ERR_TYPE_MISMATCH;
         Value v;

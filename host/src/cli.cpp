@@ -163,7 +163,7 @@ Json valueJson(const Value& v) {
     if (v.null) return nullptr;
     if (v.array) {
         Json a = Json::array();
-        for (const auto& e : v.elems) a.push_back(valueJson(e));
+        for (std::size_t k = 0; k < v.arraySize(); ++k) a.push_back(valueJson(v.element(k)));
         return a;
     }
     switch (v.type) {
@@ -296,6 +296,29 @@ void printOk(Session& s) {
 
 // ---------------------------------------------------------------- arguments
 
+// A uint8 array's bytes from a file (NAME=@FILE): at most 16 MiB, the most
+// elements a CMPI array of the host may have.
+constexpr std::size_t kMaxByteFile = 16u * 1024 * 1024;
+
+bool readByteFile(const std::string& path, Value& out, std::string& error) {
+    std::ifstream in(path, std::ios::binary);
+    if (!in) {
+        error = "cannot read " + path;
+        return false;
+    }
+    std::vector<std::uint8_t> bytes;
+    char chunk[65536];
+    while (in.read(chunk, sizeof(chunk)) || in.gcount() > 0) {
+        bytes.insert(bytes.end(), chunk, chunk + in.gcount());
+        if (bytes.size() > kMaxByteFile) {
+            error = path + " has more than 16 MiB";
+            return false;
+        }
+    }
+    out = Value::byteArray(std::move(bytes));
+    return true;
+}
+
 // NAME[:TYPE]=VALUE, typed from the explicit TYPE, the declaration, or string.
 bool parseAssignment(Session& s, const std::string& text, const PropertyDecl* prop, const ParamDecl* param,
                      const std::string& ns, NamedValue& out, std::string& error) {
@@ -327,6 +350,14 @@ bool parseAssignment(Session& s, const std::string& text, const PropertyDecl* pr
         array = param->array;
     }
     Value v;
+    if (array && type == Type::UInt8 && !valueText.empty() && valueText[0] == '@') {
+        if (!readByteFile(valueText.substr(1), v, error)) {
+            error = name + ": " + error;
+            return false;
+        }
+        out = NamedValue(name, std::move(v));
+        return true;
+    }
     if (!parseValueText(valueText, type, array, v, error, &s.host.classes(), ns)) {
         error = name + ": " + error;
         return false;

@@ -65,6 +65,9 @@ struct EncArray : Obj {
     CMPIArray enc{};
     Type elemType = Type::Null;
     std::vector<Value> elems;   // null Values of elemType until set
+    // A uint8 array made from a byte array value keeps its bytes here
+    // (shared until the provider sets an element), and elems stays empty.
+    std::shared_ptr<const std::vector<std::uint8_t>> bytes;
 };
 
 struct EncInstance : Obj {
@@ -153,6 +156,7 @@ EncResult* newResult(Host::Impl* core, ResultKind kind, OpResult* sink);
 EncSelectExp* newSelectExp(Host::Impl* core, const std::string& query, const std::string& lang);
 EncDateTime* newDateTime(Host::Impl* core, const DateTime& dt);
 EncArray* newArray(Host::Impl* core, Type elemType, std::vector<Value> elems);
+EncArray* newByteArray(Host::Impl* core, std::shared_ptr<const std::vector<std::uint8_t>> bytes);
 
 // Conversions between CMPI values and host values. toValue returns a CMPI
 // rc: CMPI_RC_OK, or CMPI_RC_ERR_INVALID_DATA_TYPE for what the host cannot hold.

@@ -385,9 +385,9 @@ std::string formatValue(const Value& v) {
     if (v.null) return "NULL";
     if (v.array) {
         std::string out = "{";
-        for (size_t k = 0; k < v.elems.size(); ++k) {
+        for (size_t k = 0; k < v.arraySize(); ++k) {
             if (k) out += ", ";
-            out += formatValue(v.elems[k]);
+            out += formatValue(v.element(k));
         }
         return out + "}";
     }

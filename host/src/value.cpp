@@ -208,10 +208,30 @@ Value Value::arrayOf(Type t, std::vector<Value> elems) {
     return v;
 }
 
+Value Value::byteArray(std::vector<std::uint8_t> data) {
+    Value v;
+    v.type = Type::UInt8;
+    v.array = true;
+    v.null = false;
+    v.bytes = std::make_shared<const std::vector<std::uint8_t>>(std::move(data));
+    return v;
+}
+
+Value Value::element(std::size_t k) const {
+    if (bytes) return fromUnsigned(Type::UInt8, (*bytes)[k]);
+    return elems[k];
+}
+
 bool Value::operator==(const Value& o) const {
     if (type != o.type || array != o.array || null != o.null) return false;
     if (null) return true;
-    if (array) return elems == o.elems;
+    if (array) {
+        if (!bytes && !o.bytes) return elems == o.elems;
+        if (arraySize() != o.arraySize()) return false;
+        for (std::size_t k = 0; k < arraySize(); ++k)
+            if (!(element(k) == o.element(k))) return false;
+        return true;
+    }
     switch (type) {
         case Type::Boolean: return b == o.b;
         case Type::Char16:

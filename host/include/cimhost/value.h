@@ -79,6 +79,9 @@ struct Value {
     std::shared_ptr<ObjectPath> ref;   // reference
     std::shared_ptr<Instance> inst;    // embedded instance
     std::vector<Value> elems;          // array elements (scalars of `type`)
+    // A uint8 array may keep its elements here instead, one byte each (an
+    // image of megabytes would not fit as Values); elems is then empty.
+    std::shared_ptr<const std::vector<std::uint8_t>> bytes;
 
     static Value nullOf(Type t, bool isArray = false);
     static Value fromString(std::string v);
@@ -90,6 +93,11 @@ struct Value {
     static Value fromRef(const ObjectPath& p);
     static Value fromInstance(const Instance& i);
     static Value arrayOf(Type t, std::vector<Value> elems);
+    static Value byteArray(std::vector<std::uint8_t> bytes);
+
+    // Elements of an array value, whichever way they are kept.
+    std::size_t arraySize() const { return bytes ? bytes->size() : elems.size(); }
+    Value element(std::size_t k) const;
 
     // Type code as CMPI sees it (array flag included).
     std::uint16_t typeCode() const {
