@@ -13,6 +13,7 @@
 #ifndef ZORAP_SIM_CONTROL_H
 #define ZORAP_SIM_CONTROL_H
 
+#include <stddef.h>
 #include <stdint.h>
 
 #ifdef __cplusplus
@@ -112,6 +113,11 @@ unsigned long zorap_sim_alarms_delivered(void);
 /* The next flash write (either function) blocks durationMs and returns
  * result; later writes use the description's "flash" values again. */
 void zorap_sim_set_next_flash(uint32_t result, uint32_t durationMs);
+/* What reached the last flash write (either function) since the last
+ * zorap_sim_reset: its image argument as a file name (cut to `size`) and
+ * that file's size in bytes at the time of the write (-1 when it names no
+ * regular file). 0, or -1 when no write has been made. */
+int zorap_sim_last_flash_image(char* name, size_t size, long long* bytes);
 /* Number of flash writes that have started but not yet returned. */
 unsigned long zorap_sim_flash_writes_running(void);
 /* Wait until exactly `count` flash writes are running; 0 when that happened

@@ -241,6 +241,11 @@ public:
     std::condition_variable flashCv;
     uint64_t flashEpoch = 0;
     bool nextFlashSet = false;
+    // What reached the last flash write (under flashMu): the image argument
+    // read as a file name, and that file's size (-1 when it isn't a file).
+    bool flashImageSeen = false;
+    std::string lastFlashImage;
+    long long lastFlashBytes = -1;
     uint32_t nextFlashResult = 0, nextFlashDurationMs = 0;
     std::atomic<unsigned long> flashRunning{0};
 
@@ -545,6 +550,23 @@ public:
         main.reset();
         backup.reset();
         std::vector<std::unique_ptr<Tree>>().swap(retired);
+    }
+
+    // The image argument is a file name; it is read up to its terminator
+    // within kMaxImageName bytes, and the file's size noted for the tests.
+    void noteFlashImage(const unsigned char* image) {
+        constexpr size_t kMaxImageName = 4096;
+        const char* name = reinterpret_cast<const char*>(image);
+        const size_t n = strnlen(name, kMaxImageName);
+        std::string text(name, n);
+        struct stat st {};
+        const long long bytes = n < kMaxImageName && ::stat(text.c_str(), &st) == 0 && S_ISREG(st.st_mode)
+                                    ? static_cast<long long>(st.st_size)
+                                    : -1;
+        std::lock_guard<std::mutex> l(flashMu);
+        flashImageSeen = true;
+        lastFlashImage = std::move(text);
+        lastFlashBytes = bytes;
     }
 
     ZORAP_STATUS flashWrite(bool nic, uint32_t adapterInstance, uint32_t deviceHandle) {
@@ -1010,6 +1032,7 @@ ZORAP_EXPORT ZORAP_STATUS ZORAP_UpdateFlash(uint32_t adapterInstance, const unsi
     (void)flags;
     return zorap_sim::run(ZORAP_FN_UpdateFlash, [&](Library& L) -> ZORAP_STATUS {
         if (!image) return ZORAP_ERR_INVALID_PARAMETER;
+        L.noteFlashImage(image);
         return L.flashWrite(true, adapterInstance, 0);
     });
 }
@@ -1019,6 +1042,7 @@ ZORAP_EXPORT ZORAP_STATUS ZORAP_doOptionROMUpdate(_tagZORAPSDMDevice* device,
     (void)flags;
     return zorap_sim::run(ZORAP_FN_doOptionROMUpdate, [&](Library& L) -> ZORAP_STATUS {
         if (!device || !image) return ZORAP_ERR_INVALID_PARAMETER;
+        L.noteFlashImage(image);
         return L.flashWrite(false, 0, device->deviceHandle);
     });
 }
@@ -1189,6 +1213,19 @@ ZORAP_EXPORT void zorap_sim_set_next_flash(uint32_t result, uint32_t durationMs)
     L.nextFlashDurationMs = durationMs;
 }
 
+ZORAP_EXPORT int zorap_sim_last_flash_image(char* name, size_t size, long long* bytes) {
+    Library& L = zorap_sim::lib();
+    std::lock_guard<std::mutex> l(L.flashMu);
+    if (!L.flashImageSeen) return -1;
+    if (name && size > 0) {
+        const size_t n = std::min(size - 1, L.lastFlashImage.size());
+        std::memcpy(name, L.lastFlashImage.data(), n);
+        name[n] = '\0';
+    }
+    if (bytes) *bytes = L.lastFlashBytes;
+    return 0;
+}
+
 ZORAP_EXPORT unsigned long zorap_sim_flash_writes_running(void) {
     return zorap_sim::lib().flashRunning.load();
 }
@@ -1234,6 +1271,9 @@ ZORAP_EXPORT void zorap_sim_reset(void) {
     {
         std::lock_guard<std::mutex> l(L.flashMu);
         L.nextFlashSet = false;
+        L.flashImageSeen = false;
+        L.lastFlashImage.clear();
+        L.lastFlashBytes = -1;
     }
     {
         std::lock_guard<std::mutex> l(L.alarmMu);
