@@ -763,6 +763,16 @@ CMPIData nlGet(const C* c, const char* name, CMPIStatus* rc) {
     return guarded<CMPIData>(rc, e, [&] { return getNamed(e->core, N::list(e), name, N::missing, N::keys, rc); });
 }
 
+// getKey of a path; a key that is not there is reported with a message
+// when the host is told to (setMissingKeyMessage), as some servers do.
+CMPIData pathGetKey(const CMPIObjectPath* op, const char* name, CMPIStatus* rc) {
+    CMPIData d = nlGet<asPath>(op, name, rc);
+    EncPath* e = asPath(op);
+    if (e && rc && rc->rc == CMPI_RC_ERR_NOT_FOUND && e->core->missingKeyMessage.load())
+        rc->msg = &newString(e->core, std::string("no key ") + (name ? name : "") + " in the path")->enc;
+    return d;
+}
+
 template <auto As, class C>
 CMPIData nlGetAt(const C* c, CMPICount index, CMPIString** name, CMPIStatus* rc) {
     auto* e = As(c);
@@ -1428,7 +1438,7 @@ Tables buildTables() {
     t.pathFT.setClassName = opSetText<&ObjectPath::className>;
     t.pathFT.getClassName = opGetText<&ObjectPath::className>;
     t.pathFT.addKey = opAddKey;
-    t.pathFT.getKey = nlGet<asPath>;
+    t.pathFT.getKey = pathGetKey;
     t.pathFT.getKeyAt = nlGetAt<asPath>;
     t.pathFT.getKeyCount = nlCount<asPath>;
     t.pathFT.setNameSpaceFromObjectPath = opSetNsFrom;

@@ -294,6 +294,7 @@ Flavour Host::flavour() const { return impl_->flavour; }
 void Host::setStrict(bool on) { impl_->strict = on; }
 bool Host::strict() const { return impl_->strict; }
 void Host::setRefuseEmptyGetInstance(bool on) { impl_->refuseEmptyGetInstance = on; }
+void Host::setMissingKeyMessage(bool on) { impl_->missingKeyMessage = on; }
 void Host::setDefaultNamespace(const std::string& ns) { impl_->defaultNs = ns; }
 const std::string& Host::defaultNamespace() const { return impl_->defaultNs; }
 ClassRepository& Host::classes() { return impl_->repo; }

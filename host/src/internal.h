@@ -197,6 +197,7 @@ struct Host::Impl {
     std::atomic<Flavour> flavour{Flavour::Pegasus};
     std::atomic<bool> strict{false};
     std::atomic<bool> refuseEmptyGetInstance{false};
+    std::atomic<bool> missingKeyMessage{false};
     std::string defaultNs = "root/cimv2";
     ClassRepository repo;
     std::vector<Registration> registrations;

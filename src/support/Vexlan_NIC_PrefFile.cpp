@@ -165,7 +165,46 @@ bool lineHasKey(const std::string& line, const char* key)
     return false;
 }
 
+// The lines of the rewrite in progress on this thread, if any.
+thread_local std::vector<std::string>* t_rewrite = nullptr;
+
+// Sets `key=value` in `lines` as PrefSetProperty does.
+void setInLines(std::vector<std::string>& lines, const unsigned char* key, const unsigned char* value)
+{
+    const std::string replacement = std::string(nameText(key)) + "=" + nameText(value) + "\n";
+    bool found = false;
+    for (std::string& line : lines) {
+        if (lineHasKey(line, nameText(key))) {
+            line = replacement;
+            found = true;
+        }
+    }
+    if (!found)
+        lines.push_back(replacement);
+}
+
 }  // namespace
+
+PrefRewrite::PrefRewrite()
+{
+    if (t_rewrite == nullptr)
+        t_rewrite = new std::vector<std::string>();
+}
+
+PrefRewrite::~PrefRewrite()
+{
+    delete t_rewrite;
+    t_rewrite = nullptr;
+}
+
+bool PrefRewrite::commit()
+{
+    if (t_rewrite == nullptr)
+        return false;
+    char path[kPrefPathSize];
+    GetPrefFileFullPath(kPrefFileName, path);
+    return replaceFile(path, joined(*t_rewrite));
+}
 
 void GetPrefFileFullPath(const unsigned char* name, char* path)
 {
@@ -204,6 +243,10 @@ int PrefClosePreferenceFile(FILE* file)
 int PrefSetProperty(FILE* file, const unsigned char* key, const unsigned char* value)
 {
     const bool own = file == nullptr;
+    if (own && t_rewrite != nullptr) {
+        setInLines(*t_rewrite, key, value);
+        return 0;
+    }
     if (own) {
         file = PrefOpenPreferenceFile(kPrefFileName);
         if (file == nullptr) {
@@ -211,22 +254,13 @@ int PrefSetProperty(FILE* file, const unsigned char* key, const unsigned char* v
             return -1;
         }
     }
-    const std::string replacement = std::string(nameText(key)) + "=" + nameText(value) + "\n";
     std::vector<std::string> lines;
     int result = 0;
     if (!readLines(file, lines)) {
         PREF_ERROR("Failed to read preference file!");
         result = -1;
     }
-    bool found = false;
-    for (std::string& line : lines) {
-        if (lineHasKey(line, nameText(key))) {
-            line = replacement;
-            found = true;
-        }
-    }
-    if (!found)
-        lines.push_back(replacement);
+    setInLines(lines, key, value);
     bool written;
     if (own) {
         char path[kPrefPathSize];

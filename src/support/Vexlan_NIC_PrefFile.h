@@ -41,4 +41,18 @@ int PrefSetProperty(FILE* file, const unsigned char* key, const unsigned char* v
 // lives in a buffer of this thread until its next call.
 char* PrefGetProperty(FILE* file, const unsigned char* key);
 
+// A new version of the preference file made of many PrefSetProperty calls:
+// while it lives, PrefSetProperty with a null file on this thread changes a
+// copy in memory that starts empty, and commit() puts it in place as one new
+// file, so a reader sees the old set of lines or the new one, never a part.
+class PrefRewrite {
+public:
+    PrefRewrite();
+    ~PrefRewrite();
+    PrefRewrite(const PrefRewrite&) = delete;
+    PrefRewrite& operator=(const PrefRewrite&) = delete;
+    // False when the file could not be written (or may not be: see above).
+    bool commit();
+};
+
 #endif

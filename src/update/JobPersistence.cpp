@@ -69,9 +69,12 @@ void SerializeJobsToPrefFile(const ConcreteJobMap& jobs)
 {
     std::lock_guard<std::recursive_mutex> guard(jobStoreLock());
     JOB_DEBUG("Entering SerializeConcreteJobToPrefFile");
-    PrefClosePreferenceFile(PrefOpenPreferenceFileWriteMode(kPrefFileName));
+    // The file starts empty and takes every job's lines, and is put in place
+    // whole at the end: a reader never finds a part of the jobs.
+    PrefRewrite rewrite;
     for (const auto& entry : jobs)
         SaveConcreteJobInfo(entry.second);
+    rewrite.commit();
     JOB_DEBUG("Exiting  SerializeConcreteJobToPrefFile");
 }
 

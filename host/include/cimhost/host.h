@@ -116,6 +116,9 @@ public:
     // default; on, the host answers returnDone that way, so a test can check
     // what a provider makes of the refusal.
     void setRefuseEmptyGetInstance(bool on);
+    // getKey of a key that the path does not have reports CMPI_RC_ERR_NOT_FOUND
+    // with a message ("no key X in the path") instead of none.
+    void setMissingKeyMessage(bool on);
     void setDefaultNamespace(const std::string& ns);   // "root/cimv2" unless set
     const std::string& defaultNamespace() const;
 
