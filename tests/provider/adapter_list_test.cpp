@@ -147,7 +147,8 @@ TEST_F(AdapterList, NicFlashWritesRefuseEmptyImagesAndReportFailures)
 {
     Initialize_CNA_List();
     ASSERT_NE(m_CNAList, nullptr);
-    const unsigned char image[4] = {1, 2, 3, 4};
+    // The library reads the image argument as a terminated file name.
+    const unsigned char image[] = "/nonexistent/flash.img";
     EXPECT_EQ(UpdateCNAFlashImage(m_CNAList, image, 0), 2);
     EXPECT_EQ(UpdateCNAFlashImage(nullptr, image, 4), 2);
     EXPECT_EQ(UpdateCNAFlashImage(m_CNAList, nullptr, 4), 2);
