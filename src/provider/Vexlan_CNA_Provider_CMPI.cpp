@@ -389,41 +389,7 @@ CmpiStatus Vexlan_CNA_Provider::invokeMethod(const CmpiContext& ctx, CmpiResult&
 }
 
 // ---- Associations ---------------------------------------------------------------------
-// The association modules are routed by their own table; until they exist every
-// traversal answers nothing, with success, under provider_lock.
-
-namespace {
-CmpiStatus emptyTraversal(CmpiResult& rslt)
-{
-    ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
-    rslt.returnDone();
-    return CmpiStatus(CMPI_RC_OK);
-}
-}  // namespace
-
-CmpiStatus Vexlan_CNA_Provider::associators(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath&,
-                                            const char*, const char*, const char*, const char*, const char**)
-{
-    return emptyTraversal(rslt);
-}
-
-CmpiStatus Vexlan_CNA_Provider::associatorNames(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath&,
-                                                const char*, const char*, const char*, const char*)
-{
-    return emptyTraversal(rslt);
-}
-
-CmpiStatus Vexlan_CNA_Provider::references(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath&,
-                                           const char*, const char*, const char**)
-{
-    return emptyTraversal(rslt);
-}
-
-CmpiStatus Vexlan_CNA_Provider::referenceNames(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath&,
-                                               const char*, const char*)
-{
-    return emptyTraversal(rslt);
-}
+// The four association operations are in associations/AssocDispatch.cpp.
 
 // ---- Indications ------------------------------------------------------------------------
 // The subscription gate: one process-wide switch, on while at least one filter

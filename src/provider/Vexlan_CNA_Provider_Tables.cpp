@@ -1,11 +1,12 @@
-// The provider's tables: which module serves which class, in which order the
-// polling thread builds and removes the lists, and the modules that later work
-// builds (bound to one shared placeholder until then).
+// The provider's tables: which module serves which class, and in which order
+// the polling thread builds and removes the lists.
 //
 // The order of every table is the behaviour: a request walks the routes from
 // the top, group by group; the polling thread walks the list sequence from
 // the top (and removes in the same order).
 #include "provider/Vexlan_CNA_Provider_Tables.h"
+
+#include "associations/AssocRows.h"
 
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
 #include "classes/Vexlan_FCHBA_CIMXMLCommMech_CMPI.h"
@@ -43,25 +44,6 @@
 #include "update/JobPersistence.h"
 
 namespace {
-
-// ---- The shared placeholder -------------------------------------------------
-// What a module not built yet answers: nothing, with success.
-CmpiStatus placeholderEnumInstanceNames(const CmpiContext&, CmpiResult&, const CmpiObjectPath&)
-{
-    return CmpiStatus(CMPI_RC_OK);
-}
-CmpiStatus placeholderEnumInstances(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char**)
-{
-    return CmpiStatus(CMPI_RC_OK);
-}
-CmpiStatus placeholderGetInstance(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char**, bool)
-{
-    return CmpiStatus(CMPI_RC_OK);
-}
-void placeholderListOp() {}
-
-constexpr ClassOps kPlaceholder = {placeholderEnumInstanceNames, placeholderEnumInstances, placeholderGetInstance};
-constexpr ListOps kNoList = {placeholderListOp, placeholderListOp};
 
 // ---- Modules built -----------------------------------------------------------
 namespace ops {
@@ -119,70 +101,65 @@ constexpr ListOps StorageExtentList = {::removeStorageExtentList, ::buildStorage
 constexpr ListOps SoftwareIdentityList = {::removeSoftwareIdentityList, ::buildSoftwareIdentityList};
 }  // namespace lists
 
-// ---- Modules not built yet ---------------------------------------------------
-// Every class and association module, list and method that later work builds
-// stands here once, bound to the shared placeholder: routes answer empty with
-// success, lists build and remove nothing. When a module is written, replace
-// its line here (and only here) by its real operations, for example
-//     constexpr ClassOps FCPort = CLASS_OPS(FCPort);
-//     constexpr ListOps FCPortList = {::removeFCPortList, ::buildFCPortList};
-// and include its header above. The tables below name these constants.
+// ---- Association modules ------------------------------------------------------
+// The instance routes of the association classes, and the lists that the
+// routes marked for it rebuild: both ends' lists of the module's row.
 namespace ops {
-constexpr ClassOps AssocComputerSystemPortController = kPlaceholder;
-constexpr ClassOps AssocComputerSystemSCSIProtocolController = kPlaceholder;
-constexpr ClassOps AssocComputerSystemFCPort = kPlaceholder;
-constexpr ClassOps AssocComputerSystemLogicalPortGroup = kPlaceholder;
-constexpr ClassOps AssocComputerSystemSoftwareIdentity = kPlaceholder;
-constexpr ClassOps AssocSoftwareIdentityPortController = kPlaceholder;
-constexpr ClassOps AssocPhysicalPackagePortController = kPlaceholder;
-constexpr ClassOps AssocPhysicalConnectorFCPort = kPlaceholder;
-constexpr ClassOps AssocPhysicalPortFCPort = kPlaceholder;
-constexpr ClassOps AssocPortControllerFCPort = kPlaceholder;
-constexpr ClassOps AssocPortControllerSoftwareInstallationService = kPlaceholder;
-constexpr ClassOps AssocLogicalPortGroupFCPort = kPlaceholder;
-constexpr ClassOps AssocFCPortFCPortStatistics = kPlaceholder;
-constexpr ClassOps AssocProductPhysicalPackage = kPlaceholder;
-constexpr ClassOps AssocSCSIProtocolControllerFCPort = kPlaceholder;
-constexpr ClassOps AssocComputerSystemObjectManager = kPlaceholder;
-constexpr ClassOps AssocObjectManagerCommMech = kPlaceholder;
-constexpr ClassOps AssocComputerSystemCommMech = kPlaceholder;
-constexpr ClassOps AssocObjectManagerNamespace = kPlaceholder;
-constexpr ClassOps AssocPhysicalPackagePhysicalConnector = kPlaceholder;
-constexpr ClassOps AssocPhysicalPackagePhysicalPort = kPlaceholder;
-constexpr ClassOps AssocSoftwareIdentitySoftwareInstallationService = kPlaceholder;
-constexpr ClassOps AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities = kPlaceholder;
-constexpr ClassOps AssocComputerSystemSoftwareInstallationService = kPlaceholder;
-constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointHBA = kPlaceholder;
-constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointTarget = kPlaceholder;
-constexpr ClassOps AssocComputerSystemStorageExtent = kPlaceholder;
-constexpr ClassOps AssocFCPortSCSIProtocolEndpointHBA = kPlaceholder;
-constexpr ClassOps Nic_AssocComputerSystemPortController = kPlaceholder;
-constexpr ClassOps AssocComputerSystemEthernetPort = kPlaceholder;
-constexpr ClassOps AssocPortControllerEthernetPort = kPlaceholder;
-constexpr ClassOps AssocPhysicalConnectorEthernetPort = kPlaceholder;
-constexpr ClassOps AssocPhysicalPortEthernetPort = kPlaceholder;
-constexpr ClassOps Nic_AssocPhysicalPackagePortController = kPlaceholder;
-constexpr ClassOps AssocEthernetPortLANEndPoint = kPlaceholder;
-constexpr ClassOps AssocComputerSystemLANEndPoint = kPlaceholder;
-constexpr ClassOps AssocElementConformsToRegisteredProfile = kPlaceholder;
-constexpr ClassOps Nic_AssocSoftwareIdentityPortController = kPlaceholder;
-constexpr ClassOps AssocComputerSystemNetworkPort = kPlaceholder;
-constexpr ClassOps AssocNetworkPortLANEndPoint = kPlaceholder;
-constexpr ClassOps AssocIPProtocolEndPointCapabilitiesIPProtocolEndPoint = kPlaceholder;
-constexpr ClassOps Nic_AssocComputerSystemSoftwareInstallationService = kPlaceholder;
-constexpr ClassOps Nic_AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities = kPlaceholder;
-constexpr ClassOps Nic_AssocSoftwareIdentitySoftwareInstallationService = kPlaceholder;
-constexpr ClassOps Nic_AssocPortControllerSoftwareInstallationService = kPlaceholder;
-constexpr ClassOps AssocComputerSystemIPProtocolEndPoint = kPlaceholder;
-constexpr ClassOps AssocLANEndPointIPProtocolEndPoint = kPlaceholder;
-constexpr ClassOps Nic_AssocComputerSystemSoftwareIdentity = kPlaceholder;
+constexpr ClassOps AssocComputerSystemPortController = ASSOC_CLASS_OPS(kAssocComputerSystemPortController);
+constexpr ClassOps AssocComputerSystemSCSIProtocolController = ASSOC_CLASS_OPS(kAssocComputerSystemSCSIProtocolController);
+constexpr ClassOps AssocComputerSystemFCPort = ASSOC_CLASS_OPS(kAssocComputerSystemFCPort);
+constexpr ClassOps AssocComputerSystemLogicalPortGroup = ASSOC_CLASS_OPS(kAssocComputerSystemLogicalPortGroup);
+constexpr ClassOps AssocComputerSystemSoftwareIdentity = ASSOC_CLASS_OPS(kAssocComputerSystemSoftwareIdentity);
+constexpr ClassOps AssocSoftwareIdentityPortController = ASSOC_CLASS_OPS(kAssocSoftwareIdentityPortController);
+constexpr ClassOps AssocPhysicalPackagePortController = ASSOC_CLASS_OPS(kAssocPhysicalPackagePortController);
+constexpr ClassOps AssocPhysicalConnectorFCPort = ASSOC_CLASS_OPS(kAssocPhysicalConnectorFCPort);
+constexpr ClassOps AssocPhysicalPortFCPort = ASSOC_CLASS_OPS(kAssocPhysicalPortFCPort);
+constexpr ClassOps AssocPortControllerFCPort = ASSOC_CLASS_OPS(kAssocPortControllerFCPort);
+constexpr ClassOps AssocPortControllerSoftwareInstallationService = ASSOC_CLASS_OPS(kAssocPortControllerSoftwareInstallationService);
+constexpr ClassOps AssocLogicalPortGroupFCPort = ASSOC_CLASS_OPS(kAssocLogicalPortGroupFCPort);
+constexpr ClassOps AssocFCPortFCPortStatistics = ASSOC_CLASS_OPS(kAssocFCPortFCPortStatistics);
+constexpr ClassOps AssocProductPhysicalPackage = ASSOC_CLASS_OPS(kAssocProductPhysicalPackage);
+constexpr ClassOps AssocSCSIProtocolControllerFCPort = ASSOC_CLASS_OPS(kAssocSCSIProtocolControllerFCPort);
+constexpr ClassOps AssocComputerSystemObjectManager = ASSOC_CLASS_OPS(kAssocComputerSystemObjectManager);
+constexpr ClassOps AssocObjectManagerCommMech = ASSOC_CLASS_OPS(kAssocObjectManagerCommMech);
+constexpr ClassOps AssocComputerSystemCommMech = ASSOC_CLASS_OPS(kAssocComputerSystemCommMech);
+constexpr ClassOps AssocObjectManagerNamespace = ASSOC_CLASS_OPS(kAssocObjectManagerNamespace);
+constexpr ClassOps AssocPhysicalPackagePhysicalConnector = ASSOC_CLASS_OPS(kAssocPhysicalPackagePhysicalConnector);
+constexpr ClassOps AssocPhysicalPackagePhysicalPort = ASSOC_CLASS_OPS(kAssocPhysicalPackagePhysicalPort);
+constexpr ClassOps AssocSoftwareIdentitySoftwareInstallationService = ASSOC_CLASS_OPS(kAssocSoftwareIdentitySoftwareInstallationService);
+constexpr ClassOps AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities = ASSOC_CLASS_OPS(kAssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities);
+constexpr ClassOps AssocComputerSystemSoftwareInstallationService = ASSOC_CLASS_OPS(kAssocComputerSystemSoftwareInstallationService);
+constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointHBA = ASSOC_CLASS_OPS(kAssocComputerSystemSCSIProtocolEndpointHBA);
+constexpr ClassOps AssocComputerSystemSCSIProtocolEndpointTarget = ASSOC_CLASS_OPS(kAssocComputerSystemSCSIProtocolEndpointTarget);
+constexpr ClassOps AssocComputerSystemStorageExtent = ASSOC_CLASS_OPS(kAssocComputerSystemStorageExtent);
+constexpr ClassOps AssocFCPortSCSIProtocolEndpointHBA = ASSOC_CLASS_OPS(kAssocFCPortSCSIProtocolEndpointHBA);
+constexpr ClassOps Nic_AssocComputerSystemPortController = ASSOC_CLASS_OPS(kNic_AssocComputerSystemPortController);
+constexpr ClassOps AssocComputerSystemEthernetPort = ASSOC_CLASS_OPS(kAssocComputerSystemEthernetPort);
+constexpr ClassOps AssocPortControllerEthernetPort = ASSOC_CLASS_OPS(kAssocPortControllerEthernetPort);
+constexpr ClassOps AssocPhysicalConnectorEthernetPort = ASSOC_CLASS_OPS(kAssocPhysicalConnectorEthernetPort);
+constexpr ClassOps AssocPhysicalPortEthernetPort = ASSOC_CLASS_OPS(kAssocPhysicalPortEthernetPort);
+constexpr ClassOps Nic_AssocPhysicalPackagePortController = ASSOC_CLASS_OPS(kNic_AssocPhysicalPackagePortController);
+constexpr ClassOps AssocEthernetPortLANEndPoint = ASSOC_CLASS_OPS(kAssocEthernetPortLANEndPoint);
+constexpr ClassOps AssocComputerSystemLANEndPoint = ASSOC_CLASS_OPS(kAssocComputerSystemLANEndPoint);
+constexpr ClassOps AssocElementConformsToRegisteredProfile = ASSOC_CLASS_OPS(kAssocElementConformsToRegisteredProfile);
+constexpr ClassOps Nic_AssocSoftwareIdentityPortController = ASSOC_CLASS_OPS(kNic_AssocSoftwareIdentityPortController);
+constexpr ClassOps AssocComputerSystemNetworkPort = ASSOC_CLASS_OPS(kAssocComputerSystemNetworkPort);
+constexpr ClassOps AssocNetworkPortLANEndPoint = ASSOC_CLASS_OPS(kAssocNetworkPortLANEndPoint);
+constexpr ClassOps AssocIPProtocolEndPointCapabilitiesIPProtocolEndPoint = ASSOC_CLASS_OPS(kAssocIPProtocolEndPointCapabilitiesIPProtocolEndPoint);
+constexpr ClassOps Nic_AssocComputerSystemSoftwareInstallationService = ASSOC_CLASS_OPS(kNic_AssocComputerSystemSoftwareInstallationService);
+constexpr ClassOps Nic_AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities = ASSOC_CLASS_OPS(kNic_AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities);
+constexpr ClassOps Nic_AssocSoftwareIdentitySoftwareInstallationService = ASSOC_CLASS_OPS(kNic_AssocSoftwareIdentitySoftwareInstallationService);
+constexpr ClassOps Nic_AssocPortControllerSoftwareInstallationService = ASSOC_CLASS_OPS(kNic_AssocPortControllerSoftwareInstallationService);
+constexpr ClassOps AssocComputerSystemIPProtocolEndPoint = ASSOC_CLASS_OPS(kAssocComputerSystemIPProtocolEndPoint);
+constexpr ClassOps AssocLANEndPointIPProtocolEndPoint = ASSOC_CLASS_OPS(kAssocLANEndPointIPProtocolEndPoint);
+constexpr ClassOps Nic_AssocComputerSystemSoftwareIdentity = ASSOC_CLASS_OPS(kNic_AssocComputerSystemSoftwareIdentity);
 }  // namespace ops
 
 namespace lists {
-constexpr ListOps AssocFCPortFCPortStatistics = kNoList;
-constexpr ListOps AssocComputerSystemSCSIProtocolEndpointTarget = kNoList;
-constexpr ListOps AssocComputerSystemStorageExtent = kNoList;
-constexpr ListOps AssocFCPortSCSIProtocolEndpointHBA = kNoList;
+constexpr ListOps AssocFCPortFCPortStatistics = ASSOC_LIST_OPS(kAssocFCPortFCPortStatistics);
+constexpr ListOps AssocComputerSystemSCSIProtocolEndpointTarget = ASSOC_LIST_OPS(kAssocComputerSystemSCSIProtocolEndpointTarget);
+constexpr ListOps AssocComputerSystemStorageExtent = ASSOC_LIST_OPS(kAssocComputerSystemStorageExtent);
+constexpr ListOps AssocFCPortSCSIProtocolEndpointHBA = ASSOC_LIST_OPS(kAssocFCPortSCSIProtocolEndpointHBA);
 }  // namespace lists
 
 
@@ -342,7 +319,3 @@ const ListSequenceRow* listSequence(std::size_t& count)
     return kListSequence;
 }
 
-bool isPlaceholder(const ClassOps& ops)
-{
-    return ops.enumInstances == kPlaceholder.enumInstances;
-}

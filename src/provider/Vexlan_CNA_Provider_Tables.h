@@ -90,7 +90,5 @@ const MethodRoute* methodRoutes(std::size_t& count);
 const ListSequenceRow* listSequence(std::size_t& count);
 extern const PollingSteps kPollingSteps;
 
-// True when `ops` is the shared placeholder of a module not built yet.
-bool isPlaceholder(const ClassOps& ops);
 
 #endif

@@ -603,7 +603,9 @@ CmpiProviderBase g_base;
 std::mutex g_factoryMutex;
 
 // The first factory call makes and initialises the provider; every call
-// hands out the same object and counts once.
+// hands out the same object. Each MI structure counts once per life, as a
+// server may call a factory for every class it serves but cleans each MI up
+// once.
 template <class MI, class FT>
 MI* create(MI& mi, FT* ft, const CMPIBroker* mb, const CMPIContext* ctx, CMPIStatus* rc)
 {
@@ -627,7 +629,7 @@ MI* create(MI& mi, FT* ft, const CMPIBroker* mb, const CMPIContext* ctx, CMPISta
             g_base.setBaseMI(base);
         }
         mi.hdl = base;
-        g_base.incUseCount();
+        g_base.attachMI(&mi);
         if (rc != nullptr)
             *rc = CmpiStatus(CMPI_RC_OK).status(mb);
         return &mi;
