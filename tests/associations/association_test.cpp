@@ -237,6 +237,18 @@ TEST_F(Associations, AClassOutsideTheTableHasNoAssociatorsAndNothingFails)
     expectClean(r, "referenceNames of a job");
     EXPECT_TRUE(r.paths.empty());
 
+    // The two classes of the lookup table that no test of the chain names:
+    // the gate opens, nothing runs.
+    r = host().associatorNames(firstOf(host(), "Vexlan_FCHBA_ObjectManager"),
+                               assoc("Vexlan_FCHBA_RegisteredProfileObjectManager"));
+    expectClean(r, "profile of the object manager");
+    EXPECT_TRUE(r.paths.empty());
+    EXPECT_GT(countLog("Class Vexlan_FCHBA_ObjectManager has associators"), 0);
+    r = host().referenceNames(firstOf(host(), "Vexlan_Adapter_ComputerSystem"),
+                              result("Vexlan_NIC_ComputerSystemRemoteServiceAccessPoint"));
+    expectClean(r, "remote service access point");
+    EXPECT_TRUE(r.paths.empty());
+
     // An association class that doesn't stand at the source closes the gate.
     r = host().associatorNames(firstOf(host(), "Vexlan_Adapter_Product"), assoc("Vexlan_FCHBA_ComputerSystemFCPort"));
     expectClean(r, "gate");
