@@ -98,6 +98,7 @@ public:
     // Used by the engine.
     bool readNameSpace();
     const CmpiStatus& status() const { return status_; }
+    FuncType funcType() const { return funcType_; }
     const char* nameSpace() const { return nameSpace_.c_str(); }
 
 private:

@@ -308,6 +308,7 @@ bool controllerOfPackage(AssocRequest& rq)
 bool packageOfController(AssocRequest& rq)
 {
     constexpr const char* head = "Assoc_PhysicalPackagePortController:findMatchedRole1InstancesOrReferences()";
+    NIC_ASSOC_DEBUG("%s called with ftype = %d", head, static_cast<int>(rq.funcType()));
     READ_KEY(rq, "DeviceID", deviceId);
     return eachAdapter([&](_CNAStruc* a) {
         NIC_ASSOC_DEBUG("%s Before calcDeviceID_PortController", head);
@@ -316,6 +317,13 @@ bool packageOfController(AssocRequest& rq)
         NIC_ASSOC_DEBUG("%s deviceId = %s", head, deviceId.c_str());
         if (!same(id, deviceId))
             return true;
+        static const char* const kBranches[] = {
+            "FUNC_ASSOC calling makeInstance_Nic_PhysicalPackage",
+            "FUNC_ASSOCNAME calling makePath_Nic_PhysicalPackage",
+            "FUNC_REF calling makePath_Nic_PhysicalPackage",
+            "FUNC_REFNAME calling makePath_Nic_PhysicalPackage",
+        };
+        NIC_ASSOC_DEBUG("%s %s", head, kBranches[rq.funcType()]);
         return rq.partner(adapterItem(a));
     });
 }
