@@ -126,11 +126,11 @@ struct Source {
     std::string text;  // Text
 };
 
-// The default description: the environment variable, or the file beside
-// this library.
-std::string defaultPath() {
-    const char* env = std::getenv(ZORAP_SIM_ENV);
-    if (env && *env) return env;
+// The description file beside this library, found once when the library is
+// loaded. dladdr takes the loader's lock, and an unload that stops the alarm
+// thread holds that lock while it waits for the thread: the alarm thread must
+// never be the one to look the path up.
+std::string fileBesideThisLibrary() {
     Dl_info info{};
     if (dladdr(reinterpret_cast<void*>(&stampOf), &info) != 0 && info.dli_fname) {
         std::string lib = info.dli_fname;
@@ -139,6 +139,15 @@ std::string defaultPath() {
                ZORAP_SIM_DEFAULT_FILE;
     }
     return ZORAP_SIM_DEFAULT_FILE;
+}
+const std::string kFileBesideThisLibrary = fileBesideThisLibrary();
+
+// The default description: the environment variable, or the file beside
+// this library.
+std::string defaultPath() {
+    const char* env = std::getenv(ZORAP_SIM_ENV);
+    if (env && *env) return env;
+    return kFileBesideThisLibrary;
 }
 
 struct Loaded {
