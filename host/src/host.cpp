@@ -257,7 +257,11 @@ void Host::Impl::deliver(const std::string& ns, Instance inst, bool serverThread
     {
         std::lock_guard<std::mutex> g(indLock);
         for (const auto& f : filters) {
-            if (namesEqual(f.sourceNs, target) && repo.isA(ind.instance.className(), f.fromClass)) {
+            // sfcb hands an indication to every filter active on the provider
+            // whose class it is, and looks at no namespace; OpenPegasus also
+            // wants the filter's source namespace.
+            const bool nsMatches = flavour == Flavour::Sfcb || namesEqual(f.sourceNs, target);
+            if (nsMatches && repo.isA(ind.instance.className(), f.fromClass)) {
                 matched = true;
                 break;
             }

@@ -418,9 +418,11 @@ TEST(DescriptionFile, ARewrittenFileSendsTheFCAlertAndTheLinkAlertWithoutARebuil
     {
         Host host;
         start(host, Flavour::Sfcb, description(), file);
-        // sfcb matches filters by the namespace the provider delivers to.
-        int status = subscribe(host, kStatusClass, "root/PG_InterOp");
-        int down = subscribe(host, kLinkDownClass, "root/PG_InterOp");
+        // As in sfcb, the filters name the namespace of the indication
+        // classes, and the provider delivers to root/PG_InterOp: sfcb matches
+        // by class only.
+        int status = subscribe(host, kStatusClass, "root/vexlan_cmpi");
+        int down = subscribe(host, kLinkDownClass, "root/vexlan_cmpi");
         EXPECT_EQ(countLog("Entering Vexlan_CNA_Provider authorizeFilter"), 2);
         EXPECT_EQ(countLog("Entering Vexlan_CNA_Provider mustPoll"), 2);
         const int rebuilds = countLog("gNeedRefresh flag is ON");

@@ -71,8 +71,9 @@ struct AssocParams {
     std::string resultRole;    // associators, associatorNames
 };
 
-// One delivered indication. `nameSpace` is the namespace the flavour matched
-// filters with; `deliveredTo` the namespace argument of deliverIndication.
+// One delivered indication. `nameSpace` is the namespace the server gives it
+// (OpenPegasus matches filters by it; sfcb matches by class only);
+// `deliveredTo` the namespace argument of deliverIndication.
 // `error` is set when strict checking failed.
 struct Indication {
     std::string nameSpace;
