@@ -227,20 +227,32 @@ protected:
     static inline fs::path* root_ = nullptr;
 };
 
-TEST_F(SysfsChangingHost, ALinkGoingDownIsNoConfigurationChangeButReachesTheLinkWatchInput)
+TEST_F(SysfsChangingHost, ALinkGoingDownIsNoConfigurationChangeButSendsLinkDown)
 {
     const int rebuilds = countLog("gNeedRefresh flag is ON");
     const unsigned long backups = zorap_sim_call_count(ZORAP_FN_UpdateBackupAdapterList);
+    int filter = 0;
+    ASSERT_TRUE(host_->activateFilter("SELECT * FROM Vexlan_NIC_IndicationEthernetPortLinkDown", "root/vexlan_cmpi",
+                                      filter)
+                    .ok());
     write("sys/class/net/vxnic0/operstate", "down\n");
     write("sys/class/net/vxnic0/carrier", "0\n");
     write("sys/class/fc_host/host3/port_state", "Linkdown\n");
+
+    // The link watch reads the interface afresh and tells the subscriber.
+    bool linkDown = false;
+    cimhost::Indication ind;
+    while (!linkDown && host_->waitIndication(ind, seconds(10)))
+        linkDown = ind.instance.className() == "Vexlan_NIC_IndicationEthernetPortLinkDown";
+    EXPECT_TRUE(linkDown) << "no LinkDown indication within 10 s";
+    EXPECT_TRUE(host_->deactivateFilter(filter).ok());
+
     ASSERT_TRUE(waitForPolls(3));
     EXPECT_EQ(countLog("gNeedRefresh flag is ON"), rebuilds);
     EXPECT_EQ(zorap_sim_call_count(ZORAP_FN_UpdateBackupAdapterList), backups);
 
-    // What the link watch reads for the interface the provider's NIC list
-    // holds: the link is down. (The LinkDown indication and the port's new
-    // status follow from there once the link watch sends them.)
+    // What the link watch read for the interface the provider's NIC list
+    // holds, and the FC port's live state: both down.
     _zorap_link_properties_t link{};
     ASSERT_EQ(ZORAP_GetLinkProperties("vxnic0", &link), ZORAP_OK);
     EXPECT_EQ(link.linkState, ZORAP_LINK_DOWN);
