@@ -14,7 +14,8 @@
 #include "zorap_sim_control.h"
 
 #if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
-#include <sanitizer/allocator_interface.h>
+// The sanitizer's allocator replaces malloc; its runtime tells the heap in use.
+extern "C" std::size_t __sanitizer_get_current_allocated_bytes(void);
 #define RELTEST_SANITIZER_HEAP 1
 #endif
 

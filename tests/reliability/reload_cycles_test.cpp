@@ -45,8 +45,9 @@ TEST_P(ReloadCycles, UnloadsWithRequestsASubscriptionAndAJobInFlightLeaveNothing
     int fdsAfterFirst = 0;
     std::size_t heapAfterFirst = 0;
     for (int cycle = 0; cycle < cycles; ++cycle) {
-        if (cycle > 0)
+        if (cycle > 0) {
             ASSERT_TRUE(host.load(PROVIDER_LIBRARY, kProviderName).ok()) << "cycle " << cycle;
+        }
         ASSERT_TRUE(host.enumerateInstanceNames(classPath("Vexlan_Adapter_ComputerSystem")).ok()) << cycle;
         int filter = 0;
         ASSERT_TRUE(host.activateFilter("SELECT * FROM VexlanCNA_AlertIndication_AdapterStatusChange", kNamespace,
@@ -99,6 +100,6 @@ TEST_P(ReloadCycles, UnloadsWithRequestsASubscriptionAndAJobInFlightLeaveNothing
 }
 
 INSTANTIATE_TEST_SUITE_P(Flavours, ReloadCycles, ::testing::Values(Flavour::Pegasus, Flavour::Sfcb),
-                         [](const ::testing::TestParamInfo<Flavour>& info) {
-                             return std::string(cimhost::flavourName(info.param));
+                         [](const ::testing::TestParamInfo<Flavour>& flavour) {
+                             return std::string(cimhost::flavourName(flavour.param));
                          });
