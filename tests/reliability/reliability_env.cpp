@@ -185,7 +185,7 @@ ObjectPath servicePath(bool nic)
 
 }  // namespace
 
-Job startFlashJob(Host& host, bool nic, std::uint32_t durationMs)
+Job startFlashJob(Host& host, bool nic, std::uint32_t durationMs, std::uint32_t result)
 {
     const std::string image = "/var/tmp/reliability-image.bin";
     {
@@ -199,7 +199,7 @@ Job startFlashJob(Host& host, bool nic, std::uint32_t durationMs)
     std::vector<cimhost::NamedValue> in = {{"URI", Value::fromString(image)},
                                            {"Target", Value::fromRef(target)},
                                            {"InstallOptions", Value::arrayOf(cimhost::Type::UInt16, options)}};
-    zorap_sim_set_next_flash(0, durationMs);
+    zorap_sim_set_next_flash(result, durationMs);
     const OpResult r = host.invokeMethod(servicePath(nic), "InstallFromURI", in);
     Job job;
     job.value = r.data.empty() ? 0xDEAD : r.data[0].u;

@@ -61,13 +61,15 @@ int requestEveryKind(cimhost::Host& host, const std::string& cls, bool associati
                      std::vector<std::string>& problems);
 
 // A flash job of the FC HBA (or the CNA's NIC functions) from an image file
-// under /var/tmp; the library's write takes `durationMs`. The method's
-// return value (4096: the job started) and the job's path.
+// under /var/tmp; the library's write takes `durationMs` and returns
+// `result` (a successful write changes the adapter's versions, which counts
+// as a configuration change). The method's return value (4096: the job
+// started) and the job's path.
 struct Job {
     std::uint64_t value = 0;
     cimhost::ObjectPath path;
 };
-Job startFlashJob(cimhost::Host& host, bool nic, std::uint32_t durationMs);
+Job startFlashJob(cimhost::Host& host, bool nic, std::uint32_t durationMs, std::uint32_t result = 0);
 // The job's JobState (7 completed, 10 exception), 0 when it can't be read.
 std::uint64_t jobState(cimhost::Host& host, const Job& job);
 // Waits until the job has ended (a state other than 4, running); its state.
