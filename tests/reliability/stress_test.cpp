@@ -10,6 +10,7 @@
 #include <atomic>
 #include <chrono>
 #include <condition_variable>
+#include <cstdio>
 #include <mutex>
 #include <set>
 #include <string>
@@ -257,6 +258,9 @@ TEST(Stress, EveryRequestBesideRebuildsAlarmsLinksSubscriptionsAndJobsThenAClean
 
     for (const std::string& p : problems)
         ADD_FAILURE() << p;
+    std::printf("stress: %d s, %ld requests, %d quiet points, %d jobs, %lu rebuilds, %d indications\n",
+                static_cast<int>(runTime.count()), requests.load(), quietPoints, jobsStarted.load(),
+                zorap_sim_call_count(ZORAP_FN_SwapBackupToMainAdapterList), indications);
     EXPECT_GE(quietPoints, 1);
     EXPECT_GT(requests.load(), 100);
     EXPECT_GE(jobsStarted.load(), 1);
