@@ -78,18 +78,6 @@ std::string caseName(int fn, const Mode& mode)
     return std::string(zorap_sim_function_name(fn)) + " failing at " + mode.name;
 }
 
-bool settled()
-{
-    const unsigned long start = zorap_sim_call_count(ZORAP_FN_DidConfigChange);
-    const auto until = std::chrono::steady_clock::now() + seconds(60);
-    while (zorap_sim_call_count(ZORAP_FN_DidConfigChange) < start + 2) {
-        if (std::chrono::steady_clock::now() > until)
-            return false;
-        std::this_thread::sleep_for(milliseconds(50));
-    }
-    return true;
-}
-
 // One request-time step: every request kind on one class, an alarm with a
 // subscription, or a flash job. Problems are added to the list.
 struct Step {
@@ -189,7 +177,7 @@ TEST_F(FaultTable, EachFunctionFailingDuringEachRequestKind)
     Host host;
     start(host);
     const Classes classes = providerClasses(host);
-    ASSERT_TRUE(settled());
+    ASSERT_TRUE(pollsSettled());
     const Counts healthy = countAll(host, classes);
     // Which steps call which function, with a working library.
     const std::vector<Step> steps = requestSteps(classes);
@@ -277,13 +265,13 @@ TEST_F(FaultTable, EachFunctionFailingDuringARebuild)
     Host host;
     start(host);
     const Classes classes = providerClasses(host);
-    ASSERT_TRUE(settled());
+    ASSERT_TRUE(pollsSettled());
     const Counts countsA = countAll(host, classes);
     bool useB = true;
     Counts countsB;
     const auto called = calledBy([&] {
         replaceFile(kFile, configB_);
-        ASSERT_TRUE(settled());
+        ASSERT_TRUE(pollsSettled());
         countsB = countAll(host, classes);
     });
     std::vector<int> covered;
@@ -296,13 +284,13 @@ TEST_F(FaultTable, EachFunctionFailingDuringARebuild)
         useB = !useB;
         ASSERT_EQ(0, zorap_sim_fail_call(fn, ZORAP_ERR_FAILED, mode.callNumber, mode.times));
         replaceFile(kFile, useB ? configB_ : configA_);
-        ASSERT_TRUE(settled()) << name;
+        ASSERT_TRUE(pollsSettled()) << name;
         runSteps(host, requestSteps(classes), name);
         zorap_sim_fail(fn, 0, 0);
         // The next rebuild with a working library gives the full lists.
         useB = !useB;
         replaceFile(kFile, useB ? configB_ : configA_);
-        ASSERT_TRUE(settled()) << name;
+        ASSERT_TRUE(pollsSettled()) << name;
         for (const std::string& d : countDifferences(countAll(host, classes), useB ? countsB : countsA))
             ADD_FAILURE() << name << ", then working: " << d;
     }

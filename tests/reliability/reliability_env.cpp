@@ -95,6 +95,18 @@ void replaceFile(const std::string& path, const std::string& text)
     std::rename(temporary.c_str(), path.c_str());
 }
 
+bool pollsSettled()
+{
+    const unsigned long start = zorap_sim_call_count(ZORAP_FN_DidConfigChange);
+    const auto until = std::chrono::steady_clock::now() + std::chrono::seconds(60);
+    while (zorap_sim_call_count(ZORAP_FN_DidConfigChange) < start + 2) {
+        if (std::chrono::steady_clock::now() > until)
+            return false;
+        std::this_thread::sleep_for(std::chrono::milliseconds(50));
+    }
+    return true;
+}
+
 Classes providerClasses(Host& host)
 {
     Classes out;

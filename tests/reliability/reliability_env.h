@@ -38,6 +38,11 @@ std::string withoutLastAdapter(const std::string& text);
 // that the library never reads half of it.
 void replaceFile(const std::string& path, const std::string& text);
 
+// Waits until two polls have started after now: the first one has seen any
+// change of the description written before, and the second starts only when
+// the first (and its rebuild) is over. False when that takes over 60 s.
+bool pollsSettled();
+
 // Classes of the model that the provider serves, instances and associations.
 struct Classes {
     std::vector<std::string> instances;

@@ -35,21 +35,6 @@ const char* const kAlertClasses[] = {"VexlanCNA_AlertIndication_AdapterStatusCha
                                      "Vexlan_NIC_IndicationEthernetPortLinkUp",
                                      "Vexlan_NIC_IndicationEthernetPortLinkDown"};
 
-// Waits until two polls have started after now: the first one has seen any
-// change of the description written before, and the second starts only when
-// the first (and its rebuild) is over.
-bool pollsSettled()
-{
-    const unsigned long start = zorap_sim_call_count(ZORAP_FN_DidConfigChange);
-    const auto until = std::chrono::steady_clock::now() + seconds(60);
-    while (zorap_sim_call_count(ZORAP_FN_DidConfigChange) < start + 2) {
-        if (std::chrono::steady_clock::now() > until)
-            return false;
-        std::this_thread::sleep_for(milliseconds(50));
-    }
-    return true;
-}
-
 // Holds the threads that change things at a quiet point, and lets them go.
 class Pauser {
 public:
