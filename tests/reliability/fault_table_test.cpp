@@ -64,6 +64,12 @@ std::array<bool, ZORAP_FN_COUNT> calledBy(const std::function<void()>& step)
     return called;
 }
 
+// Log lines of a build, a poll or a request that an exception ended.
+int exceptionLines()
+{
+    return countLog("detected an exception") + countLog("detected an unknown exception");
+}
+
 // Names the functions that a phase made fail, for the test's output.
 void printCovered(const char* phase, const std::vector<int>& functions)
 {
@@ -195,9 +201,11 @@ TEST_F(FaultTable, EachFunctionFailingDuringEachRequestKind)
         covered.push_back(fn);
         for (const Mode& mode : kModes) {
             const std::string name = caseName(fn, mode);
+            const int exceptions = exceptionLines();
             ASSERT_EQ(0, zorap_sim_fail_call(fn, ZORAP_ERR_FAILED, mode.callNumber, mode.times));
             runSteps(host, callers, name);
             zorap_sim_fail(fn, 0, 0);
+            EXPECT_EQ(exceptionLines(), exceptions) << name;
             // The same requests (and an alarm, which rebuilds the FC port
             // list) with the library working again give every list in full.
             callers.push_back({"alarm", alarmStep});
@@ -236,10 +244,12 @@ TEST_F(FaultTable, EachFunctionFailingDuringTheFirstBuildAndTheUnload)
             const std::string name = caseName(fn, mode);
             ASSERT_EQ(0, zorap_sim_fail_call(fn, ZORAP_ERR_FAILED, mode.callNumber, mode.times));
             {
+                removeLog();
                 Host host;
                 start(host);
                 runSteps(host, requestSteps(classes), name);
                 EXPECT_TRUE(host.unload(true).ok()) << name;
+                EXPECT_EQ(exceptionLines(), 0) << name;
             }
             zorap_sim_fail(fn, 0, 0);
             // A failed shutdown leaves the library's own alarm thread; the
@@ -282,11 +292,13 @@ TEST_F(FaultTable, EachFunctionFailingDuringARebuild)
         const Mode& mode = kModes[0];
         const std::string name = caseName(fn, mode) + " in a rebuild";
         useB = !useB;
+        const int exceptions = exceptionLines();
         ASSERT_EQ(0, zorap_sim_fail_call(fn, ZORAP_ERR_FAILED, mode.callNumber, mode.times));
         replaceFile(kFile, useB ? configB_ : configA_);
         ASSERT_TRUE(pollsSettled()) << name;
         runSteps(host, requestSteps(classes), name);
         zorap_sim_fail(fn, 0, 0);
+        EXPECT_EQ(exceptionLines(), exceptions) << name;
         // The next rebuild with a working library gives the full lists.
         useB = !useB;
         replaceFile(kFile, useB ? configB_ : configA_);
