@@ -384,6 +384,12 @@ CmpiStatus getInstance(const AssocRow&, const CmpiContext& ctx, CmpiResult& rslt
                           static_cast<int>(data.type));
             return CmpiStatus(rc);
         }
+        // A reference key without a value names no object: answered as a
+        // missing key instead of reading through a null path.
+        if ((data.state & CMPI_nullValue) != 0 || data.value.ref == nullptr) {
+            PROFILE_ERROR("%s: Error getting keyData%d, status.rc=%d!", op, k + 1, static_cast<int>(CMPI_RC_ERR_NOT_FOUND));
+            return CmpiStatus(CMPI_RC_ERR_NOT_FOUND);
+        }
         refs[k] = data.value.ref;
     }
     const CmpiObjectPath standard(refs[0]);

@@ -370,11 +370,13 @@ CmpiStatus assocEnumInstances(const AssocRow& row, const CmpiContext& ctx, CmpiR
     const std::string ns = nsText != nullptr ? nsText : "";
     if (row.pairs != nullptr) {
         row.pairs([&](const EndItem& a, const EndItem& b) {
+            const CmpiObjectPath p1 = row.end1.cls->makePath(row.end1.cls->className, ns.c_str(), a);
+            const CmpiObjectPath p2 = row.end2.cls->makePath(row.end2.cls->className, ns.c_str(), b);
+            if (p1.isNull() || p2.isNull())
+                return;
             CmpiInstance instance(path);
-            instance.setProperty(row.end1.role,
-                                 refData(row.end1.cls->makePath(row.end1.cls->className, ns.c_str(), a)));
-            instance.setProperty(row.end2.role,
-                                 refData(row.end2.cls->makePath(row.end2.cls->className, ns.c_str(), b)));
+            instance.setProperty(row.end1.role, refData(p1));
+            instance.setProperty(row.end2.role, refData(p2));
             if (row.extra.name != nullptr && row.extra.onEnumeration)
                 instance.setProperty(row.extra.name, CmpiData(static_cast<CMPIUint16>(row.extra.value)));
             rslt.returnData(instance);
@@ -416,6 +418,10 @@ CmpiStatus assocEnumInstanceNames(const AssocRow& row, const CmpiContext& ctx, C
                 return;
             const CmpiObjectPath p1 = row.end1.cls->makePath(row.end1.cls->className, ns.c_str(), a);
             const CmpiObjectPath p2 = row.end2.cls->makePath(row.end2.cls->className, ns.c_str(), b);
+            // An end that no list slot matches (its list was built without
+            // the adapter library) names no object: the pair is left out.
+            if (p1.isNull() || p2.isNull())
+                return;
             if (!setRoleKeys(row, answer, p1, p2, "enumInstanceNames", status)) {
                 stop = true;
                 return;
@@ -460,6 +466,12 @@ CmpiStatus assocGetInstance(const AssocRow& row, const CmpiContext& ctx, CmpiRes
             ASSOC_ERROR("%s: Error invalid keyData%d type, keyData%d.type=%d!", op.c_str(), k + 1, k + 1,
                         static_cast<int>(data.type));
             return CmpiStatus(rc);
+        }
+        // A reference key without a value names no object: answered as a
+        // missing key instead of reading through a null path.
+        if ((data.state & CMPI_nullValue) != 0 || data.value.ref == nullptr) {
+            ASSOC_ERROR("%s: Error getting keyData%d, status.rc=%d!", op.c_str(), k + 1, static_cast<int>(CMPI_RC_ERR_NOT_FOUND));
+            return CmpiStatus(CMPI_RC_ERR_NOT_FOUND);
         }
         refs[k] = data.value.ref;
     }

@@ -120,7 +120,12 @@ MI* createMI(MI& mi, FT* ft, const CMPIBroker* mb, const CMPIContext* ctx, CMPIS
 {
     std::lock_guard<std::mutex> serial(factoryMutex);
     try {
-        mi.ft = ft;
+        // A server may call a factory again (sfcb: once per class section)
+        // while its request threads use the MI handed out before, without a
+        // lock of ours: the MI's fields are written only when they change,
+        // so a repeated call writes nothing that those threads read.
+        if (mi.ft != ft)
+            mi.ft = ft;
         CmpiBaseMI* provider = baseVexlan_CNA_Provider.getBaseMI();
         if (provider == nullptr) {
             CmpiBroker broker(mb);
@@ -136,7 +141,9 @@ MI* createMI(MI& mi, FT* ft, const CMPIBroker* mb, const CMPIContext* ctx, CMPIS
             baseVexlan_CNA_Provider.setBaseMI(created);
             provider = created;
         }
-        mi.hdl = static_cast<CmpiBaseMI*>(provider);
+        void* const handle = static_cast<CmpiBaseMI*>(provider);
+        if (mi.hdl != handle)
+            mi.hdl = handle;
         baseVexlan_CNA_Provider.attachMI(&mi);
         return &mi;
     } catch (const CmpiStatus& st) {

@@ -131,6 +131,9 @@ int zorap_sim_wait_flash_writes(unsigned long count, uint32_t timeoutMs);
  * nothing but return the code; ZORAP_GetAdapterList returns null,
  * ZORAP_DidConfigChange returns the code, ZORAP_FreeMem still releases. */
 int zorap_sim_fail(int function, uint32_t code, int times);
+/* The same, from the callNumber-th call of the function from now on (1: the
+ * next call); the calls before it succeed.  zorap_sim_fail is callNumber 1. */
+int zorap_sim_fail_call(int function, uint32_t code, unsigned long callNumber, int times);
 /* How often a function has been called since the process loaded the
  * library or since the last zorap_sim_reset. */
 unsigned long zorap_sim_call_count(int function);

@@ -207,6 +207,7 @@ struct Alarm {
 struct Fault {
     uint32_t code = 0;
     int remaining = 0;
+    unsigned long passing = 0;  // calls that still succeed before the failures start
 };
 
 class Library {
@@ -264,6 +265,10 @@ public:
         std::lock_guard<std::mutex> l(faultMu);
         Fault& f = faults[fn];
         if (f.code == 0 || f.remaining == 0) return false;
+        if (f.passing > 0) {
+            --f.passing;
+            return false;
+        }
         *code = f.code;
         if (f.remaining > 0) --f.remaining;
         return true;
@@ -1256,6 +1261,18 @@ ZORAP_EXPORT int zorap_sim_fail(int function, uint32_t code, int times) {
     Library& L = zorap_sim::lib();
     std::lock_guard<std::mutex> l(L.faultMu);
     L.faults[function] = (code == 0 || times == 0) ? zorap_sim::Fault{} : zorap_sim::Fault{code, times};
+    return 0;
+}
+
+ZORAP_EXPORT int zorap_sim_fail_call(int function, uint32_t code, unsigned long callNumber, int times) {
+    if (callNumber == 0) {
+        zorap_sim::complain("zorap_sim_fail_call: calls are counted from 1");
+        return -1;
+    }
+    if (zorap_sim_fail(function, code, times) != 0) return -1;
+    Library& L = zorap_sim::lib();
+    std::lock_guard<std::mutex> l(L.faultMu);
+    L.faults[function].passing = L.faults[function].code != 0 ? callNumber - 1 : 0;
     return 0;
 }
 

@@ -75,7 +75,16 @@ TEST_F(SimTest, InjectedFailuresAndCallCounts) {
     EXPECT_EQ(2u, ZORAP_SwapBackupToMainAdapterList());
     EXPECT_EQ(main, ZORAP_GetAdapterList());
 
+    // A failure that starts at a later call: the calls before it pass.
+    ASSERT_EQ(0, zorap_sim_fail_call(ZORAP_FN_GetLinkProperties, 0x4712, 3, 1));
+    EXPECT_EQ(ZORAP_OK, ZORAP_GetLinkProperties("eth0", &link));
+    EXPECT_EQ(ZORAP_OK, ZORAP_GetLinkProperties("eth0", &link));
+    EXPECT_EQ(0x4712u, ZORAP_GetLinkProperties("eth0", &link));
+    EXPECT_EQ(ZORAP_OK, ZORAP_GetLinkProperties("eth0", &link));
+    EXPECT_EQ(-1, zorap_sim_fail_call(ZORAP_FN_GetLinkProperties, 1, 0, 1));
+
     EXPECT_EQ(-1, zorap_sim_fail(ZORAP_FN_COUNT, 1, 1));
+    EXPECT_EQ(-1, zorap_sim_fail_call(ZORAP_FN_COUNT, 1, 1, 1));
     zorap_sim_reset();
     EXPECT_EQ(0u, zorap_sim_call_count(ZORAP_FN_GetLinkProperties));
     EXPECT_EQ(ZORAP_OK, ZORAP_SwapBackupToMainAdapterList());
