@@ -439,7 +439,9 @@ def machine():
     return "%s, %d cores, %s %s" % (cpu, os.cpu_count() or 0, platform.system(), platform.release())
 
 
-def commit():
+def commit(given=None):
+    if given:
+        return given
     try:
         rev = subprocess.run(["git", "-C", ROOT, "rev-parse", "--short", "HEAD"], stdout=subprocess.PIPE,
                              universal_newlines=True).stdout.strip()
@@ -472,6 +474,7 @@ def main():
     ap.add_argument("--check", action="store_true")
     ap.add_argument("--as-before", action="store_true")
     ap.add_argument("--work", default=None)
+    ap.add_argument("--commit", default=None, help="the commit measured, when the build is of another tree")
     args = ap.parse_args()
     build = os.path.abspath(args.build)
     sizes = [int(s) for s in args.sizes.split(",") if s]
@@ -515,7 +518,7 @@ def main():
 
     before = kept_before(args.out)
     if args.as_before or before is None:
-        before = "Measured at commit %s.\n\n%s" % (commit(), current)
+        before = "Measured at commit %s.\n\n%s" % (commit(args.commit), current)
     header = ("# Performance\n\n"
               "Written by `make bench` (bench/run_bench.py driving bench/vexlan_bench); do not edit by hand.\n\n"
               "- Machine: %s\n- Commit: %s\n- Date: %s\n- Sizes: %s adapters of 4 FC functions "
@@ -527,7 +530,7 @@ def main():
               "returnDone, *adapter library* its calls into libzorap_cna_provider, and *provider own* the rest "
               "(its code and the C and C++ library calls it makes itself). FCPort and FCPortStatistics requests "
               "include the rebuild of their list.\n\n"
-              % (machine(), commit(), datetime.datetime.utcnow().strftime("%Y-%m-%d %H:%M UTC"),
+              % (machine(), commit(args.commit), datetime.datetime.utcnow().strftime("%Y-%m-%d %H:%M UTC"),
                  ", ".join(map(str, sizes)), ", ".join(map(str, mixed))))
     if plotted:
         header += "![cost per enumerated instance against host size](%s)\n\n" % png_name
