@@ -32,7 +32,7 @@ void appendField(char* target, std::size_t size, const char* text)
 {
     std::size_t used = strnlen(target, size);
     if (used + 1 < size)
-        FormatFCText(target + used, size - used, ";%s", text);
+        JoinFCText(target + used, size - used, {";", text});
 }
 
 // The VPD lines that follow product, part number and serial in VPDData, in
@@ -51,7 +51,7 @@ char* const kOptionROMLines[] = {g_optionROMBIOS, g_optionROMEFI, g_optionROMFCo
 // VPDData of one device from the freshly decoded buffers.
 void composeVpdData(FCPortEntry& entry, int chipCode)
 {
-    FormatFCText(entry.vpdData, sizeof(entry.vpdData), "%s;%s;%s", g_productId, g_partNumber, g_serialNumber);
+    JoinFCText(entry.vpdData, sizeof(entry.vpdData), {g_productId, ";", g_partNumber, ";", g_serialNumber});
     for (const char* line : kOptionalVpdLines)
         if (line[0] != '\0')
             appendField(entry.vpdData, sizeof(entry.vpdData), line);
@@ -110,16 +110,16 @@ bool createFCPort(_tagZORAPSDMDevice* device, FCPortEntry& entry, char* serial, 
     if (chipCode > 5) {
         GetHBAOptionROMVersions(device);
         debug("Vexlan_FC_FCPort: createFCPort: Option ROM versions retrieved.");
-        FormatFCText(entry.optionROMVersions, sizeof(entry.optionROMVersions), "%s;%s;%s;%s", g_optionROMBIOS,
-                      g_optionROMEFI, g_optionROMFCode, g_optionROMFirmware);
+        JoinFCText(entry.optionROMVersions, sizeof(entry.optionROMVersions),
+                   {g_optionROMBIOS, ";", g_optionROMEFI, ";", g_optionROMFCode, ";", g_optionROMFirmware});
     }
 
     TakeFCSerial(device, vpdResult, serial, serialSize);
     char nodeWWN[kFCWWNTextSize];
     FormatWWN(device->nodeWWN, nodeWWN, sizeof(nodeWWN));
     FormatWWN(device->portWWN, entry.portWWN, sizeof(entry.portWWN));
-    FormatFCText(entry.deviceId, sizeof(entry.deviceId), "%s_%s_%s", serial, nodeWWN, entry.portWWN);
-    FormatFCText(entry.serialNumber, sizeof(entry.serialNumber), "%s", serial);
+    JoinFCText(entry.deviceId, sizeof(entry.deviceId), {serial, "_", nodeWWN, "_", entry.portWWN});
+    JoinFCText(entry.serialNumber, sizeof(entry.serialNumber), {serial});
 
     device->portPropertyIndex = 0;
     if (ZORAP_GetHbaDevicePortProperty(device->deviceHandle, 0, device->portWWN) != 0) {
@@ -137,8 +137,7 @@ bool createFCPort(_tagZORAPSDMDevice* device, FCPortEntry& entry, char* serial, 
     entry.maxSpeed = FCPortMaxSpeed(device);
     entry.deviceNumber = static_cast<std::uint16_t>(device->portIndex & 0xFFFFu);
     entry.deviceStatus = device->portPropertyIndex;
-    FormatFCText(entry.model, sizeof(entry.model), "%.*s", static_cast<int>(sizeof(device->modelName)),
-                  device->modelName);
+    JoinFCText(entry.model, sizeof(entry.model), {{device->modelName, sizeof(device->modelName)}});
     entry.macAvailable = TakeENodeMAC(device, entry.macAddress);
     entry.device = device;
     return true;
@@ -223,23 +222,48 @@ int FormatFCText(char* out, std::size_t size, const char* format, ...)
     return n;
 }
 
+std::size_t JoinFCText(char* out, std::size_t size, std::initializer_list<FCTextPart> parts)
+{
+    if (out == nullptr || size == 0)
+        return 0;
+    std::size_t used = 0;
+    std::size_t total = 0;
+    for (const FCTextPart& part : parts) {
+        const char* text = part.text != nullptr ? part.text : "(null)";   // as printf shows it
+        const std::size_t length = strnlen(text, part.limit);
+        total += length;
+        const std::size_t room = size - 1 - used;
+        const std::size_t n = length < room ? length : room;
+        std::memcpy(out + used, text, n);
+        used += n;
+    }
+    out[used] = '\0';
+    return total;
+}
+
 void FormatWWN(const std::uint8_t* wwn, char* out, std::size_t size)
 {
-    FormatFCText(out, size, "%02X%02X%02X%02X%02X%02X%02X%02X", wwn[0], wwn[1], wwn[2], wwn[3], wwn[4], wwn[5],
-                  wwn[6], wwn[7]);
+    static const char kHex[] = "0123456789ABCDEF";
+    char text[kFCWWNTextSize];
+    for (int i = 0; i < 8; ++i) {
+        text[2 * i] = kHex[wwn[i] >> 4];
+        text[2 * i + 1] = kHex[wwn[i] & 0xF];
+    }
+    text[16] = '\0';
+    JoinFCText(out, size, {text});
 }
 
 void TakeFCSerial(_tagZORAPSDMDevice* device, int vpdResult, char* serial, std::size_t size)
 {
     if (GetRSX4GbOrNewerType(device) == 0) {
-        FormatFCText(serial, size, "%.*s", static_cast<int>(sizeof(device->deviceSerial)), device->deviceSerial);
+        JoinFCText(serial, size, {{device->deviceSerial, sizeof(device->deviceSerial)}});
         return;
     }
     if (vpdResult != 0)
         return;
     const char* colon = static_cast<const char*>(std::memchr(g_serialNumber, ':', strnlen(g_serialNumber, kVpdLineSize)));
     if (colon != nullptr)
-        FormatFCText(serial, size, "%s", colon + 1);
+        JoinFCText(serial, size, {colon + 1});
 }
 
 std::uint8_t TakeENodeMAC(_tagZORAPSDMDevice* device, std::uint8_t* mac)
@@ -270,7 +294,7 @@ std::uint64_t FCPortSpeedForCode(std::uint32_t speedCode, int chipCode, char* de
             text = row.description;
         break;
     }
-    FormatFCText(description, size, "%s", text);
+    JoinFCText(description, size, {text});
     return speed;
 }
 
