@@ -114,7 +114,7 @@ void buildLine(bool entering, const char* stem, int index)
         Vexlan_FC_Utils_CMPI::DebugPrint("Exiting  create%s\n", stem);
 }
 
-void checkType(const char* name, CMPIType declared, const CmpiData& value)
+void checkTypeOtherwise(const char* name, CMPIType declared, const CmpiData& value)
 {
     if (value.isNullValue() && value.getType() == CMPI_null)
         return;

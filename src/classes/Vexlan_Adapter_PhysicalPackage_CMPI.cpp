@@ -315,9 +315,9 @@ PropertyValue packageName(const PhysicalPackageEntry& e)
 }
 
 const PropertyRow<PhysicalPackageEntry> kProperties[] = {
-    {"Tag", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(e.tag))},
-    {"CreationClassName", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(kClassName))},
-    {"Model", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(e.model))},
+    {"Tag", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(e.tag))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(kClassName))},
+    {"Model", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(e.model))},
     {"Manufacturer", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(isIBM(e) ? "IBM" : "Vexlan Corporation"))},
     {"SerialNumber", CMPI_string, serialNumber},
     {"PartNumber", CMPI_string, partNumber},

@@ -45,10 +45,10 @@ PropertyValue elementName(const ProductEntry& e)
 }
 
 const PropertyRow<ProductEntry> kProperties[] = {
-    {"Name", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(e.name))},
-    {"IdentifyingNumber", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(e.identifyingNumber))},
-    {"Vendor", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(kVendor))},
-    {"Version", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(e.version))},
+    {"Name", CMPI_string, CLASS_VALUE(ProductEntry, entryText(e.name))},
+    {"IdentifyingNumber", CMPI_string, CLASS_VALUE(ProductEntry, entryText(e.identifyingNumber))},
+    {"Vendor", CMPI_string, CLASS_VALUE(ProductEntry, entryText(kVendor))},
+    {"Version", CMPI_string, CLASS_VALUE(ProductEntry, entryText(e.version))},
     {"ElementName", CMPI_string, elementName},
     {"AdapterType", CMPI_uint32, CLASS_VALUE(ProductEntry, CmpiData(static_cast<CMPIUint32>(e.adapterType)))},
 };

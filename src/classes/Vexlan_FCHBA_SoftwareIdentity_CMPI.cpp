@@ -134,9 +134,9 @@ PropertyValue releaseDate(const SoftwareIdentityEntry& e)
 }
 
 const PropertyRow<SoftwareIdentityEntry> kProperties[] = {
-    {"InstanceID", CMPI_string, CLASS_VALUE(SoftwareIdentityEntry, CmpiData(e.instanceId))},
+    {"InstanceID", CMPI_string, CLASS_VALUE(SoftwareIdentityEntry, entryText(e.instanceId))},
     {"Manufacturer", CMPI_string, manufacturer},
-    {"VersionString", CMPI_string, CLASS_VALUE(SoftwareIdentityEntry, CmpiData(e.versionString))},
+    {"VersionString", CMPI_string, CLASS_VALUE(SoftwareIdentityEntry, entryText(e.versionString))},
     {"Classifications", CMPI_uint16A, CLASS_VALUE(SoftwareIdentityEntry, uint16Array({e.classification}))},
     {"IdentityInfoType", CMPI_stringA,
      CLASS_VALUE(SoftwareIdentityEntry, stringArray({"SoftwareID", "SoftwareStatus"}))},

@@ -80,6 +80,16 @@ CmpiData::CmpiData(const char* d)
     data_.value.chars = const_cast<char*>(chars_->c_str());
 }
 
+CmpiData CmpiData::borrowedChars(const char* d)
+{
+    CmpiData data(static_cast<const char*>(nullptr));
+    if (d != nullptr) {
+        data.data_.state = CMPI_goodValue;
+        data.data_.value.chars = const_cast<char*>(d);
+    }
+    return data;
+}
+
 CmpiData::CmpiData(const std::string& d) : CmpiData(d.c_str()) {}
 
 // Handle values: a null handle gives a null value of the same type.
