@@ -195,6 +195,31 @@ void decodeAndRemember(unsigned char const* vpd, std::size_t size) {
     }
 }
 
+// "<label><text>" into a line of kVpdLineSize bytes, cut to its room, as
+// snprintf(line, kVpdLineSize, "%s%s", label, text) writes it: every
+// function of every FC build writes the option ROM lines.
+void labelledLine(char* line, char const* label, char const* text) {
+    std::size_t used = safeStrCpy(line, label, kVpdLineSize);
+    std::size_t count = std::strlen(text);
+    if (count > kVpdLineSize - 1 - used) count = kVpdLineSize - 1 - used;
+    std::memcpy(line + used, text, count);
+    line[used + count] = '\0';
+}
+
+// The first `count` version bytes as "%d.%02d[.%02d]" prints them.
+char const* versionText(char (&out)[32], std::uint8_t const* bytes, int count) {
+    char* p = out;
+    for (int i = 0; i < count; ++i) {
+        unsigned const v = bytes[i];
+        if (i > 0) *p++ = '.';
+        if (v >= 100) *p++ = static_cast<char>('0' + v / 100);
+        if (v >= 10 || i > 0) *p++ = static_cast<char>('0' + v / 10 % 10);
+        *p++ = static_cast<char>('0' + v % 10);
+    }
+    *p = '\0';
+    return out;
+}
+
 }  // namespace
 
 void PrintVPDField(unsigned char const* tag, unsigned char const* value, int length) {
@@ -310,32 +335,25 @@ void GetHBAOptionROMVersions(_tagZORAPSDMDevice* device) {
     biosText[sizeof device->biosVersionText] = '\0';
     char bios[64] = {};
     CleanStr(biosText, bios, sizeof bios);
-    std::snprintf(g_optionROMBIOS, kVpdLineSize, "OptionROM BIOS Version:%s", bios);
+    labelledLine(g_optionROMBIOS, "OptionROM BIOS Version:", bios);
 
     std::uint32_t const mask = device->optionRomMask;
     char version[32];
 
     if ((mask & ZORAP_OPTROM_FCODE) == 0)
-        std::snprintf(version, sizeof version, "N/A");
-    else if (GetRSX4GbOrNewerType(device) == 0)
-        std::snprintf(version, sizeof version, "%d.%02d.%02d", device->fcodeVersion[0],
-                      device->fcodeVersion[1], device->fcodeVersion[2]);
+        labelledLine(g_optionROMFCode, "OptionROM FCode Version:", "N/A");
     else
-        std::snprintf(version, sizeof version, "%d.%02d", device->fcodeVersion[0],
-                      device->fcodeVersion[1]);
-    std::snprintf(g_optionROMFCode, kVpdLineSize, "OptionROM FCode Version:%s", version);
+        labelledLine(g_optionROMFCode, "OptionROM FCode Version:",
+                     versionText(version, device->fcodeVersion, GetRSX4GbOrNewerType(device) == 0 ? 3 : 2));
 
     if ((mask & ZORAP_OPTROM_EFI) == 0)
-        std::snprintf(version, sizeof version, "N/A");
+        labelledLine(g_optionROMEFI, "OptionROM EFI Version:", "N/A");
     else
-        std::snprintf(version, sizeof version, "%d.%02d", device->efiVersion[0],
-                      device->efiVersion[1]);
-    std::snprintf(g_optionROMEFI, kVpdLineSize, "OptionROM EFI Version:%s", version);
+        labelledLine(g_optionROMEFI, "OptionROM EFI Version:", versionText(version, device->efiVersion, 2));
 
     if ((mask & ZORAP_OPTROM_FIRMWARE) == 0)
-        std::snprintf(version, sizeof version, "N/A");
+        labelledLine(g_optionROMFirmware, "OptionROM Firmware Version:", "N/A");
     else
-        std::snprintf(version, sizeof version, "%d.%02d.%02d", device->firmwareVersion[0],
-                      device->firmwareVersion[1], device->firmwareVersion[2]);
-    std::snprintf(g_optionROMFirmware, kVpdLineSize, "OptionROM Firmware Version:%s", version);
+        labelledLine(g_optionROMFirmware, "OptionROM Firmware Version:",
+                     versionText(version, device->firmwareVersion, 3));
 }

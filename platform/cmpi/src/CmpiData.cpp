@@ -239,6 +239,19 @@ CMPIType CmpiArray::getType() const
     return static_cast<CMPIType>(t & ~CMPI_ARRAY);
 }
 
+void CmpiArray::setUint8Elements(const CMPIUint8* bytes, CMPICount count)
+{
+    CMPIArray* arr = static_cast<CMPIArray*>(requireEnc());
+    if (count > 0 && getType() != CMPI_uint8)
+        throw CmpiStatus(CMPI_RC_ERR_TYPE_MISMATCH);
+    for (CMPICount i = 0; i < count; ++i) {
+        CMPIValue v;
+        v.uint64 = 0;
+        v.uint8 = bytes[i];
+        check(arr->ft->setElementAt(arr, i, &v, CMPI_uint8));
+    }
+}
+
 CmpiArrayIdx CmpiArray::operator[](int idx) const
 {
     return CmpiArrayIdx(static_cast<CMPIArray*>(requireEnc()), idx);
