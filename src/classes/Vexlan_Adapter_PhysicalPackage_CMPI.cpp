@@ -309,8 +309,8 @@ PropertyValue packageName(const PhysicalPackageEntry& e)
     const char* vendor = isIBM(e) ? "IBM" : "Vexlan";
     const char* serial = GetSerialNumberFromIBM11SProductId(e.serialNumber);
     char text[512];
-    std::snprintf(text, sizeof(text), e.isCNA ? "%s CNA Adapter %s" : "%s Fibre Channel Adapter %s", vendor,
-                  serial != nullptr ? serial : "");
+    JoinFCText(text, sizeof(text),
+               {vendor, e.isCNA ? " CNA Adapter " : " Fibre Channel Adapter ", serial != nullptr ? serial : ""});
     return CmpiData(text);
 }
 

@@ -241,16 +241,33 @@ std::size_t JoinFCText(char* out, std::size_t size, std::initializer_list<FCText
     return total;
 }
 
-void FormatWWN(const std::uint8_t* wwn, char* out, std::size_t size)
+void FormatHexBytes(const std::uint8_t* bytes, int count, char* out, std::size_t size)
 {
     static const char kHex[] = "0123456789ABCDEF";
-    char text[kFCWWNTextSize];
-    for (int i = 0; i < 8; ++i) {
-        text[2 * i] = kHex[wwn[i] >> 4];
-        text[2 * i + 1] = kHex[wwn[i] & 0xF];
+    char text[2 * 16 + 1];
+    int n = 0;
+    for (int i = 0; i < count && i < 16; ++i) {
+        text[n++] = kHex[bytes[i] >> 4];
+        text[n++] = kHex[bytes[i] & 0xF];
     }
-    text[16] = '\0';
+    text[n] = '\0';
     JoinFCText(out, size, {text});
+}
+
+void FormatWWN(const std::uint8_t* wwn, char* out, std::size_t size)
+{
+    FormatHexBytes(wwn, 8, out, size);
+}
+
+const char* DecimalText(std::uint32_t value, char (&out)[11])
+{
+    char* p = out + sizeof out - 1;
+    *p = '\0';
+    do {
+        *--p = static_cast<char>('0' + value % 10);
+        value /= 10;
+    } while (value != 0);
+    return p;
 }
 
 void TakeFCSerial(_tagZORAPSDMDevice* device, int vpdResult, char* serial, std::size_t size)

@@ -72,6 +72,10 @@ bool IsFCProtocol(_zorap_adapter_t* adapter, _zorap_phy_port_t* port, _zorap_pro
 
 // "%02X" of each of the 8 bytes into `out` (at most size-1 characters).
 void FormatWWN(const std::uint8_t* wwn, char* out, std::size_t size);
+// "%02X" of each of `count` bytes (at most 16) into `out`, as FormatWWN.
+void FormatHexBytes(const std::uint8_t* bytes, int count, char* out, std::size_t size);
+// "%u" of a number into `out`, which has room for any 32-bit number.
+const char* DecimalText(std::uint32_t value, char (&out)[11]);
 
 // The adapter serial of a device, as every FC build takes it: for chips
 // below code 8 the serial the library keeps (`deviceSerial`); for newer chips

@@ -373,5 +373,22 @@ TEST(FCText, JoinsAndWwnsMatchTheirPrintfFormsAtEveryRoom)
         FormatFCText(printed, size, "%02X%02X%02X%02X%02X%02X%02X%02X", wwn[0], wwn[1], wwn[2], wwn[3], wwn[4],
                      wwn[5], wwn[6], wwn[7]);
         EXPECT_EQ(std::string(joined, sizeof joined), std::string(printed, sizeof printed)) << size;
+
+        const std::uint8_t lun[16] = {0x63, 0x4E, 0x4F, 0x52, 0, 1, 2, 3, 0xA0, 0xB1, 0xC2, 0xD3, 0xE4, 0xF5, 0x06, 0x17};
+        std::memset(joined, '#', sizeof joined);
+        std::memset(printed, '#', sizeof printed);
+        FormatHexBytes(lun, 16, joined, size);
+        std::string hex;
+        for (std::uint8_t b : lun) {
+            char two[3];
+            std::snprintf(two, sizeof two, "%02X", b);
+            hex += two;
+        }
+        FormatFCText(printed, size, "%s", hex.c_str());
+        EXPECT_EQ(std::string(joined, sizeof joined), std::string(printed, sizeof printed)) << size;
+    }
+    for (std::uint32_t n : {0u, 7u, 10u, 65535u, 4294967295u}) {
+        char text[11];
+        EXPECT_EQ(std::string(DecimalText(n, text)), std::to_string(n));
     }
 }
