@@ -537,8 +537,8 @@ def main():
     doc = header + "# Now\n\n" + current + "\n# Before\n\n" + BEFORE_BEGIN + "\n" + before + "\n" + BEFORE_END + "\n"
     with open(out, "w") as f:
         f.write(doc)
-    print("run_bench: wrote %s" % out)
-    if not args.work and not args.check:
+    print("run_bench: wrote %s" % (out if not args.check else "a checked document"))
+    if not args.work:
         shutil.rmtree(work, ignore_errors=True)
 
 
