@@ -416,12 +416,13 @@ def plot(runs, png, work):
                 if r and "split" in r:
                     f.write("%d %f\n" % (s, per_instance_total(r)))
             f.write("\n\n")
-    plots = ", ".join("'%s' index %d with linespoints title '%s'" % (data, i, c.replace("_", "\\_"))
+    plots = ", ".join("'%s' index %d with linespoints title '%s'" % (data, i, c.replace("Vexlan_", ""))
                       for i, c in enumerate(classes))
     script = ("set terminal png size 1000,640 noenhanced\n"
-              "set output '%s'\nset logscale x 2\nset xlabel 'adapters (4 FC functions each)'\n"
-               "set ylabel 'instructions per enumerated instance'\nset key outside right\n"
-               "set title 'EnumerateInstances: cost per instance against host size'\nplot %s\n" % (png, plots))
+              "set output '%s'\nset logscale x 2\nset xtics (%s)\nset xlabel 'adapters (4 FC functions each)'\n"
+              "set ylabel 'instructions per enumerated instance'\nset key outside right\nset yrange [0:*]\n"
+              "set title 'EnumerateInstances: cost per instance against host size'\nplot %s\n"
+              % (png, ", ".join(str(s) for s in sizes), plots))
     subprocess.run(["gnuplot"], input=script, universal_newlines=True, check=True)
     return True
 
