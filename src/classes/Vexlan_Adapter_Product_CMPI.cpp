@@ -5,6 +5,7 @@
 #include <cstdio>
 
 #include "classes/Vexlan_Adapter_PhysicalPackage_CMPI.h"
+#include "classes/Vexlan_FC_FCPort_CMPI.h"
 
 ClassList<ProductEntry> g_ProductList = {0, nullptr};
 
@@ -40,7 +41,7 @@ const char kVendor[] = "Vexlan Corporation";
 PropertyValue elementName(const ProductEntry& e)
 {
     char text[512];
-    std::snprintf(text, sizeof(text), "%s_%s_%s", kVendor, e.version, e.name);
+    JoinFCText(text, sizeof(text), {kVendor, "_", e.version, "_", e.name});
     return CmpiData(text);
 }
 
