@@ -1349,6 +1349,8 @@ __attribute__((destructor)) static void zorap_sim_unload() {
         zorap_sim::releaseAll(L.modelPath);
         zorap_sim::releaseAll(L.modelConfiguration);
         zorap_sim::releaseAll(L.handles);
+        zorap_sim::releaseAll(L.fcPlaces);
+        L.fcPlacesValid = false;
         // Blocks still handed out are the caller's leak; the set that knew
         // them goes, so that a leak checker sees them.
         zorap_sim::releaseAll(L.allocations);
