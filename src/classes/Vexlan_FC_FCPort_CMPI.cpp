@@ -243,15 +243,8 @@ std::size_t JoinFCText(char* out, std::size_t size, std::initializer_list<FCText
 
 void FormatHexBytes(const std::uint8_t* bytes, int count, char* out, std::size_t size)
 {
-    static const char kHex[] = "0123456789ABCDEF";
     char text[2 * 16 + 1];
-    int n = 0;
-    for (int i = 0; i < count && i < 16; ++i) {
-        text[n++] = kHex[bytes[i] >> 4];
-        text[n++] = kHex[bytes[i] & 0xF];
-    }
-    text[n] = '\0';
-    JoinFCText(out, size, {text});
+    JoinFCText(out, size, {hexBytesText(bytes, count < 16 ? (count > 0 ? count : 0) : 16, '\0', text)});
 }
 
 void FormatWWN(const std::uint8_t* wwn, char* out, std::size_t size)

@@ -90,6 +90,20 @@ void utoa(unsigned int value, char* text) {
     std::snprintf(text, kUTextSize, "%u", value);
 }
 
+char* hexBytesText(unsigned char const* bytes, int count, char separator, char* text) {
+    // Written directly, not through printf: the NIC classes write several of
+    // these texts for every instance.
+    static char const kHex[] = "0123456789ABCDEF";
+    char* p = text;
+    for (int i = 0; i < count; ++i) {
+        if (i > 0 && separator != '\0') *p++ = separator;
+        *p++ = kHex[bytes[i] >> 4];
+        *p++ = kHex[bytes[i] & 0xF];
+    }
+    *p = '\0';
+    return text;
+}
+
 char* macaddrToStr(void const* mac, char* text) {
     // One buffer per thread: the text of a call with a null `text` lives until
     // the next such call on the same thread.
@@ -99,9 +113,7 @@ char* macaddrToStr(void const* mac, char* text) {
         text[0] = '\0';
         return text;
     }
-    auto const* b = static_cast<unsigned char const*>(mac);
-    std::snprintf(text, kMacTextSize, "%02X%02X%02X%02X%02X%02X", b[0], b[1], b[2], b[3], b[4], b[5]);
-    return text;
+    return hexBytesText(static_cast<unsigned char const*>(mac), 6, '\0', text);
 }
 
 void IPv4addToStr(void const* address, char* text) {
