@@ -6,7 +6,7 @@ JOBS       ?= $(shell nproc)
 PREFIX     ?= /usr/local
 GENERATOR  := $(shell command -v ninja >/dev/null 2>&1 && echo "-G Ninja")
 
-.PHONY: all deps build demo demo-real test test-asan test-tsan install clean
+.PHONY: all deps build demo demo-real test test-asan test-tsan install clean bench
 
 all: build
 
@@ -47,6 +47,15 @@ install: build
 	cmake -DCMAKE_INSTALL_PREFIX=$(PREFIX) $(BUILD) > /dev/null
 	cmake --build $(BUILD) -j $(JOBS)
 	cmake --install $(BUILD) --prefix $(PREFIX)
+
+# The benchmark: builds the driver, runs every scenario under callgrind on
+# generated hosts (isolated /opt and /var/tmp) and writes docs/performance.md
+# with its plot. Not part of `make test`. BENCH_SIZES=1,16 for a quick look.
+BENCH_SIZES ?= 1,16,256,1024
+bench: build
+	@scripts/install-bench-tools.sh
+	cmake --build $(BUILD) -j $(JOBS) --target vexlan_bench
+	ISOLATE_KEEP_CWD=1 tests/isolate.sh python3 bench/run_bench.py --build $(abspath $(BUILD)) --sizes $(BENCH_SIZES) --out $(abspath docs/performance.md)
 
 # The Debian package, from the plain build tree: $(BUILD)/vexlan-cna-provider_<version>_<arch>.deb
 deb: build

@@ -381,7 +381,8 @@ std::string stringOf(const CMPIString* s) {
 
 ObjectPath instancePath(const Host::Impl* core, const Instance& inst) {
     ObjectPath p = inst.path;
-    for (const auto& k : core->repo.keyNames(inst.className())) {
+    const auto keys = core->repo.sharedKeyNames(inst.className());
+    for (const auto& k : *keys) {
         if (const Value* v = inst.property(k)) {
             if (!v->null) p.setKey(k, *v);
         }

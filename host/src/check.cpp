@@ -34,7 +34,7 @@ std::string checkInstance(const ClassRepository& repo, const Instance& inst) {
                                          decl->embedded, p.second);
         if (!err.empty()) return err;
     }
-    for (const auto& k : repo.keyNames(cls)) {
+    for (const auto& k : *repo.sharedKeyNames(cls)) {
         const Value* v = inst.property(k);
         if (!v || v->null) return "instance of " + cls + " lacks its key property " + k;
     }
@@ -45,7 +45,8 @@ std::string checkPath(const ClassRepository& repo, const ObjectPath& p) {
     const std::string& cls = p.className;
     if (!repo.find(cls)) return "class " + cls + " is not declared in the MOF";
     const bool complete = repo.chainComplete(cls);
-    const std::vector<std::string> keys = repo.keyNames(cls);
+    const auto sharedKeys = repo.sharedKeyNames(cls);
+    const std::vector<std::string>& keys = *sharedKeys;
     for (const auto& k : p.keys) {
         const PropertyDecl* decl = repo.findProperty(cls, k.first);
         if (!decl) {

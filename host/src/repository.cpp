@@ -485,6 +485,8 @@ bool ClassRepository::parse(const std::string& text, const std::string& fileName
 void ClassRepository::add(ClassDecl decl) {
     const std::string k = lower(decl.name);
     classes_[k] = std::move(decl);
+    // A new class may be the superclass that gives another its keys.
+    keyNameCache_.clear();
 }
 
 std::vector<std::string> ClassRepository::classNames() const {
@@ -555,6 +557,13 @@ std::vector<std::string> ClassRepository::keyNames(const std::string& cls) const
     for (const auto& p : allProperties(cls))
         if (p.key) out.push_back(p.name);
     return out;
+}
+
+std::shared_ptr<const std::vector<std::string>> ClassRepository::sharedKeyNames(const std::string& cls) const {
+    std::lock_guard<std::mutex> g(keyNameCache_.m);
+    auto& slot = keyNameCache_.byClass[cls];
+    if (!slot) slot = std::make_shared<const std::vector<std::string>>(keyNames(cls));
+    return slot;
 }
 
 const MethodDecl* ClassRepository::findMethod(const std::string& cls, const std::string& method) const {

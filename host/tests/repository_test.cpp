@@ -94,6 +94,22 @@ TEST_F(RepoTest, PropertyTypesArraysReferencesAndKeys) {
     EXPECT_EQ(repo.findProperty("Ex_Port", "NoSuch"), nullptr);
 }
 
+// The shared key names follow classes read later: a subclass read before
+// its superclass gains the inherited key once the superclass arrives, and a
+// copy of the repository answers from its own classes.
+TEST(RepoKeyNames, SharedNamesFollowClassesAddedLater) {
+    ClassRepository repo;
+    std::string err;
+    ASSERT_TRUE(repo.loadText("class Ex_Sub : Ex_Top { [Key] string Tag; };", "sub.mof", err)) << err;
+    EXPECT_EQ(*repo.sharedKeyNames("Ex_Sub"), (std::vector<std::string>{"Tag"}));
+    const ClassRepository before = repo;
+    ASSERT_TRUE(repo.loadText("class Ex_Top { [Key] string Id; };", "top.mof", err)) << err;
+    EXPECT_EQ(*repo.sharedKeyNames("Ex_Sub"), (std::vector<std::string>{"Id", "Tag"}));
+    EXPECT_EQ(*before.sharedKeyNames("Ex_Sub"), (std::vector<std::string>{"Tag"}));
+    EXPECT_EQ(repo.sharedKeyNames("Ex_Sub"), repo.sharedKeyNames("Ex_Sub"));   // computed once
+    EXPECT_TRUE(repo.sharedKeyNames("Ex_None")->empty());
+}
+
 TEST_F(RepoTest, MethodsWithDirectionsAndTypes) {
     const MethodDecl* m = repo.findMethod("Ex_Port", "reset");
     ASSERT_NE(m, nullptr);

@@ -114,7 +114,7 @@ void buildLine(bool entering, const char* stem, int index)
         Vexlan_FC_Utils_CMPI::DebugPrint("Exiting  create%s\n", stem);
 }
 
-void checkType(const char* name, CMPIType declared, const CmpiData& value)
+void checkTypeOtherwise(const char* name, CMPIType declared, const CmpiData& value)
 {
     if (value.isNullValue() && value.getType() == CMPI_null)
         return;
@@ -148,7 +148,6 @@ CmpiData stringArray(std::initializer_list<const char*> values)
 CmpiData uint8Array(const unsigned char* bytes, std::size_t length)
 {
     CmpiArray array(static_cast<CMPICount>(length), CMPI_uint8);
-    for (std::size_t i = 0; i < length; ++i)
-        array[static_cast<int>(i)] = CmpiData(static_cast<CMPIUint8>(bytes[i]));
+    array.setUint8Elements(bytes, static_cast<CMPICount>(length));
     return CmpiData(array);
 }

@@ -91,6 +91,14 @@ struct PropertyRow {
     PropertyValue (*value)(const Entry& entry);  // from the entry, constants and host names only
 };
 
+// The text of a row that lives as long as the list entry or longer (a field
+// of the entry, a constant, the host name): handed to the instance without a
+// copy of its own, as makeInstance sets it before the entry can change.
+inline CmpiData entryText(const char* text)
+{
+    return CmpiData::borrowedChars(text);
+}
+
 // A row's value function written in place: CLASS_VALUE(FCPortEntry, CmpiData(e.DeviceID)).
 // The entry is `e`.
 #define CLASS_VALUE(Entry, expression) [](const Entry& e) -> PropertyValue { (void)e; return (expression); }
@@ -141,10 +149,19 @@ KeyRead readStringKey(const CmpiObjectPath& path, const char* keyName, const std
 void logInvalidSlot(const std::string& operation, const char* keyName);
 void debugLine(const char* prefix, const std::string& operation);
 
-// Sets one property or key after checking the value against the row's CIM
-// type; a mismatch is a fault of the module's table and throws
-// CMPI_RC_ERR_TYPE_MISMATCH naming the property.
-void checkType(const char* name, CMPIType declared, const CmpiData& value);
+// Checks a value against the row's CIM type before it is set as a property
+// or key; a mismatch is a fault of the module's table and throws
+// CMPI_RC_ERR_TYPE_MISMATCH naming the property. The two matches nearly every
+// row gives (the declared type itself, a text for a string) are settled
+// here, every other case by checkTypeOtherwise.
+void checkTypeOtherwise(const char* name, CMPIType declared, const CmpiData& value);
+inline void checkType(const char* name, CMPIType declared, const CmpiData& value)
+{
+    const CMPIType given = value.getType();
+    if (given == declared || (given == CMPI_chars && declared == CMPI_string))
+        return;
+    checkTypeOtherwise(name, declared, value);
+}
 
 // The adapter walk of the builds: every protocol of every physical port of
 // every adapter of the main tree, skipping null headers. Returns false when

@@ -42,11 +42,11 @@ PropertyValue osName(const HostSlot&)
 }
 
 const PropertyRow<HostSlot> kProperties[] = {
-    {"CreationClassName", CMPI_string, CLASS_VALUE(HostSlot, CmpiData(kClassName))},
-    {"Name", CMPI_string, CLASS_VALUE(HostSlot, CmpiData(hostName_ComputerSystem))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(HostSlot, entryText(kClassName))},
+    {"Name", CMPI_string, CLASS_VALUE(HostSlot, entryText(hostName_ComputerSystem))},
     {"NameFormat", CMPI_string, nameFormat},
-    {"Description", CMPI_string, CLASS_VALUE(HostSlot, CmpiData("Computer system hosting the Vexlan HBA provider"))},
-    {"ElementName", CMPI_string, CLASS_VALUE(HostSlot, CmpiData(hostName_ComputerSystem))},
+    {"Description", CMPI_string, CLASS_VALUE(HostSlot, entryText("Computer system hosting the Vexlan HBA provider"))},
+    {"ElementName", CMPI_string, CLASS_VALUE(HostSlot, entryText(hostName_ComputerSystem))},
     {"Dedicated", CMPI_uint16A, CLASS_VALUE(HostSlot, uint16Array({0}))},
     {"OperationalStatus", CMPI_uint16A, CLASS_VALUE(HostSlot, uint16Array({2}))},
     {"StatusDescriptions", CMPI_stringA, CLASS_VALUE(HostSlot, stringArray({"OK"}))},

@@ -247,12 +247,12 @@ PropertyValue sfpText(const char (&field)[N])
 }
 
 const PropertyRow<PhysicalConnectorEntry> kProperties[] = {
-    {"CreationClassName", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, CmpiData(kClassName))},
-    {"Tag", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, CmpiData(e.tag))},
-    {"Name", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, CmpiData(kClassName))},
-    {"ElementName", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, CmpiData("Physical Port Connector"))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, entryText(kClassName))},
+    {"Tag", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, entryText(e.tag))},
+    {"Name", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, entryText(kClassName))},
+    {"ElementName", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, entryText("Physical Port Connector"))},
     {"ConnectorLayout", CMPI_uint16, CLASS_VALUE(PhysicalConnectorEntry, CmpiData(static_cast<CMPIUint16>(1)))},
-    {"ConnectorDescription", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, CmpiData("SFP"))},
+    {"ConnectorDescription", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, entryText("SFP"))},
     {"Manufacturer", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, sfpText(e.sfp.Manufacturer))},
     {"SerialNumber", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, sfpText(e.sfp.SerialNumber))},
     {"PartNumber", CMPI_string, CLASS_VALUE(PhysicalConnectorEntry, sfpText(e.sfp.PartNumber))},

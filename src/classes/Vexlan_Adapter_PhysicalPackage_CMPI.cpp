@@ -289,7 +289,7 @@ PropertyValue serialNumber(const PhysicalPackageEntry& e)
 {
     if (is11S(e))
         return CmpiData(GetSerialNumberFromIBM11SProductId(e.serialNumber));
-    return CmpiData(e.serialNumber);
+    return entryText(e.serialNumber);
 }
 
 PropertyValue partNumber(const PhysicalPackageEntry& e)
@@ -300,7 +300,7 @@ PropertyValue partNumber(const PhysicalPackageEntry& e)
     }
     if (e.partNumber[0] == '\0')
         return std::nullopt;
-    return CmpiData(e.partNumber);
+    return entryText(e.partNumber);
 }
 
 // "IBM CNA Adapter <serial>", "Vexlan Fibre Channel Adapter <serial>", ...
@@ -309,21 +309,21 @@ PropertyValue packageName(const PhysicalPackageEntry& e)
     const char* vendor = isIBM(e) ? "IBM" : "Vexlan";
     const char* serial = GetSerialNumberFromIBM11SProductId(e.serialNumber);
     char text[512];
-    std::snprintf(text, sizeof(text), e.isCNA ? "%s CNA Adapter %s" : "%s Fibre Channel Adapter %s", vendor,
-                  serial != nullptr ? serial : "");
+    JoinFCText(text, sizeof(text),
+               {vendor, e.isCNA ? " CNA Adapter " : " Fibre Channel Adapter ", serial != nullptr ? serial : ""});
     return CmpiData(text);
 }
 
 const PropertyRow<PhysicalPackageEntry> kProperties[] = {
-    {"Tag", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(e.tag))},
-    {"CreationClassName", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(kClassName))},
-    {"Model", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(e.model))},
-    {"Manufacturer", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, CmpiData(isIBM(e) ? "IBM" : "Vexlan Corporation"))},
+    {"Tag", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(e.tag))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(kClassName))},
+    {"Model", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(e.model))},
+    {"Manufacturer", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(isIBM(e) ? "IBM" : "Vexlan Corporation"))},
     {"SerialNumber", CMPI_string, serialNumber},
     {"PartNumber", CMPI_string, partNumber},
     {"SKU", CMPI_string,
      [](const PhysicalPackageEntry& e) -> PropertyValue {
-         return e.sku[0] != '\0' ? PropertyValue(CmpiData(e.sku)) : std::nullopt;
+         return e.sku[0] != '\0' ? PropertyValue(entryText(e.sku)) : std::nullopt;
      }},
     {"PackageType", CMPI_uint16, CLASS_VALUE(PhysicalPackageEntry, CmpiData(static_cast<CMPIUint16>(9)))},
     {"Name", CMPI_string, packageName},

@@ -94,14 +94,14 @@ PropertyValue manufacturer(const PhysicalPortEntry& e)
 }
 
 const PropertyRow<PhysicalPortEntry> kProperties[] = {
-    {"CreationClassName", CMPI_string, CLASS_VALUE(PhysicalPortEntry, CmpiData(kClassName))},
-    {"Tag", CMPI_string, CLASS_VALUE(PhysicalPortEntry, CmpiData(e.tag))},
-    {"Name", CMPI_string, CLASS_VALUE(PhysicalPortEntry, CmpiData(kClassName))},
-    {"ElementName", CMPI_string, CLASS_VALUE(PhysicalPortEntry, CmpiData("Physical Port"))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(PhysicalPortEntry, entryText(kClassName))},
+    {"Tag", CMPI_string, CLASS_VALUE(PhysicalPortEntry, entryText(e.tag))},
+    {"Name", CMPI_string, CLASS_VALUE(PhysicalPortEntry, entryText(kClassName))},
+    {"ElementName", CMPI_string, CLASS_VALUE(PhysicalPortEntry, entryText("Physical Port"))},
     {"ConnectorLayout", CMPI_uint16, CLASS_VALUE(PhysicalPortEntry, CmpiData(static_cast<CMPIUint16>(1)))},
-    {"ConnectorDescription", CMPI_string, CLASS_VALUE(PhysicalPortEntry, CmpiData("Physical Port"))},
+    {"ConnectorDescription", CMPI_string, CLASS_VALUE(PhysicalPortEntry, entryText("Physical Port"))},
     {"Manufacturer", CMPI_string, manufacturer},
-    {"SerialNumber", CMPI_string, CLASS_VALUE(PhysicalPortEntry, CmpiData(e.serialNumber))},
+    {"SerialNumber", CMPI_string, CLASS_VALUE(PhysicalPortEntry, entryText(e.serialNumber))},
     {"PortNumber", CMPI_uint16, CLASS_VALUE(PhysicalPortEntry, CmpiData(static_cast<CMPIUint16>(e.portNumber)))},
 };
 

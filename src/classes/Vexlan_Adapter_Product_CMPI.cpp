@@ -5,6 +5,7 @@
 #include <cstdio>
 
 #include "classes/Vexlan_Adapter_PhysicalPackage_CMPI.h"
+#include "classes/Vexlan_FC_FCPort_CMPI.h"
 
 ClassList<ProductEntry> g_ProductList = {0, nullptr};
 
@@ -40,15 +41,15 @@ const char kVendor[] = "Vexlan Corporation";
 PropertyValue elementName(const ProductEntry& e)
 {
     char text[512];
-    std::snprintf(text, sizeof(text), "%s_%s_%s", kVendor, e.version, e.name);
+    JoinFCText(text, sizeof(text), {kVendor, "_", e.version, "_", e.name});
     return CmpiData(text);
 }
 
 const PropertyRow<ProductEntry> kProperties[] = {
-    {"Name", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(e.name))},
-    {"IdentifyingNumber", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(e.identifyingNumber))},
-    {"Vendor", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(kVendor))},
-    {"Version", CMPI_string, CLASS_VALUE(ProductEntry, CmpiData(e.version))},
+    {"Name", CMPI_string, CLASS_VALUE(ProductEntry, entryText(e.name))},
+    {"IdentifyingNumber", CMPI_string, CLASS_VALUE(ProductEntry, entryText(e.identifyingNumber))},
+    {"Vendor", CMPI_string, CLASS_VALUE(ProductEntry, entryText(kVendor))},
+    {"Version", CMPI_string, CLASS_VALUE(ProductEntry, entryText(e.version))},
     {"ElementName", CMPI_string, elementName},
     {"AdapterType", CMPI_uint32, CLASS_VALUE(ProductEntry, CmpiData(static_cast<CMPIUint32>(e.adapterType)))},
 };

@@ -24,9 +24,9 @@ PropertyValue nameVersion(const ObjectManagerSlot&)
 }
 
 const PropertyRow<ObjectManagerSlot> kProperties[] = {
-    {"SystemCreationClassName", CMPI_string, CLASS_VALUE(ObjectManagerSlot, CmpiData("Vexlan_Adapter_ComputerSystem"))},
+    {"SystemCreationClassName", CMPI_string, CLASS_VALUE(ObjectManagerSlot, entryText("Vexlan_Adapter_ComputerSystem"))},
     {"SystemName", CMPI_string, CLASS_VALUE(ObjectManagerSlot, CmpiData(hostName_ObjectManager))},
-    {"CreationClassName", CMPI_string, CLASS_VALUE(ObjectManagerSlot, CmpiData("Vexlan_FCHBA_ObjectManager"))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(ObjectManagerSlot, entryText("Vexlan_FCHBA_ObjectManager"))},
     {"Name", CMPI_string, CLASS_VALUE(ObjectManagerSlot, CmpiData(name_ObjectManager))},
     {"ElementName", CMPI_string, nameVersion},
     {"Description", CMPI_string, nameVersion},

@@ -104,7 +104,7 @@ std::string fillName(const char* pattern, const char* vendor, const char* serial
 
 PropertyValue manufacturer(const SoftwareIdentityEntry& e)
 {
-    return CmpiData(hasIBM11SSerial(e) ? "IBM" : "Vexlan Corporation");
+    return entryText(hasIBM11SSerial(e) ? "IBM" : "Vexlan Corporation");
 }
 
 PropertyValue name(const SoftwareIdentityEntry& e)
@@ -122,7 +122,7 @@ PropertyValue description(const SoftwareIdentityEntry& e)
     const ClassificationText* t = textsOf(e);
     if (t == nullptr)
         return std::nullopt;
-    return CmpiData(t->description);
+    return entryText(t->description);
 }
 
 PropertyValue releaseDate(const SoftwareIdentityEntry& e)
@@ -134,9 +134,9 @@ PropertyValue releaseDate(const SoftwareIdentityEntry& e)
 }
 
 const PropertyRow<SoftwareIdentityEntry> kProperties[] = {
-    {"InstanceID", CMPI_string, CLASS_VALUE(SoftwareIdentityEntry, CmpiData(e.instanceId))},
+    {"InstanceID", CMPI_string, CLASS_VALUE(SoftwareIdentityEntry, entryText(e.instanceId))},
     {"Manufacturer", CMPI_string, manufacturer},
-    {"VersionString", CMPI_string, CLASS_VALUE(SoftwareIdentityEntry, CmpiData(e.versionString))},
+    {"VersionString", CMPI_string, CLASS_VALUE(SoftwareIdentityEntry, entryText(e.versionString))},
     {"Classifications", CMPI_uint16A, CLASS_VALUE(SoftwareIdentityEntry, uint16Array({e.classification}))},
     {"IdentityInfoType", CMPI_stringA,
      CLASS_VALUE(SoftwareIdentityEntry, stringArray({"SoftwareID", "SoftwareStatus"}))},

@@ -71,8 +71,8 @@ PropertyValue zero(const FCPortStatisticsEntry&)
 #define COUNTER_ROW(i) {kCounters[i].property, CMPI_uint64, counter<i>}
 
 const PropertyRow<FCPortStatisticsEntry> kProperties[] = {
-    {"InstanceID", CMPI_string, CLASS_VALUE(FCPortStatisticsEntry, CmpiData(e.instanceId))},
-    {"ElementName", CMPI_string, CLASS_VALUE(FCPortStatisticsEntry, CmpiData(e.portWWN))},
+    {"InstanceID", CMPI_string, CLASS_VALUE(FCPortStatisticsEntry, entryText(e.instanceId))},
+    {"ElementName", CMPI_string, CLASS_VALUE(FCPortStatisticsEntry, entryText(e.portWWN))},
     COUNTER_ROW(0),
     COUNTER_ROW(1),
     COUNTER_ROW(2),

@@ -32,7 +32,7 @@ void appendField(char* target, std::size_t size, const char* text)
 {
     std::size_t used = strnlen(target, size);
     if (used + 1 < size)
-        FormatFCText(target + used, size - used, ";%s", text);
+        JoinFCText(target + used, size - used, {";", text});
 }
 
 // The VPD lines that follow product, part number and serial in VPDData, in
@@ -51,7 +51,7 @@ char* const kOptionROMLines[] = {g_optionROMBIOS, g_optionROMEFI, g_optionROMFCo
 // VPDData of one device from the freshly decoded buffers.
 void composeVpdData(FCPortEntry& entry, int chipCode)
 {
-    FormatFCText(entry.vpdData, sizeof(entry.vpdData), "%s;%s;%s", g_productId, g_partNumber, g_serialNumber);
+    JoinFCText(entry.vpdData, sizeof(entry.vpdData), {g_productId, ";", g_partNumber, ";", g_serialNumber});
     for (const char* line : kOptionalVpdLines)
         if (line[0] != '\0')
             appendField(entry.vpdData, sizeof(entry.vpdData), line);
@@ -110,16 +110,16 @@ bool createFCPort(_tagZORAPSDMDevice* device, FCPortEntry& entry, char* serial, 
     if (chipCode > 5) {
         GetHBAOptionROMVersions(device);
         debug("Vexlan_FC_FCPort: createFCPort: Option ROM versions retrieved.");
-        FormatFCText(entry.optionROMVersions, sizeof(entry.optionROMVersions), "%s;%s;%s;%s", g_optionROMBIOS,
-                      g_optionROMEFI, g_optionROMFCode, g_optionROMFirmware);
+        JoinFCText(entry.optionROMVersions, sizeof(entry.optionROMVersions),
+                   {g_optionROMBIOS, ";", g_optionROMEFI, ";", g_optionROMFCode, ";", g_optionROMFirmware});
     }
 
     TakeFCSerial(device, vpdResult, serial, serialSize);
     char nodeWWN[kFCWWNTextSize];
     FormatWWN(device->nodeWWN, nodeWWN, sizeof(nodeWWN));
     FormatWWN(device->portWWN, entry.portWWN, sizeof(entry.portWWN));
-    FormatFCText(entry.deviceId, sizeof(entry.deviceId), "%s_%s_%s", serial, nodeWWN, entry.portWWN);
-    FormatFCText(entry.serialNumber, sizeof(entry.serialNumber), "%s", serial);
+    JoinFCText(entry.deviceId, sizeof(entry.deviceId), {serial, "_", nodeWWN, "_", entry.portWWN});
+    JoinFCText(entry.serialNumber, sizeof(entry.serialNumber), {serial});
 
     device->portPropertyIndex = 0;
     if (ZORAP_GetHbaDevicePortProperty(device->deviceHandle, 0, device->portWWN) != 0) {
@@ -137,8 +137,7 @@ bool createFCPort(_tagZORAPSDMDevice* device, FCPortEntry& entry, char* serial, 
     entry.maxSpeed = FCPortMaxSpeed(device);
     entry.deviceNumber = static_cast<std::uint16_t>(device->portIndex & 0xFFFFu);
     entry.deviceStatus = device->portPropertyIndex;
-    FormatFCText(entry.model, sizeof(entry.model), "%.*s", static_cast<int>(sizeof(device->modelName)),
-                  device->modelName);
+    JoinFCText(entry.model, sizeof(entry.model), {{device->modelName, sizeof(device->modelName)}});
     entry.macAvailable = TakeENodeMAC(device, entry.macAddress);
     entry.device = device;
     return true;
@@ -147,26 +146,26 @@ bool createFCPort(_tagZORAPSDMDevice* device, FCPortEntry& entry, char* serial, 
 // ---- the class's tables -----------------------------------------------------
 
 const PropertyRow<FCPortEntry> kProperties[] = {
-    {"SystemCreationClassName", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(kSystemClassName))},
-    {"SystemName", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(hostName_ComputerSystem))},
-    {"CreationClassName", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(kClassName))},
-    {"DeviceID", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.deviceId))},
+    {"SystemCreationClassName", CMPI_string, CLASS_VALUE(FCPortEntry, entryText(kSystemClassName))},
+    {"SystemName", CMPI_string, CLASS_VALUE(FCPortEntry, entryText(hostName_ComputerSystem))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(FCPortEntry, entryText(kClassName))},
+    {"DeviceID", CMPI_string, CLASS_VALUE(FCPortEntry, entryText(e.deviceId))},
     {"OperationalStatus", CMPI_uint16A, CLASS_VALUE(FCPortEntry, uint16Array({e.operationalStatus}))},
     {"ActiveFC4Types", CMPI_uint16A, CLASS_VALUE(FCPortEntry, uint16Array({0}))},
     {"PortType", CMPI_uint16, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint16>(e.portType)))},
     {"Speed", CMPI_uint64, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint64>(e.speed)))},
     {"MaxSpeed", CMPI_uint64, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint64>(e.maxSpeed)))},
-    {"PermanentAddress", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.portWWN))},
+    {"PermanentAddress", CMPI_string, CLASS_VALUE(FCPortEntry, entryText(e.portWWN))},
     {"LinkTechnology", CMPI_uint16, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint16>(4)))},
-    {"ElementName", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.deviceId))},
+    {"ElementName", CMPI_string, CLASS_VALUE(FCPortEntry, entryText(e.deviceId))},
     {"UsageRestriction", CMPI_uint16, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint16>(0)))},
     {"SupportedMaximumTransmissionUnit", CMPI_uint64, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint64>(0)))},
-    {"VPDData", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.vpdData))},
-    {"OptionROMVersions", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.optionROMVersions))},
-    {"SpeedDescription", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.speedDescription))},
+    {"VPDData", CMPI_string, CLASS_VALUE(FCPortEntry, entryText(e.vpdData))},
+    {"OptionROMVersions", CMPI_string, CLASS_VALUE(FCPortEntry, entryText(e.optionROMVersions))},
+    {"SpeedDescription", CMPI_string, CLASS_VALUE(FCPortEntry, entryText(e.speedDescription))},
     {"DeviceNumber", CMPI_uint16, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPIUint16>(e.deviceNumber)))},
     {"DeviceStatus", CMPI_sint32, CLASS_VALUE(FCPortEntry, CmpiData(static_cast<CMPISint32>(e.deviceStatus)))},
-    {"Model", CMPI_string, CLASS_VALUE(FCPortEntry, CmpiData(e.model))},
+    {"Model", CMPI_string, CLASS_VALUE(FCPortEntry, entryText(e.model))},
     {"ENodeMACAddress", CMPI_string, CLASS_VALUE(FCPortEntry, ENodeMACText(e.macAvailable, e.macAddress))},
 };
 
@@ -223,23 +222,58 @@ int FormatFCText(char* out, std::size_t size, const char* format, ...)
     return n;
 }
 
+std::size_t JoinFCText(char* out, std::size_t size, std::initializer_list<FCTextPart> parts)
+{
+    if (out == nullptr || size == 0)
+        return 0;
+    std::size_t used = 0;
+    std::size_t total = 0;
+    for (const FCTextPart& part : parts) {
+        const char* text = part.text != nullptr ? part.text : "(null)";   // as printf shows it
+        const std::size_t length = strnlen(text, part.limit);
+        total += length;
+        const std::size_t room = size - 1 - used;
+        const std::size_t n = length < room ? length : room;
+        std::memcpy(out + used, text, n);
+        used += n;
+    }
+    out[used] = '\0';
+    return total;
+}
+
+void FormatHexBytes(const std::uint8_t* bytes, int count, char* out, std::size_t size)
+{
+    char text[2 * 16 + 1];
+    JoinFCText(out, size, {hexBytesText(bytes, count < 16 ? (count > 0 ? count : 0) : 16, '\0', text)});
+}
+
 void FormatWWN(const std::uint8_t* wwn, char* out, std::size_t size)
 {
-    FormatFCText(out, size, "%02X%02X%02X%02X%02X%02X%02X%02X", wwn[0], wwn[1], wwn[2], wwn[3], wwn[4], wwn[5],
-                  wwn[6], wwn[7]);
+    FormatHexBytes(wwn, 8, out, size);
+}
+
+const char* DecimalText(std::uint32_t value, char (&out)[11])
+{
+    char* p = out + sizeof out - 1;
+    *p = '\0';
+    do {
+        *--p = static_cast<char>('0' + value % 10);
+        value /= 10;
+    } while (value != 0);
+    return p;
 }
 
 void TakeFCSerial(_tagZORAPSDMDevice* device, int vpdResult, char* serial, std::size_t size)
 {
     if (GetRSX4GbOrNewerType(device) == 0) {
-        FormatFCText(serial, size, "%.*s", static_cast<int>(sizeof(device->deviceSerial)), device->deviceSerial);
+        JoinFCText(serial, size, {{device->deviceSerial, sizeof(device->deviceSerial)}});
         return;
     }
     if (vpdResult != 0)
         return;
     const char* colon = static_cast<const char*>(std::memchr(g_serialNumber, ':', strnlen(g_serialNumber, kVpdLineSize)));
     if (colon != nullptr)
-        FormatFCText(serial, size, "%s", colon + 1);
+        JoinFCText(serial, size, {colon + 1});
 }
 
 std::uint8_t TakeENodeMAC(_tagZORAPSDMDevice* device, std::uint8_t* mac)
@@ -270,7 +304,7 @@ std::uint64_t FCPortSpeedForCode(std::uint32_t speedCode, int chipCode, char* de
             text = row.description;
         break;
     }
-    FormatFCText(description, size, "%s", text);
+    JoinFCText(description, size, {text});
     return speed;
 }
 

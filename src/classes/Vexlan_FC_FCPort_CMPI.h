@@ -8,6 +8,7 @@
 #define VEXLAN_CLASSES_VEXLAN_FC_FCPORT_CMPI_H
 
 #include <cstddef>
+#include <initializer_list>
 #include <cstdint>
 
 #include "classes/ClassModule.h"
@@ -50,12 +51,31 @@ constexpr std::size_t kFCWWNTextSize = 17;
 // longer text is cut to size-1 characters. Gives vsnprintf's result.
 int FormatFCText(char* out, std::size_t size, const char* format, ...) __attribute__((format(printf, 3, 4)));
 
+// One text of a join: up to its terminating zero, or up to `limit` bytes
+// (what "%.*s" prints).
+struct FCTextPart {
+    FCTextPart(const char* t) : text(t) {}
+    FCTextPart(const char* t, std::size_t n) : text(t), limit(n) {}
+    const char* text;
+    std::size_t limit = static_cast<std::size_t>(-1);
+};
+
+// The texts one after the other into `out`, as FormatFCText(out, size,
+// "%s%s...") writes them (cut to size-1 characters, terminated), without
+// going through printf: the builds join texts for every function they visit.
+// Gives the length of the whole join.
+std::size_t JoinFCText(char* out, std::size_t size, std::initializer_list<FCTextPart> parts);
+
 // True for an FC function (protocolType below 2), the protocols every FC
 // class build wants.
 bool IsFCProtocol(_zorap_adapter_t* adapter, _zorap_phy_port_t* port, _zorap_protocol_t* protocol);
 
 // "%02X" of each of the 8 bytes into `out` (at most size-1 characters).
 void FormatWWN(const std::uint8_t* wwn, char* out, std::size_t size);
+// "%02X" of each of `count` bytes (at most 16) into `out`, as FormatWWN.
+void FormatHexBytes(const std::uint8_t* bytes, int count, char* out, std::size_t size);
+// "%u" of a number into `out`, which has room for any 32-bit number.
+const char* DecimalText(std::uint32_t value, char (&out)[11]);
 
 // The adapter serial of a device, as every FC build takes it: for chips
 // below code 8 the serial the library keeps (`deviceSerial`); for newer chips

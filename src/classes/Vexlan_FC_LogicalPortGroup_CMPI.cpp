@@ -47,10 +47,10 @@ bool createLogicalPortGroup(_tagZORAPSDMDevice* device, LogicalPortGroupEntry& e
 }
 
 const PropertyRow<LogicalPortGroupEntry> kProperties[] = {
-    {"InstanceID", CMPI_string, CLASS_VALUE(LogicalPortGroupEntry, CmpiData(e.instanceId))},
-    {"ElementName", CMPI_string, CLASS_VALUE(LogicalPortGroupEntry, CmpiData(e.nodeWWN))},
-    {"Name", CMPI_string, CLASS_VALUE(LogicalPortGroupEntry, CmpiData(e.nodeWWN))},
-    {"NameFormat", CMPI_string, CLASS_VALUE(LogicalPortGroupEntry, CmpiData("WWN"))},
+    {"InstanceID", CMPI_string, CLASS_VALUE(LogicalPortGroupEntry, entryText(e.instanceId))},
+    {"ElementName", CMPI_string, CLASS_VALUE(LogicalPortGroupEntry, entryText(e.nodeWWN))},
+    {"Name", CMPI_string, CLASS_VALUE(LogicalPortGroupEntry, entryText(e.nodeWWN))},
+    {"NameFormat", CMPI_string, CLASS_VALUE(LogicalPortGroupEntry, entryText("WWN"))},
 };
 
 const char* const kKeys[] = {"InstanceID", nullptr};

@@ -49,16 +49,16 @@ bool createPortController(_tagZORAPSDMDevice* device, PortControllerEntry& entry
 }
 
 const PropertyRow<PortControllerEntry> kProperties[] = {
-    {"SystemCreationClassName", CMPI_string, CLASS_VALUE(PortControllerEntry, CmpiData(kSystemClassName))},
-    {"SystemName", CMPI_string, CLASS_VALUE(PortControllerEntry, CmpiData(hostName_ComputerSystem))},
-    {"CreationClassName", CMPI_string, CLASS_VALUE(PortControllerEntry, CmpiData(kClassName))},
-    {"DeviceID", CMPI_string, CLASS_VALUE(PortControllerEntry, CmpiData(e.deviceId))},
+    {"SystemCreationClassName", CMPI_string, CLASS_VALUE(PortControllerEntry, entryText(kSystemClassName))},
+    {"SystemName", CMPI_string, CLASS_VALUE(PortControllerEntry, entryText(hostName_ComputerSystem))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(PortControllerEntry, entryText(kClassName))},
+    {"DeviceID", CMPI_string, CLASS_VALUE(PortControllerEntry, entryText(e.deviceId))},
     {"OperationalStatus", CMPI_uint16A, CLASS_VALUE(PortControllerEntry, uint16Array({1}))},
     {"StatusDescriptions", CMPI_stringA,
      CLASS_VALUE(PortControllerEntry,
                  stringArray({"Review operational status values for corresponding Vexlan_FCHBA_FCPort instances"}))},
     {"ProtocolSupported", CMPI_uint16, CLASS_VALUE(PortControllerEntry, CmpiData(static_cast<CMPIUint16>(10)))},
-    {"ElementName", CMPI_string, CLASS_VALUE(PortControllerEntry, CmpiData(e.deviceId))},
+    {"ElementName", CMPI_string, CLASS_VALUE(PortControllerEntry, entryText(e.deviceId))},
     {"ControllerType", CMPI_uint16, CLASS_VALUE(PortControllerEntry, CmpiData(static_cast<CMPIUint16>(4)))},
     {"ENodeMACAddress", CMPI_string, CLASS_VALUE(PortControllerEntry, ENodeMACText(e.macAvailable, e.macAddress))},
 };

@@ -47,10 +47,10 @@ const char kClassName[] = "Vexlan_FCHBA_SCSIProtocolController";
 
 const PropertyRow<SCSIPortNameEntry> kProperties[] = {
     {"SystemCreationClassName", CMPI_string,
-     CLASS_VALUE(SCSIPortNameEntry, CmpiData("Vexlan_Adapter_ComputerSystem"))},
-    {"SystemName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(hostName_ComputerSystem))},
-    {"CreationClassName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(kClassName))},
-    {"DeviceID", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(e.name))},
+     CLASS_VALUE(SCSIPortNameEntry, entryText("Vexlan_Adapter_ComputerSystem"))},
+    {"SystemName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, entryText(hostName_ComputerSystem))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, entryText(kClassName))},
+    {"DeviceID", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, entryText(e.name))},
     {"MaxUnitsControlled", CMPI_uint32, CLASS_VALUE(SCSIPortNameEntry, CmpiData(static_cast<CMPIUint32>(0)))},
 };
 

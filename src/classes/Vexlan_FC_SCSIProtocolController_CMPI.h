@@ -69,15 +69,15 @@ extern const char* const kSCSIEndpointKeys[];   // SystemCreationClassName, Syst
 template <const char* ClassName, CMPIUint16 Role>
 inline const PropertyRow<SCSIPortNameEntry> kSCSIEndpointProperties[] = {
     {"SystemCreationClassName", CMPI_string,
-     CLASS_VALUE(SCSIPortNameEntry, CmpiData("Vexlan_Adapter_ComputerSystem"))},
-    {"SystemName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(hostName_ComputerSystem))},
-    {"CreationClassName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(ClassName))},
-    {"Name", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(e.name))},
+     CLASS_VALUE(SCSIPortNameEntry, entryText("Vexlan_Adapter_ComputerSystem"))},
+    {"SystemName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, entryText(hostName_ComputerSystem))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, entryText(ClassName))},
+    {"Name", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, entryText(e.name))},
     {"ProtocolIFType", CMPI_uint16, CLASS_VALUE(SCSIPortNameEntry, CmpiData(static_cast<CMPIUint16>(56)))},
     {"ConnectionType", CMPI_uint16, CLASS_VALUE(SCSIPortNameEntry, CmpiData(static_cast<CMPIUint16>(2)))},
     {"Role", CMPI_uint16, CLASS_VALUE(SCSIPortNameEntry, CmpiData(Role))},
-    {"ElementName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(e.name))},
-    {"OtherTypeDescription", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, CmpiData(""))},
+    {"ElementName", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, entryText(e.name))},
+    {"OtherTypeDescription", CMPI_string, CLASS_VALUE(SCSIPortNameEntry, entryText(""))},
     {"OperationalStatus", CMPI_uint16A, CLASS_VALUE(SCSIPortNameEntry, uint16Array({2}))},
 };
 

@@ -5,6 +5,8 @@
 #include <cstdint>
 #include <cstdio>
 
+#include "classes/Vexlan_FC_FCPort_CMPI.h"
+
 ClassList<SCSIPortNameEntry> g_SCSIProtocolEndpointTargetList = {0, nullptr};
 
 void buildSCSIProtocolEndpointTargetList()
@@ -26,7 +28,7 @@ void buildSCSIProtocolEndpointTargetList()
         if (index >= capacity)
             return false;
         SCSIPortNameEntry& entry = list.entries[index++];
-        std::snprintf(entry.name, sizeof(entry.name), "%s_%s", local, remote);
+        JoinFCText(entry.name, sizeof(entry.name), {local, "_", remote});
         entry.valid = 1;
         return true;
     });

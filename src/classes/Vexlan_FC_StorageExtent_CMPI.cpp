@@ -8,6 +8,7 @@
 #include <string>
 
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
+#include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "classes/Vexlan_FC_SCSIProtocolController_CMPI.h"
 
 ClassList<StorageExtentEntry> g_StorageExtentList = {0, nullptr};
@@ -33,11 +34,11 @@ void buildStorageExtentList()
             // Sixteen identifier bytes when the LUN says so, else eight.
             const int idBytes = lun->lunIdLength == 16 ? 16 : 8;
             char lunId[2 * 16 + 1] = {};
-            for (int b = 0; b < idBytes; ++b)
-                std::snprintf(lunId + 2 * b, sizeof(lunId) - 2 * b, "%02X", lun->lunId[b]);
+            FormatHexBytes(lun->lunId, idBytes, lunId, sizeof(lunId));
             StorageExtentEntry& entry = list.entries[index];
-            std::snprintf(entry.deviceId, sizeof(entry.deviceId), "%s_%s_%s_%u", local, remote, lunId,
-                          static_cast<unsigned>(lun->lunNumber));
+            char number[11];
+            JoinFCText(entry.deviceId, sizeof(entry.deviceId),
+                       {local, "_", remote, "_", lunId, "_", DecimalText(lun->lunNumber, number)});
             entry.valid = 1;
             entry.device = device;
             entry.target = target;
@@ -73,18 +74,17 @@ PropertyValue lunNumberText(const StorageExtentEntry& e)
 {
     if (e.lun == nullptr)
         return std::nullopt;
-    char text[16];
-    std::snprintf(text, sizeof(text), "%u", static_cast<unsigned>(e.lun->lunNumber));
-    return stringArray({text});
+    char text[11];
+    return stringArray({DecimalText(e.lun->lunNumber, text)});
 }
 
 const PropertyRow<StorageExtentEntry> kProperties[] = {
     {"SystemCreationClassName", CMPI_string,
-     CLASS_VALUE(StorageExtentEntry, CmpiData("Vexlan_Adapter_ComputerSystem"))},
-    {"SystemName", CMPI_string, CLASS_VALUE(StorageExtentEntry, CmpiData(hostName_ComputerSystem))},
-    {"CreationClassName", CMPI_string, CLASS_VALUE(StorageExtentEntry, CmpiData(kClassName))},
-    {"DeviceID", CMPI_string, CLASS_VALUE(StorageExtentEntry, CmpiData(e.deviceId))},
-    {"ElementName", CMPI_string, CLASS_VALUE(StorageExtentEntry, CmpiData(" "))},
+     CLASS_VALUE(StorageExtentEntry, entryText("Vexlan_Adapter_ComputerSystem"))},
+    {"SystemName", CMPI_string, CLASS_VALUE(StorageExtentEntry, entryText(hostName_ComputerSystem))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(StorageExtentEntry, entryText(kClassName))},
+    {"DeviceID", CMPI_string, CLASS_VALUE(StorageExtentEntry, entryText(e.deviceId))},
+    {"ElementName", CMPI_string, CLASS_VALUE(StorageExtentEntry, entryText(" "))},
     {"Name", CMPI_string, LUN_VALUE(*lunText(e.lun->osDeviceName))},
     {"Access", CMPI_uint16, CLASS_VALUE(StorageExtentEntry, CmpiData(static_cast<CMPIUint16>(3)))},
     {"BlockSize", CMPI_uint64, LUN_VALUE(CmpiData(static_cast<CMPIUint64>(e.lun->blockSize)))},
@@ -92,8 +92,8 @@ const PropertyRow<StorageExtentEntry> kProperties[] = {
     {"VendorID", CMPI_string, LUN_VALUE(*lunText(e.lun->vendorId))},
     {"ProductID", CMPI_string, LUN_VALUE(*lunText(e.lun->productId))},
     {"Revision", CMPI_string, LUN_VALUE(*lunText(e.lun->revision))},
-    {"RaidType", CMPI_string, CLASS_VALUE(StorageExtentEntry, CmpiData("N/A"))},
-    {"NumberOfPartitions", CMPI_string, CLASS_VALUE(StorageExtentEntry, CmpiData("N/A"))},
+    {"RaidType", CMPI_string, CLASS_VALUE(StorageExtentEntry, entryText("N/A"))},
+    {"NumberOfPartitions", CMPI_string, CLASS_VALUE(StorageExtentEntry, entryText("N/A"))},
     {"OperationalStatus", CMPI_uint16A, CLASS_VALUE(StorageExtentEntry, uint16Array({2}))},
     {"OtherIdentifyingInfo", CMPI_stringA, lunNumberText},
     {"IdentifyingDescriptions", CMPI_stringA, CLASS_VALUE(StorageExtentEntry, stringArray({"Lun ID"}))},

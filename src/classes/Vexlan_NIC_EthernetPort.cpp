@@ -30,10 +30,7 @@ PropertyValue fcWwn(const NicRecord& r)
     if (l == nullptr)
         return CmpiData("");
     char text[32];
-    const unsigned char* b = l->portWWN;
-    std::snprintf(text, sizeof(text), "%02X-%02X-%02X-%02X-%02X-%02X-%02X-%02X", b[0], b[1], b[2], b[3], b[4],
-                  b[5], b[6], b[7]);
-    return CmpiData(text);
+    return CmpiData(hexBytesText(l->portWWN, 8, '-', text));
 }
 
 PropertyValue fcPortId(const NicRecord& r)
@@ -42,8 +39,7 @@ PropertyValue fcPortId(const NicRecord& r)
     if (l == nullptr)
         return CmpiData("");
     char text[16];
-    std::snprintf(text, sizeof(text), "%02X-%02X-%02X", l->portId[0], l->portId[1], l->portId[2]);
-    return CmpiData(text);
+    return CmpiData(hexBytesText(l->portId, 3, '-', text));
 }
 
 PropertyValue fcENodeMac(const NicRecord& r)

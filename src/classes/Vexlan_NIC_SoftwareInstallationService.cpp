@@ -32,13 +32,13 @@ struct ServiceSlot {
 const ServiceSlot kSlot = {1};
 
 const PropertyRow<ServiceSlot> kServiceProperties[] = {
-    {"Name", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData(kServiceName))},
-    {"SystemCreationClassName", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("Vexlan_Adapter_ComputerSystem"))},
-    {"SystemName", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData(hostName_ComputerSystem))},
-    {"CreationClassName", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("Vexlan_NIC_SoftwareInstallationService"))},
-    {"Caption", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("Update flash"))},
-    {"Description", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("Updating CNA flash(boot code, firmwares..."))},
-    {"ElementName", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("Updating Vexlan CNA flash Image"))},
+    {"Name", CMPI_string, CLASS_VALUE(ServiceSlot, entryText(kServiceName))},
+    {"SystemCreationClassName", CMPI_string, CLASS_VALUE(ServiceSlot, entryText("Vexlan_Adapter_ComputerSystem"))},
+    {"SystemName", CMPI_string, CLASS_VALUE(ServiceSlot, entryText(hostName_ComputerSystem))},
+    {"CreationClassName", CMPI_string, CLASS_VALUE(ServiceSlot, entryText("Vexlan_NIC_SoftwareInstallationService"))},
+    {"Caption", CMPI_string, CLASS_VALUE(ServiceSlot, entryText("Update flash"))},
+    {"Description", CMPI_string, CLASS_VALUE(ServiceSlot, entryText("Updating CNA flash(boot code, firmwares..."))},
+    {"ElementName", CMPI_string, CLASS_VALUE(ServiceSlot, entryText("Updating Vexlan CNA flash Image"))},
 };
 const char* const kServiceKeys[] = {"SystemCreationClassName", "SystemName", "CreationClassName", "Name", nullptr};
 
@@ -50,15 +50,15 @@ const ClassModule<ServiceSlot> kService = ClassModule<ServiceSlot>("Nic_Software
                                               .properties(kServiceProperties);
 
 const PropertyRow<ServiceSlot> kCapabilitiesProperties[] = {
-    {"InstanceID", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData(kServiceName))},
-    {"Caption", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("Update Capabilities"))},
+    {"InstanceID", CMPI_string, CLASS_VALUE(ServiceSlot, entryText(kServiceName))},
+    {"Caption", CMPI_string, CLASS_VALUE(ServiceSlot, entryText("Update Capabilities"))},
     {"SupportedAsynchronousActions", CMPI_uint16A, CLASS_VALUE(ServiceSlot, uint16Array({5}))},
     {"SupportedSynchronousActions", CMPI_uint16A, CLASS_VALUE(ServiceSlot, uint16Array({5}))},
     {"SupportedURISchemes", CMPI_uint16A, CLASS_VALUE(ServiceSlot, uint16Array({3}))},
     {"SupportedInstallOptions", CMPI_uint16A, CLASS_VALUE(ServiceSlot, uint16Array({32768}))},
-    {"ElementName", CMPI_string, CLASS_VALUE(ServiceSlot, CmpiData("Vexlan CNA Flash Image Update"))},
+    {"ElementName", CMPI_string, CLASS_VALUE(ServiceSlot, entryText("Vexlan CNA Flash Image Update"))},
     {"Description", CMPI_string,
-     CLASS_VALUE(ServiceSlot, CmpiData("Flash image includes boot code, ASIC and MPI Firmware"))},
+     CLASS_VALUE(ServiceSlot, entryText("Flash image includes boot code, ASIC and MPI Firmware"))},
 };
 const char* const kCapabilitiesKeys[] = {"InstanceID", nullptr};
 

@@ -4,6 +4,9 @@
 
 #include <cstdio>
 #include <cstring>
+#include <string>
+#include <utility>
+#include <vector>
 
 #include "inventory/AdapterFunc_Chip.h"
 #include "support/Vexlan_NIC_Utils.h"
@@ -84,6 +87,25 @@ KeywordRow const kKeywords[] = {
     {"YU", g_UUID, "UUID:", ValueForm::Text},
 };
 
+// The stream decoded last and the text each line held after it, so that the
+// same bytes read again (every function of one adapter reads its adapter's
+// VPD) give the same lines without a second decode.
+struct DecodedStream {
+    std::vector<unsigned char> bytes;
+    std::vector<std::pair<char*, std::string>> lines;  // in the order first written
+};
+DecodedStream g_lastStream;
+
+// While a decode is being remembered: the lines it wrote so far.
+std::vector<char*>* g_writtenLines = nullptr;
+
+void noteWritten(char* line) {
+    if (g_writtenLines == nullptr) return;
+    for (char* known : *g_writtenLines)
+        if (known == line) return;
+    g_writtenLines->push_back(line);
+}
+
 // "<label><value>" into a line: the value ends at its length or at a zero
 // byte, and the whole is cut to the line's room.
 void writeLine(char* line, char const* label, char const* value, int length) {
@@ -107,6 +129,7 @@ void trimmedCopy(unsigned char const* value, int length, char (&copy)[kValueCopy
 void decodeKeyword(KeywordRow const& row, unsigned char const* value, int length) {
     char dropped[kVpdLineSize];
     char* line = row.line != nullptr ? row.line : dropped;
+    if (row.line != nullptr) noteWritten(row.line);
     char copy[kValueCopySize];
 
     switch (row.form) {
@@ -139,6 +162,64 @@ std::size_t identifierLength(unsigned char const* tag) {
     return static_cast<std::size_t>(tag[1]) | (static_cast<std::size_t>(tag[2]) << 8);
 }
 
+// The lines of a stream equal to the one decoded last, written again as that
+// decode left them; false when the stream differs.
+bool replayLastStream(unsigned char const* vpd, std::size_t size) {
+    if (g_lastStream.bytes.size() != size || std::memcmp(g_lastStream.bytes.data(), vpd, size) != 0) return false;
+    for (auto const& line : g_lastStream.lines) std::memcpy(line.first, line.second.c_str(), line.second.size() + 1);
+    return true;
+}
+
+// Decodes the stream and keeps it with the text of the lines it wrote. Without
+// memory to keep it, the stream is decoded all the same and nothing is kept.
+void decodeAndRemember(unsigned char const* vpd, std::size_t size) {
+    g_lastStream.bytes.clear();
+    g_lastStream.lines.clear();
+    std::vector<char*> written;
+    bool recording = true;
+    try {
+        written.reserve(32);
+    } catch (...) {
+        recording = false;
+    }
+    g_writtenLines = recording ? &written : nullptr;
+    PrintVPD(vpd, size);
+    g_writtenLines = nullptr;
+    if (!recording) return;
+    try {
+        g_lastStream.bytes.assign(vpd, vpd + size);
+        for (char* line : written) g_lastStream.lines.emplace_back(line, std::string(line, strnlen(line, kVpdLineSize - 1)));
+    } catch (...) {
+        g_lastStream.bytes.clear();
+        g_lastStream.lines.clear();
+    }
+}
+
+// "<label><text>" into a line of kVpdLineSize bytes, cut to its room, as
+// snprintf(line, kVpdLineSize, "%s%s", label, text) writes it: every
+// function of every FC build writes the option ROM lines.
+void labelledLine(char* line, char const* label, char const* text) {
+    std::size_t used = safeStrCpy(line, label, kVpdLineSize);
+    std::size_t count = std::strlen(text);
+    if (count > kVpdLineSize - 1 - used) count = kVpdLineSize - 1 - used;
+    std::memcpy(line + used, text, count);
+    line[used + count] = '\0';
+}
+
+// The first `count` version bytes as "%d.%02d[.%02d]" prints them.
+char const* versionText(char (&out)[32], std::uint8_t const* bytes, int count) {
+    char* p = out;
+    for (int i = 0; i < count; ++i) {
+        unsigned const v = bytes[i];
+        if (i > 0) *p++ = '.';
+        if (v >= 100) *p++ = static_cast<char>('0' + v / 100);
+        if (v >= 10 || i > 0) *p++ = static_cast<char>('0' + v / 10 % 10);
+        *p++ = static_cast<char>('0' + v % 10);
+    }
+    *p = '\0';
+    return out;
+}
+
 }  // namespace
 
 void PrintVPDField(unsigned char const* tag, unsigned char const* value, int length) {
@@ -150,15 +231,18 @@ void PrintVPDField(unsigned char const* tag, unsigned char const* value, int len
 
     switch (tag[0]) {
     case kTagIdentifier:
+        noteWritten(g_productId);
         writeLine(g_productId, "Product Identifier:", reinterpret_cast<char const*>(value), length);
         return;
     case kTagReadOnly:
+        noteWritten(g_RTag);
         std::snprintf(g_RTag, kVpdLineSize, "VPD-R Tag:");
         return;
     case kTagWritable:
         // Decoded and dropped: nothing reads the writable section's tag.
         return;
     case kTagEnd:
+        noteWritten(g_endTag);
         std::snprintf(g_endTag, kVpdLineSize, "End Tag:");
         return;
     default:
@@ -236,7 +320,7 @@ int GetHBAVPDData(_tagZORAPSDMDevice* device) {
     if (buffer == nullptr) return -1;
 
     ZORAP_STATUS status = ZORAP_GetVpd(device->deviceHandle, 0, buffer, &length);
-    if (status == ZORAP_OK) PrintVPD(buffer, bufferSize);
+    if (status == ZORAP_OK && !replayLastStream(buffer, bufferSize)) decodeAndRemember(buffer, bufferSize);
 
     CoreFree(buffer);
     return static_cast<int>(status);
@@ -251,32 +335,25 @@ void GetHBAOptionROMVersions(_tagZORAPSDMDevice* device) {
     biosText[sizeof device->biosVersionText] = '\0';
     char bios[64] = {};
     CleanStr(biosText, bios, sizeof bios);
-    std::snprintf(g_optionROMBIOS, kVpdLineSize, "OptionROM BIOS Version:%s", bios);
+    labelledLine(g_optionROMBIOS, "OptionROM BIOS Version:", bios);
 
     std::uint32_t const mask = device->optionRomMask;
     char version[32];
 
     if ((mask & ZORAP_OPTROM_FCODE) == 0)
-        std::snprintf(version, sizeof version, "N/A");
-    else if (GetRSX4GbOrNewerType(device) == 0)
-        std::snprintf(version, sizeof version, "%d.%02d.%02d", device->fcodeVersion[0],
-                      device->fcodeVersion[1], device->fcodeVersion[2]);
+        labelledLine(g_optionROMFCode, "OptionROM FCode Version:", "N/A");
     else
-        std::snprintf(version, sizeof version, "%d.%02d", device->fcodeVersion[0],
-                      device->fcodeVersion[1]);
-    std::snprintf(g_optionROMFCode, kVpdLineSize, "OptionROM FCode Version:%s", version);
+        labelledLine(g_optionROMFCode, "OptionROM FCode Version:",
+                     versionText(version, device->fcodeVersion, GetRSX4GbOrNewerType(device) == 0 ? 3 : 2));
 
     if ((mask & ZORAP_OPTROM_EFI) == 0)
-        std::snprintf(version, sizeof version, "N/A");
+        labelledLine(g_optionROMEFI, "OptionROM EFI Version:", "N/A");
     else
-        std::snprintf(version, sizeof version, "%d.%02d", device->efiVersion[0],
-                      device->efiVersion[1]);
-    std::snprintf(g_optionROMEFI, kVpdLineSize, "OptionROM EFI Version:%s", version);
+        labelledLine(g_optionROMEFI, "OptionROM EFI Version:", versionText(version, device->efiVersion, 2));
 
     if ((mask & ZORAP_OPTROM_FIRMWARE) == 0)
-        std::snprintf(version, sizeof version, "N/A");
+        labelledLine(g_optionROMFirmware, "OptionROM Firmware Version:", "N/A");
     else
-        std::snprintf(version, sizeof version, "%d.%02d.%02d", device->firmwareVersion[0],
-                      device->firmwareVersion[1], device->firmwareVersion[2]);
-    std::snprintf(g_optionROMFirmware, kVpdLineSize, "OptionROM Firmware Version:%s", version);
+        labelledLine(g_optionROMFirmware, "OptionROM Firmware Version:",
+                     versionText(version, device->firmwareVersion, 3));
 }

@@ -18,16 +18,30 @@ public:
     TextWriter(char* text, std::size_t size) : text_(text), size_(size) {
         if (size_ > 0) text_[0] = '\0';
     }
-    __attribute__((format(printf, 2, 3))) void add(char const* format, ...) {
+    void addText(char const* part) {
         if (used_ + 1 >= size_) return;
-        va_list args;
-        va_start(args, format);
-        int written = std::vsnprintf(text_ + used_, size_ - used_, format, args);
-        va_end(args);
-        if (written > 0) {
-            used_ += static_cast<std::size_t>(written);
-            if (used_ >= size_) used_ = size_ - 1;
-        }
+        std::size_t const length = std::strlen(part);
+        std::size_t const room = size_ - 1 - used_;
+        std::size_t const n = length < room ? length : room;
+        std::memcpy(text_ + used_, part, n);
+        used_ += n;
+        text_[used_] = '\0';
+    }
+    // A number in base 10 or 16 (lower-case digits) with at least `minDigits`
+    // digits, as "%d", "%x" and "%02x" print it; written without printf, as
+    // the NIC classes write addresses for every instance.
+    void addNumber(unsigned value, unsigned base, int minDigits) {
+        static char const kDigits[] = "0123456789abcdef";
+        char digits[12];
+        char* p = digits + sizeof digits - 1;
+        *p = '\0';
+        int count = 0;
+        do {
+            *--p = kDigits[value % base];
+            value /= base;
+            ++count;
+        } while (value != 0 || count < minDigits);
+        addText(p);
     }
 
 private:
@@ -90,6 +104,20 @@ void utoa(unsigned int value, char* text) {
     std::snprintf(text, kUTextSize, "%u", value);
 }
 
+char* hexBytesText(unsigned char const* bytes, int count, char separator, char* text) {
+    // Written directly, not through printf: the NIC classes write several of
+    // these texts for every instance.
+    static char const kHex[] = "0123456789ABCDEF";
+    char* p = text;
+    for (int i = 0; i < count; ++i) {
+        if (i > 0 && separator != '\0') *p++ = separator;
+        *p++ = kHex[bytes[i] >> 4];
+        *p++ = kHex[bytes[i] & 0xF];
+    }
+    *p = '\0';
+    return text;
+}
+
 char* macaddrToStr(void const* mac, char* text) {
     // One buffer per thread: the text of a call with a null `text` lives until
     // the next such call on the same thread.
@@ -99,17 +127,18 @@ char* macaddrToStr(void const* mac, char* text) {
         text[0] = '\0';
         return text;
     }
-    auto const* b = static_cast<unsigned char const*>(mac);
-    std::snprintf(text, kMacTextSize, "%02X%02X%02X%02X%02X%02X", b[0], b[1], b[2], b[3], b[4], b[5]);
-    return text;
+    return hexBytesText(static_cast<unsigned char const*>(mac), 6, '\0', text);
 }
 
 void IPv4addToStr(void const* address, char* text) {
     if (address == nullptr || text == nullptr) return;
     auto const* b = static_cast<unsigned char const*>(address);
     TextWriter out(text, kIPv4TextSize);
-    out.add("%d", b[0]);
-    for (int i = 1; i < 4; ++i) out.add(".%d", b[i]);
+    out.addNumber(b[0], 10, 1);
+    for (int i = 1; i < 4; ++i) {
+        out.addText(".");
+        out.addNumber(b[i], 10, 1);
+    }
 }
 
 std::size_t safeStrCpy(char* target, char const* source, std::size_t size) {
@@ -187,7 +216,7 @@ void ipv6addr_build_ipv6_str_compact(unsigned char const* address, bool full, ch
     TextWriter out(text, kIPv6TextSize);
     for (int i = 0; i < 8; ++i) {
         if (i == runStart) {
-            out.add("::");
+            out.addText("::");
             continue;
         }
         if (runStart >= 0 && i > runStart && i < runStart + runLength) continue;
@@ -195,17 +224,17 @@ void ipv6addr_build_ipv6_str_compact(unsigned char const* address, bool full, ch
         unsigned char high = address[2 * i];
         unsigned char low = address[2 * i + 1];
         if (full) {
-            out.add("%02x%02x", high, low);
+            out.addNumber(static_cast<unsigned>(high) << 8 | low, 16, 4);
         } else if (high != 0) {
-            out.add("%x%02x", high, low);
+            out.addNumber(static_cast<unsigned>(high) << 8 | low, 16, 1);
         } else {
-            out.add("%x", low);
+            out.addNumber(low, 16, 1);
         }
 
         int next = i + 1;
         bool nextStartsRun = next == runStart;
         bool nextEndsRun = runStart >= 0 && next == runStart + runLength;
-        if (!nextStartsRun && !nextEndsRun && i != 7) out.add(":");
+        if (!nextStartsRun && !nextEndsRun && i != 7) out.addText(":");
     }
 }
 

@@ -35,6 +35,11 @@ void utoa(unsigned int value, char* text);
 // `text` must hold kMacTextSize bytes. Returns the text.
 char* macaddrToStr(void const* mac, char* text);
 
+// "%02X" of each of `count` bytes, with `separator` between them unless it
+// is '\0'; `text` must hold 2 * count + 1 bytes, and count - 1 more with a
+// separator. Returns the text.
+char* hexBytesText(unsigned char const* bytes, int count, char separator, char* text);
+
 // Four address bytes as "a.b.c.d"; `text` must hold kIPv4TextSize bytes.
 void IPv4addToStr(void const* address, char* text);
 

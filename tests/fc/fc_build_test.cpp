@@ -344,3 +344,51 @@ TEST_F(FCBuild, SixtyFourAdaptersOfFourFunctionsEach)
 }
 
 }  // namespace
+
+// The joins and WWN texts of the FC builds write what the printf forms they
+// stand for write, cut at every room from none to more than enough.
+TEST(FCText, JoinsAndWwnsMatchTheirPrintfFormsAtEveryRoom)
+{
+    const char model[4] = {'V', 'X', 'F', '1'};   // a record field without a terminating zero
+    const std::uint8_t wwn[8] = {0x31, 0x00, 0x02, 0x7E, 0x5A, 0xB6, 0x0F, 0xFF};
+    for (std::size_t size = 0; size <= 40; ++size) {
+        char joined[48];
+        char printed[48];
+        std::memset(joined, '#', sizeof joined);
+        std::memset(printed, '#', sizeof printed);
+        const std::size_t n = JoinFCText(joined, size, {"VXA1631K0042", "_", "", "_", "3100027E5AB60FFF"});
+        const int m = FormatFCText(printed, size, "%s_%s_%s", "VXA1631K0042", "", "3100027E5AB60FFF");
+        EXPECT_EQ(std::string(joined, sizeof joined), std::string(printed, sizeof printed)) << size;
+        EXPECT_EQ(static_cast<int>(n), size == 0 ? 0 : m);
+
+        std::memset(joined, '#', sizeof joined);
+        std::memset(printed, '#', sizeof printed);
+        JoinFCText(joined, size, {{model, sizeof model}, ";"});
+        FormatFCText(printed, size, "%.*s;", static_cast<int>(sizeof model), model);
+        EXPECT_EQ(std::string(joined, sizeof joined), std::string(printed, sizeof printed)) << size;
+
+        std::memset(joined, '#', sizeof joined);
+        std::memset(printed, '#', sizeof printed);
+        FormatWWN(wwn, joined, size);
+        FormatFCText(printed, size, "%02X%02X%02X%02X%02X%02X%02X%02X", wwn[0], wwn[1], wwn[2], wwn[3], wwn[4],
+                     wwn[5], wwn[6], wwn[7]);
+        EXPECT_EQ(std::string(joined, sizeof joined), std::string(printed, sizeof printed)) << size;
+
+        const std::uint8_t lun[16] = {0x63, 0x4E, 0x4F, 0x52, 0, 1, 2, 3, 0xA0, 0xB1, 0xC2, 0xD3, 0xE4, 0xF5, 0x06, 0x17};
+        std::memset(joined, '#', sizeof joined);
+        std::memset(printed, '#', sizeof printed);
+        FormatHexBytes(lun, 16, joined, size);
+        std::string hex;
+        for (std::uint8_t b : lun) {
+            char two[3];
+            std::snprintf(two, sizeof two, "%02X", b);
+            hex += two;
+        }
+        FormatFCText(printed, size, "%s", hex.c_str());
+        EXPECT_EQ(std::string(joined, sizeof joined), std::string(printed, sizeof printed)) << size;
+    }
+    for (std::uint32_t n : {0u, 7u, 10u, 65535u, 4294967295u}) {
+        char text[11];
+        EXPECT_EQ(std::string(DecimalText(n, text)), std::to_string(n));
+    }
+}

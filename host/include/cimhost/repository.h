@@ -5,6 +5,8 @@
 #pragma once
 
 #include <map>
+#include <memory>
+#include <mutex>
 #include <string>
 #include <vector>
 
@@ -73,12 +75,33 @@ public:
     std::vector<PropertyDecl> allProperties(const std::string& cls) const;
     const PropertyDecl* findProperty(const std::string& cls, const std::string& prop) const;
     std::vector<std::string> keyNames(const std::string& cls) const;
+    // The same names, computed once per class name (until a class is added)
+    // and shared: the host asks for them with every instance handed over.
+    std::shared_ptr<const std::vector<std::string>> sharedKeyNames(const std::string& cls) const;
     const MethodDecl* findMethod(const std::string& cls, const std::string& method) const;
 
 private:
     bool parse(const std::string& text, const std::string& fileName, std::string& error, int depth);
 
     std::map<std::string, ClassDecl> classes_;   // key: lower-case name
+
+    // Key names by class name as asked for; a copy of the repository starts
+    // with an empty cache of its own.
+    struct KeyNameCache {
+        KeyNameCache() = default;
+        KeyNameCache(const KeyNameCache&) {}
+        KeyNameCache& operator=(const KeyNameCache&) {
+            clear();
+            return *this;
+        }
+        void clear() {
+            std::lock_guard<std::mutex> g(m);
+            byClass.clear();
+        }
+        std::mutex m;
+        std::map<std::string, std::shared_ptr<const std::vector<std::string>>> byClass;
+    };
+    mutable KeyNameCache keyNameCache_;
 };
 
 }  // namespace cimhost

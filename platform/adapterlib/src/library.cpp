@@ -39,6 +39,7 @@
 #include <set>
 #include <sstream>
 #include <thread>
+#include <unordered_map>
 #include <unordered_set>
 
 #include "encode.h"
@@ -336,7 +337,55 @@ public:
         PhysPort* port = nullptr;
         NicFunction* nic = nullptr;
     };
+    // Handles are unique in a model, so the place of each is kept, per model
+    // generation: a build asks for every function by handle, one after the
+    // other, and a walk of the whole host for each would make it quadratic.
+    // A kept place is checked before it is used; a stale one gives the walk.
+    struct FcPlace {
+        size_t adapter, port, protocol;
+    };
+    std::unordered_map<uint32_t, FcPlace> fcPlaces;
+    uint64_t fcPlacesGeneration = 0;
+    bool fcPlacesValid = false;
+
+    void indexFcPlaces() {
+        fcPlaces.clear();
+        for (size_t ai = 0; ai < model.adapters.size(); ++ai)
+            for (size_t pi = 0; pi < model.adapters[ai].ports.size(); ++pi)
+                for (size_t qi = 0; qi < model.adapters[ai].ports[pi].protocols.size(); ++qi) {
+                    const auto& q = model.adapters[ai].ports[pi].protocols[qi];
+                    if (q.isFc()) fcPlaces.emplace(q.fc.handle, FcPlace{ai, pi, qi});
+                }
+    }
+
+    FcRef fcAt(uint32_t handle) {
+        try {
+            if (!fcPlacesValid || fcPlacesGeneration != generation) {
+                fcPlacesValid = false;
+                indexFcPlaces();
+                fcPlacesGeneration = generation;
+                fcPlacesValid = true;
+            }
+        } catch (...) {
+            fcPlaces.clear();
+            return {};
+        }
+        auto it = fcPlaces.find(handle);
+        if (it == fcPlaces.end()) return {};
+        const FcPlace& at = it->second;
+        if (at.adapter >= model.adapters.size()) return {};
+        Adapter& a = model.adapters[at.adapter];
+        if (at.port >= a.ports.size()) return {};
+        PhysPort& p = a.ports[at.port];
+        if (at.protocol >= p.protocols.size()) return {};
+        auto& q = p.protocols[at.protocol];
+        if (!q.isFc() || q.fc.handle != handle) return {};
+        return {&a, &p, &q.fc};
+    }
+
     FcRef findFc(uint32_t handle) {
+        FcRef kept = fcAt(handle);
+        if (kept.fc) return kept;
         for (auto& a : model.adapters)
             for (auto& p : a.ports)
                 for (auto& q : p.protocols)
@@ -1326,6 +1375,8 @@ __attribute__((destructor)) static void zorap_sim_unload() {
         zorap_sim::releaseAll(L.modelPath);
         zorap_sim::releaseAll(L.modelConfiguration);
         zorap_sim::releaseAll(L.handles);
+        zorap_sim::releaseAll(L.fcPlaces);
+        L.fcPlacesValid = false;
         // Blocks still handed out are the caller's leak; the set that knew
         // them goes, so that a leak checker sees them.
         zorap_sim::releaseAll(L.allocations);

@@ -62,6 +62,9 @@ public:
     // Element type, without the array flag.
     CMPIType getType() const;
     CmpiArrayIdx operator[](int idx) const;
+    // Sets elements 0..count-1 of a uint8 array from `bytes`, as element by
+    // element assignment would, with the element type checked once.
+    void setUint8Elements(const CMPIUint8* bytes, CMPICount count);
 };
 
 #endif

@@ -55,6 +55,10 @@ public:
     CmpiData(B b) { setBoolean(b); }
     // A null pointer gives a null CMPI_chars value.
     CmpiData(const char* d);
+    // A CMPI_chars value that points at `d` instead of holding a copy: for a
+    // text that outlives every use of the value (a constant, or a field of an
+    // entry that stays put while an instance is built from it).
+    static CmpiData borrowedChars(const char* d);
     CmpiData(const std::string& d);
     CmpiData(const CmpiString& d);
     CmpiData(const CmpiObjectPath& d);

@@ -80,6 +80,16 @@ CmpiData::CmpiData(const char* d)
     data_.value.chars = const_cast<char*>(chars_->c_str());
 }
 
+CmpiData CmpiData::borrowedChars(const char* d)
+{
+    CmpiData data(static_cast<const char*>(nullptr));
+    if (d != nullptr) {
+        data.data_.state = CMPI_goodValue;
+        data.data_.value.chars = const_cast<char*>(d);
+    }
+    return data;
+}
+
 CmpiData::CmpiData(const std::string& d) : CmpiData(d.c_str()) {}
 
 // Handle values: a null handle gives a null value of the same type.
@@ -227,6 +237,19 @@ CMPIType CmpiArray::getType() const
     CMPIType t = arr->ft->getSimpleType(arr, &rc);
     check(rc);
     return static_cast<CMPIType>(t & ~CMPI_ARRAY);
+}
+
+void CmpiArray::setUint8Elements(const CMPIUint8* bytes, CMPICount count)
+{
+    CMPIArray* arr = static_cast<CMPIArray*>(requireEnc());
+    if (count > 0 && getType() != CMPI_uint8)
+        throw CmpiStatus(CMPI_RC_ERR_TYPE_MISMATCH);
+    for (CMPICount i = 0; i < count; ++i) {
+        CMPIValue v;
+        v.uint64 = 0;
+        v.uint8 = bytes[i];
+        check(arr->ft->setElementAt(arr, i, &v, CMPI_uint8));
+    }
 }
 
 CmpiArrayIdx CmpiArray::operator[](int idx) const

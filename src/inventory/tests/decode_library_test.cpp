@@ -154,6 +154,47 @@ TEST_F(LibraryDecode, FailureForOneDeviceLeavesBuffersAndTheNextDeviceDecodes) {
     EXPECT_STREQ(g_serialNumber, "Serial Number:VXA1631K0042");
 }
 
+// The texts of every line buffer.
+std::vector<std::string> vpdLines() {
+    std::vector<std::string> lines;
+    for (char* buffer : decode_test::allVpdBuffers()) lines.emplace_back(buffer, strnlen(buffer, kVpdLineSize));
+    return lines;
+}
+
+void setVpdLines(std::vector<std::string> const& lines) {
+    std::vector<char*> buffers = decode_test::allVpdBuffers();
+    for (std::size_t i = 0; i < buffers.size(); ++i) std::snprintf(buffers[i], kVpdLineSize, "%s", lines[i].c_str());
+}
+
+// Each function of an adapter reads the adapter's VPD: a stream equal to the
+// one read before leaves every line as a fresh decode from the same state
+// would, whatever the caller cleared in between, and each read still asks
+// the library.
+TEST_F(LibraryDecode, TheSameStreamReadAgainGivesTheLinesOfAFreshDecode) {
+    const Device order[] = {kNewChip, kNewChip, kUnknownChip, kNewChip, kOverrun, kOverrun, kNewChip, kNewChip};
+    unsigned long reads = 0;
+    for (std::size_t step = 0; step < sizeof order / sizeof order[0]; ++step) {
+        if (step % 2 == 1) {
+            std::memset(g_serialNumber, 0, kVpdLineSize);
+            std::strcpy(g_fcCodeVersion, "FC Code:left by the caller");
+        }
+        const std::vector<std::string> before = vpdLines();
+        ASSERT_EQ(GetHBAVPDData(devices_[order[step]]), 0) << step;
+        EXPECT_EQ(calls(ZORAP_FN_GetVpd), ++reads);
+        const std::vector<std::string> read = vpdLines();
+
+        std::vector<unsigned char> stream(ZORAP_VPD_BUFFER_SIZE);
+        std::uint32_t length = ZORAP_VPD_BUFFER_SIZE;
+        ASSERT_EQ(ZORAP_GetVpd(devices_[order[step]]->deviceHandle, 0, stream.data(), &length), ZORAP_OK);
+        ++reads;
+        setVpdLines(before);
+        PrintVPD(stream.data(), stream.size());
+        std::vector<std::string> fresh = vpdLines();
+        fresh[15] = read[15];   // g_I2CUUID comes from its own call, not the stream
+        EXPECT_EQ(read, fresh) << "step " << step;
+    }
+}
+
 TEST_F(LibraryDecode, MalformedStreamsStayWithinTheBuffer) {
     EXPECT_EQ(GetHBAVPDData(devices_[kNoEndTag]), 0);
     EXPECT_STREQ(g_RTag, "VPD-R Tag:");

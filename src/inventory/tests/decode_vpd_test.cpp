@@ -239,3 +239,27 @@ TEST_F(OptionRom, NewerChipsShowTwoPartFCodeAndAbsentVersionsNA) {
 }
 
 }  // namespace
+
+// Every byte value prints as "%d" first and "%02d" after, in all three lines.
+TEST_F(OptionRom, VersionBytesPrintAsTheirDecimalFormsForEveryValue) {
+    for (unsigned v = 0; v < 256; ++v) {
+        _tagZORAPSDMDevice d = device("RSX-250", 7);
+        const std::uint8_t b = static_cast<std::uint8_t>(v);
+        d.firmwareVersion[0] = b;
+        d.firmwareVersion[1] = b;
+        d.firmwareVersion[2] = static_cast<std::uint8_t>(255 - v);
+        d.efiVersion[0] = static_cast<std::uint8_t>(255 - v);
+        d.efiVersion[1] = b;
+        d.fcodeVersion[0] = b;
+        d.fcodeVersion[1] = static_cast<std::uint8_t>(v / 3);
+        d.fcodeVersion[2] = b;
+        GetHBAOptionROMVersions(&d);
+        char expected[96];
+        std::snprintf(expected, sizeof expected, "OptionROM Firmware Version:%d.%02d.%02d", v, v, 255 - v);
+        EXPECT_STREQ(g_optionROMFirmware, expected);
+        std::snprintf(expected, sizeof expected, "OptionROM EFI Version:%d.%02d", 255 - v, v);
+        EXPECT_STREQ(g_optionROMEFI, expected);
+        std::snprintf(expected, sizeof expected, "OptionROM FCode Version:%d.%02d.%02d", v, v / 3, v);
+        EXPECT_STREQ(g_optionROMFCode, expected);
+    }
+}

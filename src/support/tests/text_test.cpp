@@ -155,6 +155,11 @@ TEST(TextAddress, IPv4) {
     char text[kIPv4TextSize];
     IPv4addToStr(address, text);
     EXPECT_STREQ(text, "192.168.0.255");
+    for (unsigned v = 0; v < 256; ++v) {
+        unsigned char const each[4] = {static_cast<unsigned char>(v), 0, static_cast<unsigned char>(255 - v), 7};
+        IPv4addToStr(each, text);
+        EXPECT_EQ(std::string(text), std::to_string(v) + ".0." + std::to_string(255 - v) + ".7");
+    }
 }
 
 struct Compact {
