@@ -59,11 +59,17 @@ namespace {
 
 const char kClassName[] = "Vexlan_FCHBA_StorageExtent";
 
-// A text field of the LUN record, read no further than its array.
+// A text field of the LUN record, read no further than its array. A field
+// that ends within its array is lent (the library's tree stays put while the
+// instance is built, as the entry's LUN pointer needs); one that fills it is
+// copied up to its end.
 template <std::size_t N>
 PropertyValue lunText(const char (&field)[N])
 {
-    return CmpiData(std::string(field, strnlen(field, N)));
+    const std::size_t length = strnlen(field, N);
+    if (length < N)
+        return entryText(field);
+    return CmpiData(std::string(field, length));
 }
 
 // The LUN's fields; a slot without a LUN (never filled) leaves them unset.
