@@ -140,8 +140,9 @@ CmpiData stringArray(std::initializer_list<const char*> values)
 {
     CmpiArray array(static_cast<CMPICount>(values.size()), CMPI_string);
     int i = 0;
+    // The broker copies each element as it is set, so the texts are lent.
     for (const char* v : values)
-        array[i++] = CmpiData(v);
+        array[i++] = CmpiData::borrowedChars(v);
     return CmpiData(array);
 }
 

@@ -99,6 +99,19 @@ inline CmpiData entryText(const char* text)
     return CmpiData::borrowedChars(text);
 }
 
+// A text field of a record that stays put while the instance is built (an
+// entry, or a record of the library's tree, which changes only under the same
+// lock as the requests) and may fill its array without a terminating zero:
+// lent when it ends within its array, else copied up to the array's end.
+template <std::size_t N>
+CmpiData fieldText(const char (&field)[N])
+{
+    const std::size_t length = strnlen(field, N);
+    if (length < N)
+        return CmpiData::borrowedChars(field);
+    return CmpiData(std::string(field, length));
+}
+
 // A row's value function written in place: CLASS_VALUE(FCPortEntry, CmpiData(e.DeviceID)).
 // The entry is `e`.
 #define CLASS_VALUE(Entry, expression) [](const Entry& e) -> PropertyValue { (void)e; return (expression); }

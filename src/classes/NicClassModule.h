@@ -228,9 +228,10 @@ struct NicLinkStatus {
 };
 NicLinkStatus nicLinkStatus(const _CNAPortStruc* port);
 
-// The same text for every record: CLASS_VALUE(NicRecord, CmpiData("..."))
-// reads better in the tables as NIC_TEXT("...").
-#define NIC_TEXT(text) CLASS_VALUE(NicRecord, CmpiData(text))
+// The same text for every record (a constant or the host name, lent):
+// CLASS_VALUE(NicRecord, entryText("...")) reads better in the tables as
+// NIC_TEXT("...").
+#define NIC_TEXT(text) CLASS_VALUE(NicRecord, entryText(text))
 #define NIC_UINT16(value) CLASS_VALUE(NicRecord, CmpiData(static_cast<CMPIUint16>(value)))
 
 // The operations of a NIC class module, declared and defined. PARAMS is the

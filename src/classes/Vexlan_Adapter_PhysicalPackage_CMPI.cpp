@@ -120,6 +120,24 @@ void vpdValueInto(const char* line, char (&target)[128], const VpdFieldTexts& te
     safeStrCpy(target, colon + 1, sizeof(target));
 }
 
+// The brand, the 11S form of the serial and the name depend on the entry's
+// own fields only, so the build settles them once per entry. The 11S test
+// trims the text it is given: it reads a copy here, and the instance trims
+// the stored serial as it always has.
+void settleNameAndBrand(PhysicalPackageEntry& e)
+{
+    char serial[sizeof(e.serialNumber)];
+    std::memcpy(serial, e.serialNumber, sizeof(serial));
+    serial[sizeof(serial) - 1] = '\0';
+    e.productId11S = IsIBM11SProductId(serial) != 0 ? 1 : 0;
+    e.partnerBrand = IsIBMBrandedAdapter(e.model) != 0 || e.productId11S ? 1 : 0;
+    // "IBM CNA Adapter <serial>", "Vexlan Fibre Channel Adapter <serial>", ...
+    const char* shown = GetSerialNumberFromIBM11SProductId(e.serialNumber);
+    JoinFCText(e.name, sizeof(e.name),
+               {e.partnerBrand ? "IBM" : "Vexlan", e.isCNA ? " CNA Adapter " : " Fibre Channel Adapter ",
+                shown != nullptr ? shown : ""});
+}
+
 // One FC protocol. Returns with `index` moved on.
 void createFCPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zorap_adapter_t* adapter,
                      _tagZORAPSDMDevice* device, Serial& serial, int& index)
@@ -176,6 +194,7 @@ void createFCPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zorap
     entry.isCNA = entry.adapterType == 3 ? 1 : 0;
     vpdValueInto(g_fruNumberVersion, entry.sku, kFruTexts);
     vpdValueInto(g_partNumber, entry.partNumber, kPartNumberTexts);
+    settleNameAndBrand(entry);
     entry.valid = 1;
     PHYSICAL_DEBUG("Exiting  createPhysicalPackage\n");
     PHYSICAL_DEBUG("Done calling createPhysicalPackage() for FC/FCoE device.");
@@ -207,6 +226,7 @@ void createNicPackage(ClassList<PhysicalPackageEntry>& list, int capacity, _zora
     calcPartNumber_PhysicalPackage(cna, entry.partNumber);
     entry.adapterType = AdapterTypeOfKind(adapter->adapterKind);
     entry.isCNA = entry.adapterType == 3 ? 1 : 0;
+    settleNameAndBrand(entry);
     entry.valid = 1;
     PHYSICAL_DEBUG("Done calling createPhysicalPackage() for NIC device.");
     ++index;
@@ -275,14 +295,11 @@ char* writable(const char* text)
     return const_cast<char*>(text);
 }
 
+// The stored serial trimmed in place, as the 11S test has always left it.
 bool is11S(const PhysicalPackageEntry& e)
 {
-    return IsIBM11SProductId(writable(e.serialNumber)) != 0;
-}
-
-bool isIBM(const PhysicalPackageEntry& e)
-{
-    return IsIBMBrandedAdapter(writable(e.model)) != 0 || is11S(e);
+    Trim(writable(e.serialNumber));
+    return e.productId11S != 0;
 }
 
 PropertyValue serialNumber(const PhysicalPackageEntry& e)
@@ -294,7 +311,7 @@ PropertyValue serialNumber(const PhysicalPackageEntry& e)
 
 PropertyValue partNumber(const PhysicalPackageEntry& e)
 {
-    if (is11S(e)) {
+    if (e.productId11S) {
         const char* part = GetPartNumberFromIBM11SProductId(writable(e.serialNumber));
         return part != nullptr ? PropertyValue(CmpiData(part)) : std::nullopt;
     }
@@ -303,22 +320,11 @@ PropertyValue partNumber(const PhysicalPackageEntry& e)
     return entryText(e.partNumber);
 }
 
-// "IBM CNA Adapter <serial>", "Vexlan Fibre Channel Adapter <serial>", ...
-PropertyValue packageName(const PhysicalPackageEntry& e)
-{
-    const char* vendor = isIBM(e) ? "IBM" : "Vexlan";
-    const char* serial = GetSerialNumberFromIBM11SProductId(e.serialNumber);
-    char text[512];
-    JoinFCText(text, sizeof(text),
-               {vendor, e.isCNA ? " CNA Adapter " : " Fibre Channel Adapter ", serial != nullptr ? serial : ""});
-    return CmpiData(text);
-}
-
 const PropertyRow<PhysicalPackageEntry> kProperties[] = {
     {"Tag", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(e.tag))},
     {"CreationClassName", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(kClassName))},
     {"Model", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(e.model))},
-    {"Manufacturer", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(isIBM(e) ? "IBM" : "Vexlan Corporation"))},
+    {"Manufacturer", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(e.partnerBrand ? "IBM" : "Vexlan Corporation"))},
     {"SerialNumber", CMPI_string, serialNumber},
     {"PartNumber", CMPI_string, partNumber},
     {"SKU", CMPI_string,
@@ -326,8 +332,8 @@ const PropertyRow<PhysicalPackageEntry> kProperties[] = {
          return e.sku[0] != '\0' ? PropertyValue(entryText(e.sku)) : std::nullopt;
      }},
     {"PackageType", CMPI_uint16, CLASS_VALUE(PhysicalPackageEntry, CmpiData(static_cast<CMPIUint16>(9)))},
-    {"Name", CMPI_string, packageName},
-    {"Description", CMPI_string, packageName},
+    {"Name", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(e.name))},
+    {"Description", CMPI_string, CLASS_VALUE(PhysicalPackageEntry, entryText(e.name))},
     {"AdapterType", CMPI_uint32, CLASS_VALUE(PhysicalPackageEntry, CmpiData(static_cast<CMPIUint32>(e.adapterType)))},
 };
 

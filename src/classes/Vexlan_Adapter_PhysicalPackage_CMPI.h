@@ -22,6 +22,9 @@ struct PhysicalPackageEntry {
     char sku[128];                // SKU, empty when unknown
     char partNumber[128];         // PartNumber, empty when unknown
     std::uint32_t adapterType;    // AdapterType
+    unsigned char partnerBrand;   // a branded model or an 11S serial: the partner's name and maker
+    unsigned char productId11S;   // the serial is an 11S product ID
+    char name[256];               // Name and Description, joined at the build
 };
 
 extern ClassList<PhysicalPackageEntry> g_PhysicalPackageList;

@@ -9,6 +9,18 @@
 
 ClassList<ProductEntry> g_ProductList = {0, nullptr};
 
+namespace {
+
+const char kVendor[] = "Vexlan Corporation";
+
+// The element name joins the entry's own fields, so the build joins it once.
+void joinElementName(ProductEntry& e)
+{
+    JoinFCText(e.elementName, sizeof(e.elementName), {kVendor, "_", e.version, "_", e.name});
+}
+
+}  // namespace
+
 void buildProductList()
 {
     ClassList<ProductEntry>& list = g_ProductList;
@@ -23,6 +35,7 @@ void buildProductList()
         copyFieldText(entry.name, a->productName);
         copyFieldText(entry.version, a->productVersion);
         entry.adapterType = AdapterTypeOfKind(a->adapterKind);
+        joinElementName(entry);
         entry.valid = 1;
         ++list.count;
         classmodule::buildLine(false, "Product", list.count - 1);
@@ -36,21 +49,12 @@ void removeProductList()
 
 namespace {
 
-const char kVendor[] = "Vexlan Corporation";
-
-PropertyValue elementName(const ProductEntry& e)
-{
-    char text[512];
-    JoinFCText(text, sizeof(text), {kVendor, "_", e.version, "_", e.name});
-    return CmpiData(text);
-}
-
 const PropertyRow<ProductEntry> kProperties[] = {
     {"Name", CMPI_string, CLASS_VALUE(ProductEntry, entryText(e.name))},
     {"IdentifyingNumber", CMPI_string, CLASS_VALUE(ProductEntry, entryText(e.identifyingNumber))},
     {"Vendor", CMPI_string, CLASS_VALUE(ProductEntry, entryText(kVendor))},
     {"Version", CMPI_string, CLASS_VALUE(ProductEntry, entryText(e.version))},
-    {"ElementName", CMPI_string, elementName},
+    {"ElementName", CMPI_string, CLASS_VALUE(ProductEntry, entryText(e.elementName))},
     {"AdapterType", CMPI_uint32, CLASS_VALUE(ProductEntry, CmpiData(static_cast<CMPIUint32>(e.adapterType)))},
 };
 

@@ -13,6 +13,7 @@ struct ProductEntry {
     char name[128];                // the adapter's product name
     char version[128];             // the adapter's product version
     std::uint32_t adapterType;
+    char elementName[512];         // ElementName, joined at the build
 };
 
 extern ClassList<ProductEntry> g_ProductList;

@@ -102,19 +102,31 @@ std::string fillName(const char* pattern, const char* vendor, const char* serial
     return out;
 }
 
+// The brand and the name depend on the entry's own fields only, so the build
+// settles them once per entry.
+void settleNameAndBrand(SoftwareIdentityEntry& e)
+{
+    const bool ibm = hasIBM11SSerial(e);
+    e.partnerBrand = ibm ? 1 : 0;
+    e.name[0] = '\0';
+    const ClassificationText* t = textsOf(e);
+    if (t == nullptr)
+        return;
+    const std::string text = fillName(e.isCNA == 1 ? t->cnaName : t->fcName, ibm ? "IBM" : "Vexlan",
+                                      GetSerialNumberFromIBM11SProductId(e.serialNumber));
+    safeStrCpy(e.name, text.c_str(), sizeof(e.name));
+}
+
 PropertyValue manufacturer(const SoftwareIdentityEntry& e)
 {
-    return entryText(hasIBM11SSerial(e) ? "IBM" : "Vexlan Corporation");
+    return entryText(e.partnerBrand ? "IBM" : "Vexlan Corporation");
 }
 
 PropertyValue name(const SoftwareIdentityEntry& e)
 {
-    const ClassificationText* t = textsOf(e);
-    if (t == nullptr)
+    if (textsOf(e) == nullptr)
         return std::nullopt;
-    const bool ibm = hasIBM11SSerial(e);
-    return CmpiData(fillName(e.isCNA == 1 ? t->cnaName : t->fcName, ibm ? "IBM" : "Vexlan",
-                             GetSerialNumberFromIBM11SProductId(e.serialNumber)));
+    return entryText(e.name);
 }
 
 PropertyValue description(const SoftwareIdentityEntry& e)
@@ -199,6 +211,7 @@ bool addEntry(int& next, const FunctionFacts& f, const char* suffix, std::uint16
     e.mbiDay = f.mbi[3];
     e.mbiMonth = f.mbi[4];
     e.mbiYear = f.mbi[5];
+    settleNameAndBrand(e);
     e.valid = 1;
     return true;
 }
@@ -307,9 +320,12 @@ void createSoftwareIdentity(_tagZORAPSDMDevice* device, int& next, char* serial,
 
 }  // namespace
 
-std::uint64_t dtGetBinaryFormat(int day, int month, int year)
+namespace {
+
+// Microseconds since the Epoch of the date's 0:00 local time, with the
+// daylight saving flag of `now`.
+std::uint64_t convertDate(time_t now, int day, int month, int year)
 {
-    time_t now = time(nullptr);
     struct tm present {};
     localtime_r(&now, &present);
     struct tm date {};
@@ -321,6 +337,29 @@ std::uint64_t dtGetBinaryFormat(int day, int month, int year)
     if (seconds == static_cast<time_t>(-1))
         return 0;
     return static_cast<std::uint64_t>(seconds) * 1000000ULL;
+}
+
+// The last date converted on this thread and the second it was converted in:
+// within that second the same date gives the same value, so an enumeration
+// converts each date once a second instead of once an instance.
+struct ConvertedDate {
+    bool known = false;
+    time_t second = 0;
+    int day = 0, month = 0, year = 0;
+    std::uint64_t value = 0;
+};
+thread_local ConvertedDate t_lastDate;
+
+}  // namespace
+
+std::uint64_t dtGetBinaryFormat(int day, int month, int year)
+{
+    const time_t now = time(nullptr);
+    ConvertedDate& last = t_lastDate;
+    if (last.known && last.second == now && last.day == day && last.month == month && last.year == year)
+        return last.value;
+    last = ConvertedDate{true, now, day, month, year, convertDate(now, day, month, year)};
+    return last.value;
 }
 
 void removeSoftwareIdentityList()

@@ -18,6 +18,8 @@ struct SoftwareIdentityEntry {
     std::uint16_t classification;   // the one element of Classifications
     unsigned char mbiValid;         // the flash image's MBI string was read
     std::int32_t mbiMajor, mbiMinor, mbiBuild, mbiDay, mbiMonth, mbiYear;
+    unsigned char partnerBrand;     // the serial is an 11S product ID: the partner's name and maker
+    char name[256];                 // Name, joined at the build; empty for a classification without texts
 };
 
 // Capacity 8 slots per FC function; the enumerations skip the unfilled ones.

@@ -59,13 +59,6 @@ namespace {
 
 const char kClassName[] = "Vexlan_FCHBA_StorageExtent";
 
-// A text field of the LUN record, read no further than its array.
-template <std::size_t N>
-PropertyValue lunText(const char (&field)[N])
-{
-    return CmpiData(std::string(field, strnlen(field, N)));
-}
-
 // The LUN's fields; a slot without a LUN (never filled) leaves them unset.
 #define LUN_VALUE(expression) \
     [](const StorageExtentEntry& e) -> PropertyValue { return e.lun != nullptr ? PropertyValue(expression) : std::nullopt; }
@@ -85,13 +78,13 @@ const PropertyRow<StorageExtentEntry> kProperties[] = {
     {"CreationClassName", CMPI_string, CLASS_VALUE(StorageExtentEntry, entryText(kClassName))},
     {"DeviceID", CMPI_string, CLASS_VALUE(StorageExtentEntry, entryText(e.deviceId))},
     {"ElementName", CMPI_string, CLASS_VALUE(StorageExtentEntry, entryText(" "))},
-    {"Name", CMPI_string, LUN_VALUE(*lunText(e.lun->osDeviceName))},
+    {"Name", CMPI_string, LUN_VALUE(fieldText(e.lun->osDeviceName))},
     {"Access", CMPI_uint16, CLASS_VALUE(StorageExtentEntry, CmpiData(static_cast<CMPIUint16>(3)))},
     {"BlockSize", CMPI_uint64, LUN_VALUE(CmpiData(static_cast<CMPIUint64>(e.lun->blockSize)))},
     {"LunID", CMPI_uint16, LUN_VALUE(CmpiData(static_cast<CMPIUint16>(e.lun->lunNumber)))},
-    {"VendorID", CMPI_string, LUN_VALUE(*lunText(e.lun->vendorId))},
-    {"ProductID", CMPI_string, LUN_VALUE(*lunText(e.lun->productId))},
-    {"Revision", CMPI_string, LUN_VALUE(*lunText(e.lun->revision))},
+    {"VendorID", CMPI_string, LUN_VALUE(fieldText(e.lun->vendorId))},
+    {"ProductID", CMPI_string, LUN_VALUE(fieldText(e.lun->productId))},
+    {"Revision", CMPI_string, LUN_VALUE(fieldText(e.lun->revision))},
     {"RaidType", CMPI_string, CLASS_VALUE(StorageExtentEntry, entryText("N/A"))},
     {"NumberOfPartitions", CMPI_string, CLASS_VALUE(StorageExtentEntry, entryText("N/A"))},
     {"OperationalStatus", CMPI_uint16A, CLASS_VALUE(StorageExtentEntry, uint16Array({2}))},

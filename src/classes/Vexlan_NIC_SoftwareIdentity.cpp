@@ -12,21 +12,24 @@
 #include <cstring>
 #include <string>
 
+#include "classes/Vexlan_Adapter_PhysicalPackage_CMPI.h"
+#include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "inventory/AdapterFunc_Identity.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 namespace {
 
-// The texts of the two software types.
+// The texts of the two software types. The name is "<vendor word> CNA
+// Adapter <serial>" and the type's tail.
 struct SoftwareType {
     int type;
     CMPIUint16 classification;
-    const char* name;  // with the vendor word and the serial
+    const char* nameTail;
     const char* description;
 };
 const SoftwareType kTypes[] = {
-    {2, 2, "%s CNA Adapter %s Driver", "The CNA Networking Driver"},
-    {3, 10, "%s CNA Adapter %s Flash Firmware", "CNA Flash includes boot code, ASIC and MPI Firmware"},
+    {2, 2, " Driver", "The CNA Networking Driver"},
+    {3, 10, " Flash Firmware", "CNA Flash includes boot code, ASIC and MPI Firmware"},
 };
 
 const SoftwareType* typeOf(const NicRecord& r)
@@ -37,15 +40,27 @@ const SoftwareType* typeOf(const NicRecord& r)
     return nullptr;
 }
 
+// The 11S test trims the text it is given: it reads a copy of the serial.
 bool ibmSerial(const NicRecord& r)
 {
-    std::string serial = nicFieldText(r.adapter->serialNumber);
-    return IsIBM11SProductId(&serial[0]) != 0;
+    char serial[sizeof(r.adapter->serialNumber) + 1];
+    copyFieldText(serial, r.adapter->serialNumber);
+    return IsIBM11SProductId(serial) != 0;
 }
 
+FCTextPart serialPart(const NicRecord& r)
+{
+    return FCTextPart(r.adapter->serialNumber, sizeof(r.adapter->serialNumber));
+}
+
+// "<type>_<serial>", the type as printf's "%d" writes it.
 void instanceIdText(const NicRecord& r, char* out)
 {
-    std::snprintf(out, kNicKeyTextSize, "%d_%s", r.softwareType, nicFieldText(r.adapter->serialNumber).c_str());
+    const bool negative = r.softwareType < 0;
+    const std::uint32_t magnitude = negative ? 0u - static_cast<std::uint32_t>(r.softwareType)
+                                             : static_cast<std::uint32_t>(r.softwareType);
+    char digits[11];
+    JoinFCText(out, kNicKeyTextSize, {negative ? "-" : "", DecimalText(magnitude, digits), "_", serialPart(r)});
 }
 
 PropertyValue instanceId(const NicRecord& r)
@@ -60,19 +75,16 @@ PropertyValue name(const NicRecord& r)
     const SoftwareType* t = typeOf(r);
     if (t == nullptr)
         return std::nullopt;
-    const std::string pattern = t->name;
-    const std::size_t first = pattern.find("%s");
-    const std::size_t second = pattern.find("%s", first + 2);
-    return CmpiData(pattern.substr(0, first) + (ibmSerial(r) ? "IBM" : "Vexlan") +
-                    pattern.substr(first + 2, second - first - 2) + nicFieldText(r.adapter->serialNumber) +
-                    pattern.substr(second + 2));
+    char text[sizeof(r.adapter->serialNumber) + 64];
+    JoinFCText(text, sizeof(text), {ibmSerial(r) ? "IBM" : "Vexlan", " CNA Adapter ", serialPart(r), t->nameTail});
+    return CmpiData(text);
 }
 
 const PropertyRow<NicRecord> kProperties[] = {
     {"InstanceID", CMPI_string, instanceId},
     {"Manufacturer", CMPI_string,
-     CLASS_VALUE(NicRecord, CmpiData(ibmSerial(e) ? "IBM" : "Vexlan Corporation"))},
-    {"VersionString", CMPI_string, CLASS_VALUE(NicRecord, CmpiData(nicFieldText(e.adapter->versionString)))},
+     CLASS_VALUE(NicRecord, entryText(ibmSerial(e) ? "IBM" : "Vexlan Corporation"))},
+    {"VersionString", CMPI_string, CLASS_VALUE(NicRecord, fieldText(e.adapter->versionString))},
     {"Classifications", CMPI_uint16A,
      [](const NicRecord& r) -> PropertyValue {
          const SoftwareType* t = typeOf(r);
@@ -86,7 +98,7 @@ const PropertyRow<NicRecord> kProperties[] = {
          const SoftwareType* t = typeOf(r);
          if (t == nullptr)
              return std::nullopt;
-         return CmpiData(t->description);
+         return entryText(t->description);
      }},
     {"IdentityInfoType", CMPI_stringA, CLASS_VALUE(NicRecord, stringArray({"SoftwareID", "SoftwareStatus"}))},
     {"IdentityInfoValue", CMPI_stringA,

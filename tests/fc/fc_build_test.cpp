@@ -12,6 +12,7 @@
 #include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "classes/Vexlan_FC_LogicalPortGroup_CMPI.h"
 #include "classes/Vexlan_FC_PortController_CMPI.h"
+#include "classes/Vexlan_FCHBA_SoftwareIdentity_CMPI.h"
 #include "fc_test_support.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "support/ossimpl-CIM.h"
@@ -391,4 +392,18 @@ TEST(FCText, JoinsAndWwnsMatchTheirPrintfFormsAtEveryRoom)
         char text[11];
         EXPECT_EQ(std::string(DecimalText(n, text)), std::to_string(n));
     }
+}
+
+// Release dates asked in turn, as an enumeration of several adapters asks
+// them: each date keeps its own value however the dates alternate.
+TEST(FCText, ReleaseDatesInTurnKeepTheirOwnValues)
+{
+    const std::uint64_t first = dtGetBinaryFormat(14, 6, 2025);
+    const std::uint64_t second = dtGetBinaryFormat(20, 0, 2025);
+    const std::uint64_t third = dtGetBinaryFormat(15, 6, 2025);
+    ASSERT_NE(0u, first);
+    EXPECT_LT(second, first);
+    EXPECT_EQ(86400000000ULL, third - first);
+    EXPECT_EQ(first, dtGetBinaryFormat(14, 6, 2025));
+    EXPECT_EQ(second, dtGetBinaryFormat(20, 0, 2025));
 }

@@ -250,6 +250,11 @@ TEST_F(SoftwareInventory, EachNICAdapterHasItsDriverAndFlashFirmware)
     ASSERT_EQ(got.instances.size(), 1u) << statusLine(got);
     EXPECT_EQ(got.instances[0].property("Name"), nullptr);
     EXPECT_EQ(text(got.instances[0], "Manufacturer"), "Vexlan Corporation");
+    // A negative type keeps its sign in the instance's key.
+    p.setKey("InstanceID", Value::fromString(std::string("-2147483648_") + kNicSerial));
+    got = host().getInstance(p);
+    ASSERT_EQ(got.instances.size(), 1u) << statusLine(got);
+    EXPECT_EQ(text(got.instances[0], "InstanceID"), std::string("-2147483648_") + kNicSerial);
     for (const std::string& key : {std::string("2_NOSUCH"), std::string(kNicSerial)}) {
         p.setKey("InstanceID", Value::fromString(key));
         EXPECT_EQ(host().getInstance(p).rc, CMPI_RC_ERR_NOT_FOUND) << key;
