@@ -446,7 +446,9 @@ def commit(given=None):
     try:
         rev = subprocess.run(["git", "-C", ROOT, "rev-parse", "--short", "HEAD"], stdout=subprocess.PIPE,
                              universal_newlines=True).stdout.strip()
-        dirty = subprocess.run(["git", "-C", ROOT, "status", "--porcelain", "--untracked-files=no"],
+        # The page and plot this run writes are not changes to what it measures.
+        dirty = subprocess.run(["git", "-C", ROOT, "status", "--porcelain", "--untracked-files=no", "--", ".",
+                                ":!docs/performance.md", ":!docs/performance.png"],
                                stdout=subprocess.PIPE, universal_newlines=True).stdout.strip()
         return rev + (" (with uncommitted changes)" if dirty else "")
     except OSError:
@@ -529,8 +531,8 @@ def main():
               "during one request: *broker build* is what its calls into the host cost other than handing "
               "results over, *host delivery* the host's returnData, returnInstance, returnObjectPath and "
               "returnDone, *adapter library* its calls into libzorap_cna_provider, and *provider own* the rest "
-              "(its code and the C and C++ library calls it makes itself). FCPort and FCPortStatistics requests "
-              "include the rebuild of their list.\n\n"
+              "(its code and the C and C++ library calls it makes itself). FCPort, FCPortStatistics, StorageExtent "
+              "and SCSIProtocolEndpointTarget requests include the rebuild of their list.\n\n"
               % (machine(), commit(args.commit), datetime.datetime.utcnow().strftime("%Y-%m-%d %H:%M UTC"),
                  ", ".join(map(str, sizes)), ", ".join(map(str, mixed))))
     if plotted:
