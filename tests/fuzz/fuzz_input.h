@@ -3,6 +3,7 @@
 // paths runs with private /opt and /var/tmp.
 #pragma once
 
+#include <sys/stat.h>
 #include <sys/vfs.h>
 
 #include <cstdint>
@@ -71,6 +72,14 @@ inline void requireIsolation(const char* target) {
             std::exit(77);
         }
     }
+}
+
+// The provider's directories under the private /opt: the settings file's
+// and the log's.
+inline void makeProviderDirectories() {
+    mkdir("/opt/Vexlan_Corporation", 0755);
+    mkdir("/opt/Vexlan_Corporation/CNAProviders", 0755);
+    mkdir("/opt/Vexlan_Corporation/CNAProviders/log", 0755);
 }
 
 // Writes `bytes` to `path` whole (mode 0600); false when it can't.

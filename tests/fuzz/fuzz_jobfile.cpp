@@ -3,8 +3,6 @@
 // file store (by name and through an open file), and the jobs read are saved
 // again. The input's head chooses the log switches, the present time, the
 // key and the value; the rest is the file. Runs only under tests/isolate.sh.
-#include <sys/stat.h>
-
 #include <cstdint>
 #include <cstring>
 #include <string>
@@ -27,9 +25,7 @@ void checkFound(const char* value) {
 
 extern "C" int LLVMFuzzerInitialize(int*, char***) {
     fuzzin::requireIsolation("fuzz_jobfile");
-    mkdir("/opt/Vexlan_Corporation", 0755);
-    mkdir("/opt/Vexlan_Corporation/CNAProviders", 0755);
-    mkdir("/opt/Vexlan_Corporation/CNAProviders/log", 0755);
+    fuzzin::makeProviderDirectories();
     return 0;
 }
 

@@ -7,8 +7,6 @@
 // names with values of any type and length), the property list, the
 // association parameters and the method with its arguments. Runs only under
 // tests/isolate.sh.
-#include <sys/stat.h>
-
 #include <algorithm>
 #include <cstdint>
 #include <cstdio>
@@ -50,9 +48,7 @@ std::string fileText(const char* path) {
 }
 
 void start() {
-    mkdir("/opt/Vexlan_Corporation", 0755);
-    mkdir("/opt/Vexlan_Corporation/CNAProviders", 0755);
-    mkdir("/opt/Vexlan_Corporation/CNAProviders/log", 0755);
+    fuzzin::makeProviderDirectories();
     // The error log on: the texts of refused keys reach its lines.
     if (!fuzzin::writeWhole("/opt/Vexlan_Corporation/CNAProviders/vexlancna.properties", "ErrorLog=1\n"))
         fail("cannot write the settings");
@@ -286,7 +282,8 @@ private:
 
 void runOne(Builder& b, fuzzin::Reader& in) {
     cimhost::Host& host = g_state->host;
-    switch (in.pick(11)) {
+    const std::size_t op = in.pick(11);
+    switch (op) {
         case 0: {
             cimhost::ObjectPath p;
             p.className = b.className();
@@ -318,26 +315,22 @@ void runOne(Builder& b, fuzzin::Reader& in) {
             break;
         }
         case 5: host.deleteInstance(b.path()); break;
-        case 6: {
-            cimhost::ObjectPath p = b.path();
-            cimhost::AssocParams a = b.assocParams();
-            host.associators(p, a, b.properties(a.resultClass));
-            break;
-        }
-        case 7: {
-            cimhost::ObjectPath p = b.path();
-            host.associatorNames(p, b.assocParams());
-            break;
-        }
+        case 6:
         case 8: {
+            // Associators or references: the properties of the result class
+            // or of the association class.
             cimhost::ObjectPath p = b.path();
             cimhost::AssocParams a = b.assocParams();
-            host.references(p, a, b.properties(a.assocClass));
+            if (op == 6) host.associators(p, a, b.properties(a.resultClass));
+            else host.references(p, a, b.properties(a.assocClass));
             break;
         }
+        case 7:
         case 9: {
             cimhost::ObjectPath p = b.path();
-            host.referenceNames(p, b.assocParams());
+            cimhost::AssocParams a = b.assocParams();
+            if (op == 7) host.associatorNames(p, a);
+            else host.referenceNames(p, a);
             break;
         }
         default: {

@@ -2,8 +2,6 @@
 // takes them from /opt/Vexlan_Corporation/CNAProviders, the NIC settings
 // object from the working directory. With the debug log switched on the
 // configuration lines go to the log. Runs only under tests/isolate.sh.
-#include <sys/stat.h>
-
 #include <cstdint>
 #include <cstring>
 #include <string>
@@ -25,9 +23,7 @@ void terminated(const char (&text)[N]) {
 
 extern "C" int LLVMFuzzerInitialize(int*, char***) {
     fuzzin::requireIsolation("fuzz_settings");
-    mkdir("/opt/Vexlan_Corporation", 0755);
-    mkdir("/opt/Vexlan_Corporation/CNAProviders", 0755);
-    mkdir("/opt/Vexlan_Corporation/CNAProviders/log", 0755);
+    fuzzin::makeProviderDirectories();
     return 0;
 }
 
