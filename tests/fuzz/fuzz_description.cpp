@@ -9,26 +9,22 @@
 
 #include <nlohmann/json.hpp>
 
+#include "fuzz_input.h"
 #include "zorap_cna.h"
 #include "zorap_sim_control.h"
 
 namespace {
 
-// Every fixed text field of a record ends within the record's array.
-template <std::size_t N>
-void terminated(const char (&field)[N]) {
-    if (std::memchr(field, 0, N) == nullptr) __builtin_trap();
-}
 
 // The per-function blocks the library hands out go back to it.
 void answersOfFc(_tagZORAPSDMDevice* d) {
-    terminated(d->modelName);
-    terminated(d->deviceSerial);
-    terminated(d->biosVersionText);
-    terminated(d->driverVersionText);
-    terminated(d->firmwareVersionText);
-    terminated(d->fcodeVersionText);
-    terminated(d->efiVersionText);
+    fuzzin::requireTerminated(d->modelName);
+    fuzzin::requireTerminated(d->deviceSerial);
+    fuzzin::requireTerminated(d->biosVersionText);
+    fuzzin::requireTerminated(d->driverVersionText);
+    fuzzin::requireTerminated(d->firmwareVersionText);
+    fuzzin::requireTerminated(d->fcodeVersionText);
+    fuzzin::requireTerminated(d->efiVersionText);
     _zorap_port_property_t prop{};
     ZORAP_GetHbaDevicePortProperty(d->deviceHandle, 0, &prop);
     ZORAP_RefreshDeviceStats(d);
@@ -49,43 +45,43 @@ void answersOfFc(_tagZORAPSDMDevice* d) {
     ZORAP_GetVpd(d->deviceHandle, 0, vpd, &size);
     for (_zorap_target_t* t = d->targetList; t; t = t->next)
         for (_zorap_lun_t* l = t->lunList; l; l = l->next) {
-            terminated(l->vendorId);
-            terminated(l->productId);
-            terminated(l->revision);
-            terminated(l->osDeviceName);
+            fuzzin::requireTerminated(l->vendorId);
+            fuzzin::requireTerminated(l->productId);
+            fuzzin::requireTerminated(l->revision);
+            fuzzin::requireTerminated(l->osDeviceName);
         }
 }
 
 void answersOfNic(_zorap_protocol_t* q) {
     const _zorap_nic_adapter_info_t& ai = q->nicAdapterInfo;
-    terminated(ai.modelName);
-    terminated(ai.serialNumber);
-    terminated(ai.versionString);
-    terminated(ai.partNumber);
-    terminated(ai.productName);
-    terminated(ai.driverVersion);
-    terminated(ai.firmwareVersion);
+    fuzzin::requireTerminated(ai.modelName);
+    fuzzin::requireTerminated(ai.serialNumber);
+    fuzzin::requireTerminated(ai.versionString);
+    fuzzin::requireTerminated(ai.partNumber);
+    fuzzin::requireTerminated(ai.productName);
+    fuzzin::requireTerminated(ai.driverVersion);
+    fuzzin::requireTerminated(ai.firmwareVersion);
     for (const _zorap_vpd_entry_t& e : q->nicPortExtra.vpd) {
-        terminated(e.keyword);
-        terminated(e.value);
+        fuzzin::requireTerminated(e.keyword);
+        fuzzin::requireTerminated(e.value);
     }
     const _zorap_nic_port_info_t& pi = q->nicPortInfo;
-    terminated(pi.interfaceName);
-    terminated(pi.driverName);
-    terminated(pi.driverVersion);
-    terminated(pi.firmwareVersion);
+    fuzzin::requireTerminated(pi.interfaceName);
+    fuzzin::requireTerminated(pi.driverName);
+    fuzzin::requireTerminated(pi.driverVersion);
+    fuzzin::requireTerminated(pi.firmwareVersion);
     _zorap_link_properties_t link{};
     ZORAP_GetLinkProperties(pi.interfaceName, &link);
     void* record = nullptr;
     if (ZORAP_GetIPProperties(pi.interfaceName, &record) == ZORAP_OK && record != nullptr) {
         auto* r = static_cast<_zorap_ip_properties_t*>(record);
-        terminated(r->domainName);
+        fuzzin::requireTerminated(r->domainName);
         ZORAP_FreeMem(record);
     }
     void* links = nullptr;
     uint32_t count = 0;
     if (ZORAP_GetFCoELinkage(pi.interfaceName, &links, &count) == ZORAP_OK && links != nullptr) {
-        for (uint32_t i = 0; i < count; ++i) terminated(static_cast<_zorap_fcoe_linkage_t*>(links)[i].fcHostName);
+        for (uint32_t i = 0; i < count; ++i) fuzzin::requireTerminated(static_cast<_zorap_fcoe_linkage_t*>(links)[i].fcHostName);
         ZORAP_FreeMem(links);
     }
     uint8_t dmi[ZORAP_DMI_BUFFER_SIZE];
@@ -95,10 +91,10 @@ void answersOfNic(_zorap_protocol_t* q) {
 
 void walk(_zorap_adapter_list_t* list) {
     for (_zorap_adapter_t* a = list ? list->firstAdapter : nullptr; a; a = a->next) {
-        terminated(a->serialNumber);
-        terminated(a->modelName);
-        terminated(a->productName);
-        terminated(a->productVersion);
+        fuzzin::requireTerminated(a->serialNumber);
+        fuzzin::requireTerminated(a->modelName);
+        fuzzin::requireTerminated(a->productName);
+        fuzzin::requireTerminated(a->productVersion);
         for (_zorap_phy_port_t* p = a->phyPortList ? a->phyPortList->firstPhyPort : nullptr; p; p = p->next)
             for (_zorap_protocol_t* q = p->protocolList ? p->protocolList->firstProtocol : nullptr; q; q = q->next) {
                 if (q->protocolType < ZORAP_PROTOCOL_NIC) answersOfFc(&q->fcDevice);
@@ -119,7 +115,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     if (ZORAP_Initialize(0, 0) != ZORAP_OK) return 0;
     char os[ZORAP_OS_NAME_BUFFER_SIZE];
     uint32_t osSize = sizeof os;
-    if (ZORAP_GetOSName(os, &osSize) == ZORAP_OK && std::memchr(os, 0, sizeof os) == nullptr) __builtin_trap();
+    if (ZORAP_GetOSName(os, &osSize) == ZORAP_OK) fuzzin::requireTerminated(os);
     walk(ZORAP_GetAdapterList());
     // The backup build reads the description again and takes the main place.
     if (ZORAP_UpdateBackupAdapterList() == ZORAP_OK && ZORAP_SwapBackupToMainAdapterList() == ZORAP_OK)

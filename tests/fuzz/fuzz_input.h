@@ -62,8 +62,9 @@ private:
 
 // The targets that write /opt/Vexlan_Corporation/... or /var/tmp/... run
 // only where both are private tmpfs mounts (tests/isolate.sh), never over a
-// machine's real files.
-inline void requireIsolation(const char* target) {
+// machine's real files. There they make the provider's directories under
+// /opt: the settings file's and the log's.
+inline void startIsolated(const char* target) {
     constexpr long kTmpfsMagic = 0x01021994;
     for (const char* dir : {"/opt", "/var/tmp"}) {
         struct statfs fs {};
@@ -72,14 +73,15 @@ inline void requireIsolation(const char* target) {
             std::exit(77);
         }
     }
-}
-
-// The provider's directories under the private /opt: the settings file's
-// and the log's.
-inline void makeProviderDirectories() {
     mkdir("/opt/Vexlan_Corporation", 0755);
     mkdir("/opt/Vexlan_Corporation/CNAProviders", 0755);
     mkdir("/opt/Vexlan_Corporation/CNAProviders/log", 0755);
+}
+
+// A text field filled by the code under test ends within its array.
+template <std::size_t N>
+void requireTerminated(const char (&field)[N]) {
+    if (std::memchr(field, 0, N) == nullptr) __builtin_trap();
 }
 
 // Writes `bytes` to `path` whole (mode 0600); false when it can't.

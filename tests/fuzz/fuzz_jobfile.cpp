@@ -24,8 +24,7 @@ void checkFound(const char* value) {
 }  // namespace
 
 extern "C" int LLVMFuzzerInitialize(int*, char***) {
-    fuzzin::requireIsolation("fuzz_jobfile");
-    fuzzin::makeProviderDirectories();
+    fuzzin::startIsolated("fuzz_jobfile");
     return 0;
 }
 

@@ -48,7 +48,6 @@ std::string fileText(const char* path) {
 }
 
 void start() {
-    fuzzin::makeProviderDirectories();
     // The error log on: the texts of refused keys reach its lines.
     if (!fuzzin::writeWhole("/opt/Vexlan_Corporation/CNAProviders/vexlancna.properties", "ErrorLog=1\n"))
         fail("cannot write the settings");
@@ -347,7 +346,7 @@ void runOne(Builder& b, fuzzin::Reader& in) {
 }  // namespace
 
 extern "C" int LLVMFuzzerInitialize(int*, char***) {
-    fuzzin::requireIsolation("fuzz_requests");
+    fuzzin::startIsolated("fuzz_requests");
     start();
     return 0;
 }

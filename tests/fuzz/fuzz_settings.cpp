@@ -14,16 +14,11 @@ namespace {
 
 const char kOptSettings[] = "/opt/Vexlan_Corporation/CNAProviders/" VEXLAN_PROPERTIES_FILE_NAME;
 
-template <std::size_t N>
-void terminated(const char (&text)[N]) {
-    if (std::memchr(text, 0, N) == nullptr) __builtin_trap();
-}
 
 }  // namespace
 
 extern "C" int LLVMFuzzerInitialize(int*, char***) {
-    fuzzin::requireIsolation("fuzz_settings");
-    fuzzin::makeProviderDirectories();
+    fuzzin::startIsolated("fuzz_settings");
     return 0;
 }
 
@@ -32,12 +27,12 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     if (!fuzzin::writeWhole(kOptSettings, bytes) || !fuzzin::writeWhole(VEXLAN_PROPERTIES_FILE_NAME, bytes))
         return 0;
     LoadProviderProperties();
-    terminated(g_InteropNamespace);
-    terminated(g_CIMOMNameVersion);
-    terminated(g_CIMSchemaVersion);
+    fuzzin::requireTerminated(g_InteropNamespace);
+    fuzzin::requireTerminated(g_CIMOMNameVersion);
+    fuzzin::requireTerminated(g_CIMSchemaVersion);
     Vexlan_NIC_Properties settings;
-    terminated(settings.interopNamespace);
-    terminated(settings.implementationNamespace);
+    fuzzin::requireTerminated(settings.interopNamespace);
+    fuzzin::requireTerminated(settings.implementationNamespace);
     // The log stays off between inputs, as the next reading starts.
     g_EnableDebugPrint = false;
     g_EnableLogError = false;

@@ -7,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "fuzz_input.h"
 #include "inventory/AdapterFunc_Identity.h"
 #include "inventory/AdapterFunc_Transceiver.h"
 #include "inventory/AdapterFunc_VPD.h"
@@ -40,9 +41,12 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     parseSFPFields(&device, stream.data(), static_cast<unsigned int>(stream.size()), &fields);
     _Nic_SFPFields nicFields{};
     parseSFPFields(stream.data(), static_cast<unsigned int>(stream.size()), &nicFields);
-    for (const char* field : {fields.Manufacturer, fields.PartNumber, fields.SerialNumber, nicFields.Manufacturer,
-                              nicFields.PartNumber, nicFields.SerialNumber})
-        if (std::memchr(field, 0, sizeof fields.Manufacturer) == nullptr) __builtin_trap();
+    fuzzin::requireTerminated(fields.Manufacturer);
+    fuzzin::requireTerminated(fields.PartNumber);
+    fuzzin::requireTerminated(fields.SerialNumber);
+    fuzzin::requireTerminated(nicFields.Manufacturer);
+    fuzzin::requireTerminated(nicFields.PartNumber);
+    fuzzin::requireTerminated(nicFields.SerialNumber);
 
     // The identity helpers trim their argument in place: each gets its own
     // terminated copy of the input.
