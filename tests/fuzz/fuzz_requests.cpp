@@ -282,54 +282,55 @@ private:
 void runOne(Builder& b, fuzzin::Reader& in) {
     cimhost::Host& host = g_state->host;
     const std::size_t op = in.pick(11);
+    cimhost::OpResult r;
     switch (op) {
         case 0: {
             cimhost::ObjectPath p;
             p.className = b.className();
             p.nameSpace = b.nameSpace();
-            host.enumerateInstanceNames(p);
+            r = host.enumerateInstanceNames(p);
             break;
         }
         case 1: {
             cimhost::ObjectPath p;
             p.className = b.className();
             p.nameSpace = b.nameSpace();
-            host.enumerateInstances(p, b.properties(p.className));
+            r = host.enumerateInstances(p, b.properties(p.className));
             break;
         }
         case 2: {
             cimhost::ObjectPath p = b.path();
-            host.getInstance(p, b.properties(p.className));
+            r = host.getInstance(p, b.properties(p.className));
             break;
         }
         case 3: {
             cimhost::ObjectPath p = b.path();
             cimhost::Instance inst = b.instance(0);
-            host.modifyInstance(p, inst, b.properties(p.className));
+            r = host.modifyInstance(p, inst, b.properties(p.className));
             break;
         }
         case 4: {
             cimhost::ObjectPath p = b.path();
-            host.createInstance(p, b.instance(0));
+            r = host.createInstance(p, b.instance(0));
             break;
         }
-        case 5: host.deleteInstance(b.path()); break;
+        case 5: r = host.deleteInstance(b.path()); break;
         case 6:
         case 8: {
             // Associators or references: the properties of the result class
             // or of the association class.
             cimhost::ObjectPath p = b.path();
             cimhost::AssocParams a = b.assocParams();
-            if (op == 6) host.associators(p, a, b.properties(a.resultClass));
-            else host.references(p, a, b.properties(a.assocClass));
+            if (op == 6) r = host.associators(p, a, b.properties(a.resultClass));
+            else r = host.references(p, a, b.properties(a.assocClass));
             break;
         }
         case 7:
         case 9: {
             cimhost::ObjectPath p = b.path();
             cimhost::AssocParams a = b.assocParams();
-            if (op == 7) host.associatorNames(p, a);
-            else host.referenceNames(p, a);
+            if (op == 7) r = host.associatorNames(p, a);
+            else r = host.referenceNames(p, a);
             break;
         }
         default: {
@@ -337,10 +338,15 @@ void runOne(Builder& b, fuzzin::Reader& in) {
             std::string name;
             std::vector<cimhost::NamedValue> args;
             b.method(p.className, name, args);
-            host.invokeMethod(p, name, args);
+            r = host.invokeMethod(p, name, args);
             break;
         }
     }
+    // FUZZ_REQUESTS_STRICT=1: what the host's strict checks object to in
+    // an answer (a type or property the class definitions don't have).
+    static const bool showStrict = std::getenv("FUZZ_REQUESTS_STRICT") != nullptr;
+    if (showStrict)
+        for (const std::string& e : r.strictErrors) std::fprintf(stderr, "strict (operation %zu): %s\n", op, e.c_str());
 }
 
 }  // namespace
