@@ -384,7 +384,7 @@ CmpiStatus getInstance(const AssocRow&, const CmpiContext& ctx, CmpiResult& rslt
                           static_cast<int>(data.type));
             return CmpiStatus(rc);
         }
-        refs[k] = data.value.ref;
+        refs[k] = referenceKeyPath(data);
     }
     const CmpiObjectPath standard(refs[0]);
     const CmpiObjectPath element(refs[1]);

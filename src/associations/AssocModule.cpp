@@ -228,6 +228,13 @@ bool sameText(const std::string& a, const std::string& b)
     return strcasecmp(a.c_str(), b.c_str()) == 0;
 }
 
+CMPIObjectPath* referenceKeyPath(const CMPIData& data)
+{
+    if ((data.state & CMPI_nullValue) != 0 || data.value.ref == nullptr)
+        throw CmpiStatus(CMPI_RC_ERR_NOT_FOUND, "");
+    return data.value.ref;
+}
+
 // ---- a request -----------------------------------------------------------------------
 
 AssocRequest::AssocRequest(const AssocRow& r, CmpiResult& result, const CmpiObjectPath& src, const char** properties,
@@ -461,7 +468,7 @@ CmpiStatus assocGetInstance(const AssocRow& row, const CmpiContext& ctx, CmpiRes
                         static_cast<int>(data.type));
             return CmpiStatus(rc);
         }
-        refs[k] = data.value.ref;
+        refs[k] = referenceKeyPath(data);
     }
     const CmpiObjectPath p1(refs[0]);
     const CmpiObjectPath p2(refs[1]);

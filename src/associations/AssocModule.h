@@ -242,4 +242,9 @@ std::string prefixToken(const std::string& text);
 std::string secondToken(const std::string& text);
 bool sameText(const std::string& a, const std::string& b);   // strcasecmp
 
+// The path of a reference key that getInstance of an association read. A
+// null reference names no end, so no such association instance exists: it
+// throws NOT_FOUND with an empty key text, as a null string key ends.
+CMPIObjectPath* referenceKeyPath(const CMPIData& data);
+
 #endif
