@@ -2,11 +2,14 @@
 BUILD      ?= build
 ASAN_BUILD ?= build-asan
 TSAN_BUILD ?= build-tsan
+FUZZ_BUILD ?= build-fuzz
+FUZZ_SECONDS ?= 180
+FUZZ_TARGETS ?=
 JOBS       ?= $(shell nproc)
 PREFIX     ?= /usr/local
 GENERATOR  := $(shell command -v ninja >/dev/null 2>&1 && echo "-G Ninja")
 
-.PHONY: all deps build demo demo-real test test-asan test-tsan install clean bench
+.PHONY: all deps build demo demo-real test test-asan test-tsan fuzz install clean bench
 
 all: build
 
@@ -41,6 +44,14 @@ test-tsan: deps
 	cmake --build $(TSAN_BUILD) -j $(JOBS)
 	cd $(TSAN_BUILD) && ctest --output-on-failure -L threaded -j $(JOBS)
 
+# The libFuzzer programs of tests/fuzz in their own clang tree (ASan+UBSan),
+# each run FUZZ_SECONDS under tests/isolate.sh; FUZZ_TARGETS picks some of them.
+fuzz:
+	@scripts/install-deps.sh clang libclang-rt-dev
+	@[ -f $(FUZZ_BUILD)/CMakeCache.txt ] || cmake -S . -B $(FUZZ_BUILD) $(GENERATOR) -DCMAKE_C_COMPILER=clang -DCMAKE_CXX_COMPILER=clang++ -DVEXLAN_SANITIZE=address -DVEXLAN_FUZZ=ON
+	cmake --build $(FUZZ_BUILD) -j $(JOBS) --target fuzzers
+	tests/fuzz/run.sh $(FUZZ_BUILD) $(FUZZ_SECONDS) $(FUZZ_TARGETS)
+
 # The installed provider's run path names the prefix's library directory, so
 # the build tree learns the prefix before installing.
 install: build
@@ -63,4 +74,4 @@ deb: build
 	scripts/make-deb.sh $(BUILD) $(BUILD)
 
 clean:
-	rm -rf $(BUILD) $(ASAN_BUILD) $(TSAN_BUILD)
+	rm -rf $(BUILD) $(ASAN_BUILD) $(TSAN_BUILD) $(FUZZ_BUILD)

@@ -1,6 +1,6 @@
 # Warning flags applied to every target of the project.
 add_compile_options(
-  -Wall -Wextra -Wpedantic -Wshadow -Wformat=2 -Wformat-truncation=2
+  -Wall -Wextra -Wpedantic -Wshadow -Wformat=2 $<$<CXX_COMPILER_ID:GNU>:-Wformat-truncation=2>
   -Wno-unused-parameter
   $<$<COMPILE_LANGUAGE:CXX>:-Wnon-virtual-dtor>
   $<$<COMPILE_LANGUAGE:CXX>:-Woverloaded-virtual>

@@ -64,14 +64,14 @@ std::int64_t maxSigned(Type t) {
 }
 
 // All of s as a number read by parse (a strtoX): no leading space, nothing
-// left over, no range error.
+// left over (a NUL inside the text is left over too), no range error.
 template <class N, class F>
 bool wholeNumber(const std::string& s, F parse, N& v) {
     if (s.empty() || std::isspace(static_cast<unsigned char>(s[0]))) return false;
     errno = 0;
     char* end = nullptr;
     v = parse(s.c_str(), &end);
-    return errno == 0 && end && *end == '\0';
+    return errno == 0 && end == s.c_str() + s.size();
 }
 
 bool parseUnsigned(const std::string& s, Type t, Value& out) {
@@ -225,6 +225,12 @@ bool parsePath(const std::string& textIn, ObjectPath& out, std::string& error, c
             return false;
         }
         out.host = text.substr(pos + 2, slash - pos - 2);
+        // An empty host would be written without its "//", and the slashes
+        // behind it would then read as the host's.
+        if (out.host.empty()) {
+            error = "empty host after '//'";
+            return false;
+        }
         pos = slash + 1;
     }
     const size_t stop = text.find_first_of(".=\"", pos);

@@ -110,12 +110,20 @@ TEST(PathText, BadInputIsRefusedWithAReason) {
         "root/a:1Class",
         "root/a:T_Port#x",
         "//hostonly",
+        "///root/a:T_Port",   // an empty host
     };
     for (const char* text : bad) {
         ObjectPath p;
         std::string err;
         EXPECT_FALSE(parsePath(text, p, err, &r)) << "accepted: " << text;
         EXPECT_FALSE(err.empty()) << text;
+    }
+    // A number followed by a NUL inside the text is not a number.
+    const std::string withNul[] = {std::string("root/a:T_Port.Num=5\0", 20), std::string("root/a:X.N=-0.\0\0", 16)};
+    for (const std::string& text : withNul) {
+        ObjectPath p;
+        std::string err;
+        EXPECT_FALSE(parsePath(text, p, err, &r)) << "accepted: " << text;
     }
 }
 
