@@ -53,16 +53,22 @@ def lun_id(lun, kind, p, t, a):
     return ":".join(head + ["%02x" % x for x in (kind, p, t, a >> 8, a & 0xFF, lun["lun"])])
 
 
+def adapter_copy(template, serial, uuid):
+    """A copy of the template adapter with its own serial number (also in
+    the VPD) and VPD UUID, and no instance number of its own."""
+    ad = copy.deepcopy(template)
+    ad["serialNumber"] = serial
+    ad["vpd"]["SN"] = serial
+    ad["vpd"]["YU"] = uuid
+    ad.pop("instance", None)
+    return ad
+
+
 def fc_adapter(template, a):
     """Adapter `a` of an FC host: the template's first adapter with four
     ports, one FC function each, every name and address its own."""
     hi, lo = a >> 8, a & 0xFF
-    ad = copy.deepcopy(template)
-    serial = "VXB%07d" % a
-    ad["serialNumber"] = serial
-    ad["vpd"]["SN"] = serial
-    ad["vpd"]["YU"] = "3f2a9c1e-7d44-4b0a-9e51-%012x" % a
-    ad.pop("instance", None)
+    ad = adapter_copy(template, "VXB%07d" % a, "3f2a9c1e-7d44-4b0a-9e51-%012x" % a)
     ports = []
     for p in range(4):
         port = copy.deepcopy(template["ports"][p % len(template["ports"])])
@@ -88,13 +94,8 @@ def cna_adapter(template, a):
     """Adapter `a` of a mixed host: the template's CNA, each port with an
     FCoE and a NIC function, every name and address its own."""
     hi, lo = a >> 8, a & 0xFF
-    ad = copy.deepcopy(template)
-    serial = "VXD%07d" % a
-    ad["serialNumber"] = serial
-    ad["vpd"]["SN"] = serial
-    ad["vpd"]["YU"] = "5b7c2e91-0a3d-4f62-8c15-%012x" % a
+    ad = adapter_copy(template, "VXD%07d" % a, "5b7c2e91-0a3d-4f62-8c15-%012x" % a)
     ad["i2cUuid"] = "8d1e5c40-2b6f-4e19-a3c7-%012x" % a
-    ad.pop("instance", None)
     for p, port in enumerate(ad["ports"]):
         port["transceiver"]["serialNumber"] = "VXT%06d%d" % (a, p)
         for proto in port["protocols"]:

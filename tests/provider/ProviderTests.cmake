@@ -37,3 +37,17 @@ function(vexlan_isolated_gtest name target)
     set_tests_properties(${name} PROPERTIES LABELS "${ARG_LABELS}")
   endif()
 endfunction()
+
+# A table of such tests, one row each: "name|program|filter|timeout|labels"
+# (labels may be empty), registered as <prefix>.<name>.
+function(vexlan_isolated_gtest_table prefix)
+  foreach(_row ${ARGN})
+    string(REPLACE "|" ";" _f "${_row}")
+    list(GET _f 0 _name)
+    list(GET _f 1 _program)
+    list(GET _f 2 _filter)
+    list(GET _f 3 _timeout)
+    list(GET _f 4 _labels)
+    vexlan_isolated_gtest(${prefix}.${_name} ${_program} FILTER ${_filter} TIMEOUT ${_timeout} LABELS ${_labels})
+  endforeach()
+endfunction()
