@@ -3,13 +3,24 @@
 # provider's classes for a CIM server:
 #
 #   Vexlan_CNA_Provider.mof               class MOF for root/vexlan_cmpi
-#   Vexlan_CNA_Provider_Interop.mof       class MOF for the interop namespace
-#   Vexlan_CNA_Provider_Registration.mof  OpenPegasus registration (load into root/PG_InterOp)
+#   Vexlan_CNA_Provider_Interop.mof       class MOF for sfcb's interop namespace (the profiles)
+#   Vexlan_CNA_Provider_Registration.mof  OpenPegasus registration (load into root/PG_InterOp):
+#                                         the module, the provider, its classes in root/vexlan_cmpi
+#                                         and the profiles it implements (PG_ProviderProfileCapabilities)
 #   Vexlan_CNA_Provider.reg               sfcb registration (sfcbstage -r)
+#
+# Where the profiles are advertised: sfcb lets providers serve profile classes
+# in its interop namespace, so the table's "interop" classes are registered
+# there. OpenPegasus's own interop provider serves every CIM_RegisteredProfile
+# and CIM_ElementConformsToProfile request in root/PG_InterOp and refuses
+# profile classes it does not know; it advertises a provider's profiles from
+# PG_ProviderProfileCapabilities instead, so the OpenPegasus registration
+# registers no class in the interop namespace and lists the profiles below.
 #
 # Usage: gen-registration.sh [options] TABLE OUTDIR
 #   --version V           PG_ProviderModule.Version (default 1.5.6)
-#   --pegasus-interop NS  interop namespace of OpenPegasus (default root/PG_InterOp)
+#   --pegasus-interop NS  accepted for older callers: OpenPegasus registers no class in its
+#                         interop namespace (see below)
 #   --sfcb-interop NS     interop namespace of sfcb (default root/interop)
 #
 # Class files are read relative to the directory of TABLE. The class MOF
@@ -71,7 +82,7 @@ class_mof "$main_ns" "$out/Vexlan_CNA_Provider.mof"
 class_mof interop "$out/Vexlan_CNA_Provider_Interop.mof"
 
 # OpenPegasus: one module, one provider, one capability per registered class.
-awk -F '\t' -v version="$version" -v interop="$pg_interop" '
+awk -F '\t' -v version="$version" '
     BEGIN {
         map["instance"] = 2; map["association"] = 3; map["indication"] = 4; map["method"] = 5
         print "// OpenPegasus registration of the Vexlan CNA provider; load into root/PG_InterOp."
@@ -95,10 +106,10 @@ awk -F '\t' -v version="$version" -v interop="$pg_interop" '
     }
     $4 == "-" { next }
     {
-        n = split($2, ns, " "); nslist = ""
+        n = split($2, ns, " "); nslist = ""; k = 0
         for (i = 1; i <= n; i++) {
-            v = (ns[i] == "interop") ? interop : ns[i]
-            nslist = nslist (i > 1 ? ", " : "") "\"" v "\""
+            if (ns[i] == "interop") continue
+            nslist = nslist (k++ > 0 ? ", " : "") "\"" ns[i] "\""
         }
         n = split($4, ty, " "); tylist = ""
         for (i = 1; i <= n; i++) {
@@ -119,6 +130,40 @@ awk -F '\t' -v version="$version" -v interop="$pg_interop" '
         print "};"
     }
 ' "$rows" > "$out/Vexlan_CNA_Provider_Registration.mof.tmp"
+
+# The profiles for OpenPegasus's interop provider: one PG_ProviderProfileCapabilities
+# each, tab-separated: capability, RegisteredProfile (its value map: 6 SNIA:FC HBA,
+# 8 SNIA:Host Discovered Resources, 0 Other), the name and organization of an
+# "Other" profile, version, sub-profiles (1019 SNIA:FC Initiator Ports, 1024
+# SNIA:Indication), and the classes whose every instance is a central instance.
+awk -F '\t' '
+    {
+        print ""
+        print "instance of PG_ProviderProfileCapabilities"
+        print "{"
+        print "    ProviderModuleName = \"Vexlan_CNA_ProviderModule\";"
+        print "    ProviderName = \"Vexlan_CNA_Provider\";"
+        printf "    CapabilityID = \"%s\";\n", $1
+        printf "    RegisteredProfile = %s;\n", $2
+        if ($3 != "-") {
+            printf "    OtherRegisteredProfile = \"%s\";\n", $3
+            printf "    OtherProfileOrganization = \"%s\";\n", $4
+        }
+        printf "    ProfileVersion = \"%s\";\n", $5
+        printf "    RegisteredSubProfiles = {%s};\n", ($6 == "-") ? "" : $6
+        n = split($7, c, " "); list = ""
+        for (i = 1; i <= n; i++) list = list (i > 1 ? ", " : "") "\"" c[i] "\""
+        printf "    ConformingElements = {%s};\n", list
+        print "};"
+    }
+' >> "$out/Vexlan_CNA_Provider_Registration.mof.tmp" <<'PROFILES'
+Vexlan_FCHBA_Profile	6	-	-	1.1.0	1019, 1024	Vexlan_Adapter_ComputerSystem
+Vexlan_HDR_Profile	8	-	-	1.1.0	-	Vexlan_Adapter_ComputerSystem
+Vexlan_SoftwareUpdate_Profile	0	Software Update	DMTF	1.0.0	-	Vexlan_FCHBA_SoftwareInstallationService Vexlan_NIC_SoftwareInstallationService
+Vexlan_EthernetPort_Profile	0	Ethernet Port	DMTF	1.0.0	-	Vexlan_NIC_EthernetPort2
+Vexlan_HostLANNetworkPort_Profile	0	Host LAN Network Port	DMTF	1.0.0	-	Vexlan_NIC_NetworkPort
+Vexlan_IPInterface_Profile	0	IP Interface	DMTF	1.0.1	-	Vexlan_NIC_IPProtocolEndpoint
+PROFILES
 mv "$out/Vexlan_CNA_Provider_Registration.mof.tmp" "$out/Vexlan_CNA_Provider_Registration.mof"
 
 # sfcb: one section per registered class.

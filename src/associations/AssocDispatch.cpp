@@ -36,7 +36,7 @@ namespace {
 
 struct AssocClassRow {
     const char* assocClass;
-    const AssocRow* module;     // null: in the lookup table, with no test in the chain
+    const AssocRow* module;
     const char* alternative;    // the CIM parent accepted as a second name, or null
     bool rebuild;               // the module's remove and build run right before it
     bool hdr;                   // tested only when g_SUPPORT_HDR is not zero
@@ -92,7 +92,7 @@ const AssocClassRow kAssociations[] = {
      {"Vexlan_FCHBA_ObjectManager", "Vexlan_FCHBA_CIMXMLCommMech"}},
     {"Vexlan_FCHBA_ObjectManagerNamespace", &kAssocObjectManagerNamespace, "CIM_NamespaceInManager", false, false,
      {"Vexlan_FCHBA_ObjectManager", "Vexlan_FCHBA_Namespace"}},
-    {"Vexlan_FCHBA_RegisteredProfileObjectManager", nullptr, nullptr, false, false,
+    {"Vexlan_FCHBA_RegisteredProfileObjectManager", &kAssocRegisteredProfileObjectManager, nullptr, false, false,
      {"Vexlan_FCHBA_RegisteredProfile", "Vexlan_FCHBA_ObjectManager"}},
     {"Vexlan_FCHBA_SCSIProtocolControllerFCPort", &kAssocSCSIProtocolControllerFCPort, "CIM_ProtocolControllerForPort",
      true, false, {"Vexlan_FCHBA_SCSIProtocolController", "Vexlan_FCHBA_FCPort"}},
@@ -109,6 +109,15 @@ const AssocClassRow kAssociations[] = {
     {"Vexlan_FCHBA_PortControllerSoftwareInstallationService", &kAssocPortControllerSoftwareInstallationService,
      "CIM_ServiceAffectsElement", false, false,
      {"Vexlan_FCHBA_PortController", "Vexlan_FCHBA_SoftwareInstallationService"}},
+    // The profile associations of the FC side, routed for profile discovery.
+    {"Vexlan_FCHBA_RegisteredProfileComputerSystem", &kAssocRegisteredProfileComputerSystem, nullptr, false, false,
+     {"Vexlan_FCHBA_RegisteredProfile", "Vexlan_Adapter_ComputerSystem"}},
+    {"Vexlan_FCHBA_RegisteredProfileRegisteredSubProfile", &kAssocRegisteredProfileRegisteredSubProfile, nullptr,
+     false, false, {"Vexlan_FCHBA_RegisteredProfile", "Vexlan_FCHBA_RegisteredSubProfile"}},
+    {"Vexlan_FCHBA_SoftwareIdentityRegisteredProfile", &kAssocSoftwareIdentityRegisteredProfile, nullptr, false,
+     false, {"Vexlan_FCHBA_SoftwareIdentity", "Vexlan_FCHBA_RegisteredProfile"}},
+    {"Vexlan_FCHBA_SoftwareIdentityRegisteredSubProfile", &kAssocSoftwareIdentityRegisteredSubProfile, nullptr, false,
+     false, {"Vexlan_FCHBA_SoftwareIdentity", "Vexlan_FCHBA_RegisteredSubProfile"}},
     {"Vexlan_NIC_ComputerSystemEthernetPort", &kAssocComputerSystemEthernetPort, nullptr, false, false,
      {"Vexlan_Adapter_ComputerSystem", "Vexlan_NIC_EthernetPort2"}},
     {"Vexlan_NIC_ComputerSystemIPProtocolEndpoint", &kAssocComputerSystemIPProtocolEndPoint, nullptr, false, false,
@@ -119,8 +128,10 @@ const AssocClassRow kAssociations[] = {
      {"Vexlan_Adapter_ComputerSystem", "Vexlan_NIC_NetworkPort"}},
     {"Vexlan_NIC_ComputerSystemPortController", &kNic_AssocComputerSystemPortController, nullptr, false, false,
      {"Vexlan_Adapter_ComputerSystem", "Vexlan_NIC_PortController"}},
-    {"Vexlan_NIC_ComputerSystemRemoteServiceAccessPoint", nullptr, nullptr, false, false,
-     {"Vexlan_Adapter_ComputerSystem", "Vexlan_NIC_RemoteServiceAccessPoint"}},
+    {"Vexlan_NIC_ComputerSystemRemoteServiceAccessPoint", &kAssocComputerSystemRemoteServiceAccessPoint, nullptr,
+     false, false, {"Vexlan_Adapter_ComputerSystem", "Vexlan_NIC_RemoteServiceAccessPoint"}},
+    {"Vexlan_NIC_RemoteServiceAccessPointIPProtocolEndpoint", &kAssocRemoteServiceAccessPointIPProtocolEndPoint,
+     nullptr, false, false, {"Vexlan_NIC_RemoteServiceAccessPoint", "Vexlan_NIC_IPProtocolEndpoint"}},
     {"Vexlan_NIC_ComputerSystemSoftwareIdentity", &kNic_AssocComputerSystemSoftwareIdentity, nullptr, false, false,
      {"Vexlan_Adapter_ComputerSystem", "Vexlan_NIC_SoftwareIdentity"}},
     {"Vexlan_NIC_ComputerSystemSoftwareInstallationService", &kNic_AssocComputerSystemSoftwareInstallationService,
@@ -353,6 +364,50 @@ CmpiStatus runRounds(const Request& rq)
     return last;
 }
 
+// True when the class named `cls` in the namespace of `path` is
+// `ancestor` or derives from it; a class the server doesn't know there is
+// neither.
+bool classIsA(const CmpiObjectPath& path, const char* cls, const char* ancestor)
+{
+    try {
+        const CmpiObjectPath probe(path.getNameSpace(), cls);
+        return probe.classPathIsA(ancestor);
+    } catch (const CmpiStatus&) {
+        return false;
+    }
+}
+
+bool isOwnAssociationClass(const char* name)
+{
+    for (const AssocClassRow& row : kAssociations)
+        if (strcasecmp(row.assocClass, name) == 0)
+            return true;
+    return false;
+}
+
+// The provider's association classes that a parent class asked for stands
+// for: those derived from it that have the path's class (or one it derives
+// from) at an end, in table order. OpenPegasus never hands a provider such a
+// class; it calls the provider once for each of these classes instead. sfcb
+// hands the client's class over as it is, and the provider then answers for
+// each of them as it answers OpenPegasus. Empty when the parameter names one
+// of the provider's own classes, or a text that is no class (the CIM parent
+// spellings of the dispatch table keep their meaning).
+std::vector<const char*> derivedClassesAsked(const Request& rq)
+{
+    std::vector<const char*> classes;
+    if (rq.assocParameter == nullptr || rq.assocParameter[0] == '\0' || isOwnAssociationClass(rq.assocParameter))
+        return classes;
+    for (const AssocClassRow& row : kAssociations) {
+        bool atSource = false;
+        for (const char* source : row.sources)
+            atSource = atSource || (source != nullptr && rq.path.classPathIsA(source));
+        if (atSource && classIsA(rq.path, row.assocClass, rq.assocParameter))
+            classes.push_back(row.assocClass);
+    }
+    return classes;
+}
+
 CmpiStatus dispatch(const Request& rq)
 {
     const char* name = opName(rq.op);
@@ -381,7 +436,20 @@ CmpiStatus dispatch(const Request& rq)
                                rq.assocParameter);
             const std::vector<AssocLookupRow>& lookup = tables().lookup;
             DISPATCH_DEBUG("m_assocLookupTableSize = %d\n", static_cast<int>(lookup.size()));
-            if (associatorOp && !passesGate(rq.path, rq.assocParameter)) {
+            const std::vector<const char*> derived = derivedClassesAsked(rq);
+            if (!derived.empty()) {
+                // One request of each derived class, as OpenPegasus makes them;
+                // the gate passes for each, as the class stands at the source.
+                for (const char* cls : derived) {
+                    DISPATCH_DEBUG("Vexlan_CNA_Provider %s: %s answers for %s\n", name, cls, rq.assocParameter);
+                    Request one = rq;
+                    one.assocParameter = cls;
+                    if (associatorOp)
+                        DISPATCH_DEBUG("Class %s has associators\n", className);
+                    last = runRounds(one);
+                }
+                rq.rslt.returnDone();
+            } else if (associatorOp && !passesGate(rq.path, rq.assocParameter)) {
                 rq.rslt.returnDone();
                 gateClosedFor = className;   // logged once the lock is given back
                 gateClosed = true;

@@ -16,7 +16,6 @@
 #include "classes/Vexlan_NIC_RegisteredProfile.h"
 #include "inventory/AdapterFunc.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
-#include "support/Vexlan_NIC_Properties.h"
 #include "support/Vexlan_NIC_Utils.h"
 
 namespace {
@@ -117,11 +116,6 @@ std::string classNameOf(const CmpiObjectPath& path)
     return text != nullptr ? text : "";
 }
 
-const char* interopNamespace()
-{
-    return Vexlan_NIC_Properties::instance()->interopNamespace;
-}
-
 // One answer: the partner itself, its path, or a reference whose
 // ConformantStandard is the profile's path and ManagedElement the port's.
 void answer(CmpiResult& rslt, FuncType funcType, const char* ns, const CmpiObjectPath& profilePath,
@@ -176,9 +170,9 @@ CmpiStatus findMatchedRole2InstancesOrReferences(CmpiResult& rslt, const CmpiObj
             continue;
         for (_CNAStruc* a = m_CNAList; a != nullptr; a = a->next) {
             for (_CNAPortStruc* p = a->portList; p != nullptr; p = p->next) {
-                const CmpiObjectPath element = c->makePath(c->className, ns.c_str(), a, p);
+                const CmpiObjectPath element = c->makePath(c->className, kModelNamespace, a, p);
                 answer(rslt, funcType, ns.c_str(), path, element,
-                       [&] { return c->makeInstance(c->className, ns.c_str(), properties, a, p); }, element);
+                       [&] { return c->makeInstance(c->className, kModelNamespace, properties, a, p); }, element);
             }
         }
     }
@@ -198,7 +192,10 @@ CmpiStatus findMatchedRole1InstancesOrReferences(CmpiResult& rslt, const CmpiObj
     const std::string identifier = keyText != nullptr ? keyText : "";
     PROFILE_DEBUG("%s:findMatchedRole1InstancesOrReferences() identifier=%s", kFile, identifier.c_str());
     const std::string ns = path.getNameSpace().charPtr();
-    const char* interop = interopNamespace();
+    // The profile is served in the provider's namespace in every server (the
+    // interop namespace serves it only where the server lets providers
+    // advertise there), so its path names that one.
+    const char* profileNs = kModelNamespace;
     for (_CNAStruc* a = m_CNAList; a != nullptr; a = a->next) {
         for (_CNAPortStruc* p = a->portList; p != nullptr; p = p->next) {
             if (strcasecmp(c->keyOf(a, p).c_str(), identifier.c_str()) != 0)
@@ -206,9 +203,9 @@ CmpiStatus findMatchedRole1InstancesOrReferences(CmpiResult& rslt, const CmpiObj
             for (_RegisteredProfile* node = m_RegisteredProfileList; node != nullptr; node = node->next) {
                 if (node->id != c->id)
                     continue;
-                const CmpiObjectPath profile = makePath_Nic_RegisteredProfile(kProfileClass, interop, node);
+                const CmpiObjectPath profile = makePath_Nic_RegisteredProfile(kProfileClass, profileNs, node);
                 answer(rslt, funcType, ns.c_str(), profile, path,
-                       [&] { return makeInstance_Nic_RegisteredProfile(kProfileClass, interop, properties, node); },
+                       [&] { return makeInstance_Nic_RegisteredProfile(kProfileClass, profileNs, properties, node); },
                        profile);
             }
         }
@@ -294,10 +291,11 @@ CmpiStatus associators(const AssocRow&, const CmpiContext&, CmpiResult& rslt, co
 }
 
 // Every pair: each profile of a known name with every port in the class of
-// that name.
+// that name, both named where they are served.
 template <class Pair>
-void eachPair(const char* ns, Pair&& pair)
+void eachPair(Pair&& pair)
 {
+    const char* ns = kModelNamespace;
     for (_RegisteredProfile* node = m_RegisteredProfileList; node != nullptr; node = node->next) {
         const Conformance* c = conformanceOfName(node->name);
         if (c == nullptr)
@@ -330,7 +328,7 @@ CmpiStatus enumInstances(const AssocRow&, const CmpiContext&, CmpiResult& rslt, 
     CmpiStatus status(CMPI_RC_OK);
     if (!readNamespace(path, "enumInstances", ns, status))
         return status;
-    eachPair(ns.c_str(), [&](const CmpiObjectPath& profile, const CmpiObjectPath& element) {
+    eachPair([&](const CmpiObjectPath& profile, const CmpiObjectPath& element) {
         CmpiInstance instance(path);
         instance.setProperty(kStandardRole, CmpiData(profile));
         instance.setProperty(kElementRole, CmpiData(element));
@@ -346,7 +344,7 @@ CmpiStatus enumInstanceNames(const AssocRow&, const CmpiContext&, CmpiResult& rs
     CmpiStatus status(CMPI_RC_OK);
     if (!readNamespace(path, "enumInstanceNames", ns, status))
         return status;
-    eachPair(ns.c_str(), [&](const CmpiObjectPath& profile, const CmpiObjectPath& element) {
+    eachPair([&](const CmpiObjectPath& profile, const CmpiObjectPath& element) {
         CmpiObjectPath ref(ns.c_str(), classNameOf(path).c_str());
         ref.setKey(kStandardRole, CmpiData(profile));
         ref.setKey(kElementRole, CmpiData(element));

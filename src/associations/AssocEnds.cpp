@@ -9,6 +9,8 @@
 #include "classes/Vexlan_FCHBA_CIMXMLCommMech_CMPI.h"
 #include "classes/Vexlan_FCHBA_Namespace_CMPI.h"
 #include "classes/Vexlan_FCHBA_ObjectManager_CMPI.h"
+#include "classes/Vexlan_FCHBA_RegisteredProfile_CMPI.h"
+#include "classes/Vexlan_FCHBA_RegisteredSubProfile_CMPI.h"
 #include "classes/Vexlan_FCHBA_SoftwareIdentity_CMPI.h"
 #include "classes/Vexlan_FCHBA_SoftwareInstallationService_CMPI.h"
 #include "classes/Vexlan_FC_FCPortStatistics_CMPI.h"
@@ -26,6 +28,7 @@
 #include "classes/Vexlan_NIC_NetworkPort.h"
 #include "classes/Vexlan_NIC_PortController.h"
 #include "classes/Vexlan_NIC_RegisteredProfile.h"
+#include "classes/Vexlan_NIC_RemoteServiceAccessPoint.h"
 #include "classes/Vexlan_NIC_SoftwareIdentity.h"
 #include "classes/Vexlan_NIC_SoftwareInstallationService.h"
 
@@ -84,6 +87,10 @@ LIST_END(PhysicalConnector, "Vexlan_Adapter_PhysicalConnector", removePhysicalCo
          buildPhysicalConnectorList);
 LIST_END(PhysicalPort, "Vexlan_Adapter_PhysicalPort", removePhysicalPortList, buildPhysicalPortList);
 LIST_END(Product, "Vexlan_Adapter_Product", removeProductList, buildProductList);
+LIST_END(RegisteredProfile, "Vexlan_FCHBA_RegisteredProfile", removeRegisteredProfileList,
+         buildRegisteredProfileList);
+LIST_END(RegisteredSubProfile, "Vexlan_FCHBA_RegisteredSubProfile", removeRegisteredSubProfileList,
+         buildRegisteredSubProfileList);
 
 NIC_END(EthernetPort, EthernetPort, "Vexlan_NIC_EthernetPort2", i.adapter, i.port);
 NIC_END(NicPortController, Nic_PortController, "Vexlan_NIC_PortController", i.adapter);
@@ -94,6 +101,7 @@ NIC_END(IPProtocolEndPointCapabilities, IPProtocolEndPointCapabilities, "Vexlan_
         i.port);
 NIC_END(NicSoftwareIdentity, Nic_SoftwareIdentity, "Vexlan_NIC_SoftwareIdentity", i.adapter, i.kind);
 NIC_END(NicRegisteredProfile, Nic_RegisteredProfile, "Vexlan_NIC_RegisteredProfile", i.profile);
+NIC_END(RemoteServiceAccessPoint, RemoteServiceAccessPoint, "Vexlan_NIC_RemoteServiceAccessPoint", i.port);
 
 const EndClass kNicSoftwareInstallationServiceEnd = {
     "Vexlan_NIC_SoftwareInstallationService",

@@ -26,6 +26,8 @@ extern const EndClass kPhysicalPackageEnd;
 extern const EndClass kPhysicalConnectorEnd;
 extern const EndClass kPhysicalPortEnd;
 extern const EndClass kProductEnd;
+extern const EndClass kRegisteredProfileEnd;
+extern const EndClass kRegisteredSubProfileEnd;
 
 // NIC side: items are adapters (adapter), ports (adapter and port), software
 // identities (adapter and kind) or profiles of m_RegisteredProfileList.
@@ -39,6 +41,7 @@ extern const EndClass kNicSoftwareIdentityEnd;
 extern const EndClass kNicSoftwareInstallationServiceEnd;
 extern const EndClass kNicSoftwareInstallationServiceCapabilitiesEnd;
 extern const EndClass kNicRegisteredProfileEnd;
+extern const EndClass kRemoteServiceAccessPointEnd;
 // The physical classes as the NIC side makes them, from an adapter (and port).
 extern const EndClass kNicPhysicalPackageEnd;
 extern const EndClass kNicPhysicalConnectorEnd;

@@ -21,6 +21,7 @@
 #include "classes/Vexlan_Adapter_Product_CMPI.h"
 #include "classes/Vexlan_FCHBA_Namespace_CMPI.h"
 #include "classes/Vexlan_FCHBA_ObjectManager_CMPI.h"
+#include "classes/Vexlan_FCHBA_RegisteredSubProfile_CMPI.h"
 #include "classes/Vexlan_FCHBA_SoftwareIdentity_CMPI.h"
 #include "classes/Vexlan_FC_FCPortStatistics_CMPI.h"
 #include "classes/Vexlan_FC_FCPort_CMPI.h"
@@ -280,14 +281,16 @@ bool hostOfInstaller(AssocRequest& rq)
     return true;
 }
 
-// The service of an identity: once for each valid identity of that InstanceID.
+// The service of an identity: the one service, when some valid identity has
+// that InstanceID. Identities of a multi-port adapter share their InstanceID;
+// the walk stops at the first, so the singleton is answered once.
 bool installerOfIdentity(AssocRequest& rq)
 {
     READ_KEY(rq, "InstanceID", instanceId);
     for (int i = 0; i < g_SoftwareIdentityList.count; ++i) {
         const SoftwareIdentityEntry& e = g_SoftwareIdentityList.entries[i];
         if (e.valid && same(instanceId, e.instanceId))
-            PARTNER(rq, kOne);
+            return rq.partner(kOne);
     }
     return true;
 }
@@ -740,6 +743,150 @@ void tagFcPortPairs(const PairFn& pair)
     }
 }
 
+// ---- profiles of the FC side -----------------------------------------------------------------
+// A profile's InstanceID ends with the host it describes, "_" before it.
+
+bool validProfile(const RegisteredProfileEntry& e, const char* registeredName)
+{
+    return e.valid && (registeredName == nullptr || same(e.registeredName, registeredName));
+}
+
+// Source a profile whose InstanceID ends with the host name: the computer
+// system (every FC profile does).
+bool systemOfProfile(AssocRequest& rq)
+{
+    READ_KEY(rq, kInstanceID, instanceId);
+    if (same(suffixToken(instanceId), hostName_ComputerSystem))
+        PARTNER(rq, kOne);
+    return true;
+}
+
+// The profiles of a registered name, each one a partner.
+template <const char* Name>
+bool profilesNamed(AssocRequest& rq)
+{
+    for (int i = 0; i < g_RegisteredProfileList.count; ++i)
+        if (validProfile(g_RegisteredProfileList.entries[i], Name))
+            PARTNER(rq, slot(i));
+    return true;
+}
+
+constexpr char kFcHbaProfileName[] = "FC HBA";
+constexpr char kServerProfileName[] = "Server";
+
+// The pairs both ways agree on: each profile of the name whose InstanceID
+// ends with `host`, with the singleton.
+template <const char* Name, const char* const* Host>
+void namedProfilePairs(const PairFn& pair)
+{
+    for (int i = 0; i < g_RegisteredProfileList.count; ++i) {
+        const RegisteredProfileEntry& e = g_RegisteredProfileList.entries[i];
+        if (validProfile(e, Name) && same(suffixToken(e.instanceId), *Host))
+            pair(slot(i), kOne);
+    }
+}
+
+// Source the Server profile of the object manager's host: the object manager.
+bool managerOfProfile(AssocRequest& rq)
+{
+    READ_KEY(rq, kInstanceID, instanceId);
+    if (same(suffixToken(instanceId), hostName_ObjectManager) && holds(instanceId.c_str(), "ServerProfile"))
+        PARTNER(rq, kOne);
+    return true;
+}
+
+// Source an object manager: the Server profiles of its SystemName.
+bool serverProfilesOfManager(AssocRequest& rq)
+{
+    READ_KEY(rq, "SystemName", systemName);
+    for (int i = 0; i < g_RegisteredProfileList.count; ++i) {
+        const RegisteredProfileEntry& e = g_RegisteredProfileList.entries[i];
+        if (validProfile(e, kServerProfileName) && same(suffixToken(e.instanceId), systemName.c_str()))
+            PARTNER(rq, slot(i));
+    }
+    return true;
+}
+
+const char* const kSystemHost = hostName_ComputerSystem;
+const char* const kManagerHost = hostName_ObjectManager;
+
+// Source the FC HBA profile: every sub-profile.
+bool subProfilesOfProfile(AssocRequest& rq)
+{
+    READ_KEY(rq, kInstanceID, instanceId);
+    if (!holds(instanceId.c_str(), "FCHBA"))
+        return true;
+    for (int i = 0; i < g_RegisteredSubProfileList.count; ++i)
+        if (g_RegisteredSubProfileList.entries[i].valid)
+            PARTNER(rq, slot(i));
+    return true;
+}
+
+// Source one of the two sub-profiles: the FC HBA profile.
+bool profileOfSubProfile(AssocRequest& rq)
+{
+    READ_KEY(rq, kInstanceID, instanceId);
+    if (holds(instanceId.c_str(), "FCInitiator") || holds(instanceId.c_str(), "Indication"))
+        return profilesNamed<kFcHbaProfileName>(rq);
+    return true;
+}
+
+void subProfilePairs(const PairFn& pair)
+{
+    for (int i = 0; i < g_RegisteredProfileList.count; ++i) {
+        const RegisteredProfileEntry& e = g_RegisteredProfileList.entries[i];
+        if (!e.valid || !holds(e.instanceId, "FCHBA"))
+            continue;
+        for (int k = 0; k < g_RegisteredSubProfileList.count; ++k)
+            if (g_RegisteredSubProfileList.entries[k].valid)
+                pair(slot(i), slot(k));
+    }
+}
+
+// Identities and the profiles of their host: the prefix of the identity's
+// InstanceID is the suffix of the profile's.
+template <auto& Profiles>
+bool profilesOfIdentity(AssocRequest& rq)
+{
+    READ_KEY(rq, kInstanceID, instanceId);
+    const std::string host = prefixToken(instanceId);
+    TokenWalker walker;
+    for (int i = 0; i < Profiles.count; ++i)
+        if (Profiles.entries[i].valid && same(walker.suffix(Profiles.entries[i].instanceId), host.c_str()))
+            PARTNER(rq, slot(i));
+    return true;
+}
+
+template <auto& Profiles>
+bool identitiesOfProfile(AssocRequest& rq)
+{
+    READ_KEY(rq, kInstanceID, instanceId);
+    const std::string host = suffixToken(instanceId);
+    TokenWalker walker;
+    for (int i = 0; i < g_SoftwareIdentityList.count; ++i) {
+        const SoftwareIdentityEntry& e = g_SoftwareIdentityList.entries[i];
+        if (e.valid && same(walker.prefix(e.instanceId), host.c_str()))
+            PARTNER(rq, slot(i));
+    }
+    return true;
+}
+
+template <auto& Profiles>
+void identityProfilePairs(const PairFn& pair)
+{
+    TokenWalker identities;
+    for (int i = 0; i < g_SoftwareIdentityList.count; ++i) {
+        const SoftwareIdentityEntry& e = g_SoftwareIdentityList.entries[i];
+        if (!e.valid)
+            continue;
+        const std::string host = identities.prefix(e.instanceId);
+        TokenWalker profiles;
+        for (int k = 0; k < Profiles.count; ++k)
+            if (Profiles.entries[k].valid && same(profiles.suffix(Profiles.entries[k].instanceId), host.c_str()))
+                pair(slot(i), slot(k));
+    }
+}
+
 // ---- row helpers ---------------------------------------------------------------------------
 
 constexpr ExtraProperty kNoExtra{};
@@ -868,3 +1015,26 @@ FILTERING(AssocPortControllerSoftwareInstallationService, "Vexlan_FCHBA_PortCont
           "Assoc_PortController_SoftwareInstallationService", "AffectedElement", kPortControllerEnd,
           "AffectingElement", kSoftwareInstallationServiceEnd, installerOfController, controllersOfInstaller,
           controllerInstallerPairs);
+
+// The profile associations of the FC side: plain in style, without the build
+// and remove pair (their lists are constants of the build sequence).
+#define PROFILE_ROW(X, cls, role1, end1, role2, end2, r2, r1, pairs)                                                \
+    const AssocRow k##X = {cls,   #X,     "",      AssocForm::PlainNoBuild, {role1, &end1}, {role2, &end2}, r2, r1, \
+                           pairs, kNoExtra, nullptr, nullptr,                nullptr,        0}
+
+PROFILE_ROW(AssocRegisteredProfileComputerSystem, "Vexlan_FCHBA_RegisteredProfileComputerSystem", "ConformantStandard",
+            kRegisteredProfileEnd, "ManagedElement", kComputerSystemEnd, systemOfProfile,
+            profilesNamed<kFcHbaProfileName>, (namedProfilePairs<kFcHbaProfileName, &kSystemHost>));
+PROFILE_ROW(AssocRegisteredProfileObjectManager, "Vexlan_FCHBA_RegisteredProfileObjectManager", "ConformantStandard",
+            kRegisteredProfileEnd, "ManagedElement", kObjectManagerEnd, managerOfProfile, serverProfilesOfManager,
+            (namedProfilePairs<kServerProfileName, &kManagerHost>));
+PROFILE_ROW(AssocRegisteredProfileRegisteredSubProfile, "Vexlan_FCHBA_RegisteredProfileRegisteredSubProfile",
+            "Antecedent", kRegisteredProfileEnd, "Dependent", kRegisteredSubProfileEnd, subProfilesOfProfile,
+            profileOfSubProfile, subProfilePairs);
+PROFILE_ROW(AssocSoftwareIdentityRegisteredProfile, "Vexlan_FCHBA_SoftwareIdentityRegisteredProfile", "Antecedent",
+            kSoftwareIdentityEnd, "Dependent", kRegisteredProfileEnd, profilesOfIdentity<g_RegisteredProfileList>,
+            identitiesOfProfile<g_RegisteredProfileList>, identityProfilePairs<g_RegisteredProfileList>);
+PROFILE_ROW(AssocSoftwareIdentityRegisteredSubProfile, "Vexlan_FCHBA_SoftwareIdentityRegisteredSubProfile",
+            "Antecedent", kSoftwareIdentityEnd, "Dependent", kRegisteredSubProfileEnd,
+            profilesOfIdentity<g_RegisteredSubProfileList>, identitiesOfProfile<g_RegisteredSubProfileList>,
+            identityProfilePairs<g_RegisteredSubProfileList>);

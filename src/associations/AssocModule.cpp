@@ -184,6 +184,8 @@ bool setRoleKeys(const AssocRow& row, CmpiObjectPath& target, const CmpiObjectPa
 
 // ---- helpers -----------------------------------------------------------------------
 
+const char kModelNamespace[] = "root/vexlan_cmpi";
+
 bool MatchRole(const char* role, const char* name)
 {
     return role == nullptr || role[0] == '\0' || (name != nullptr && strcasecmp(role, name) == 0);
@@ -279,17 +281,19 @@ bool AssocRequest::key(const char* name, std::string& out)
 bool AssocRequest::partner(const EndItem& item)
 {
     const EndClass& cls = *(sourceIsRole1_ ? row.end2.cls : row.end1.cls);
+    // The partner is named where it is served; the reference itself stands
+    // in the request's namespace, as the association class does.
     const char* ns = nameSpace_.c_str();
     switch (funcType_) {
     case FUNC_ASSOC:
-        result_.returnData(cls.makeInstance(cls.className, ns, properties_, item));
+        result_.returnData(cls.makeInstance(cls.className, kModelNamespace, properties_, item));
         return true;
     case FUNC_ASSOCNAME:
-        result_.returnData(cls.makePath(cls.className, ns, item));
+        result_.returnData(cls.makePath(cls.className, kModelNamespace, item));
         return true;
     case FUNC_REF:
     case FUNC_REFNAME: {
-        const CmpiObjectPath other = cls.makePath(cls.className, ns, item);
+        const CmpiObjectPath other = cls.makePath(cls.className, kModelNamespace, item);
         const CmpiObjectPath& p1 = sourceIsRole1_ ? source : other;
         const CmpiObjectPath& p2 = sourceIsRole1_ ? other : source;
         CmpiObjectPath ref(ns, row.assocClass);
@@ -359,7 +363,8 @@ CmpiStatus assocEnumInstances(const AssocRow& row, const CmpiContext& ctx, CmpiR
     enteringLine(row, op);
     CMPIObjectPath* enc = path.getEnc();
     CMPIStatus rc = {CMPI_RC_OK, nullptr};
-    const char* nsText = textOf(enc->ft->getNameSpace(enc, &rc));
+    // The namespace is read for its status: a path without one is refused.
+    enc->ft->getNameSpace(enc, &rc);
     if (rc.rc != CMPI_RC_OK) {
         if (filtering(row))
             ASSOC_ERROR("%s: Error getting namespace in enumInstances\n", row.file);
@@ -367,11 +372,10 @@ CmpiStatus assocEnumInstances(const AssocRow& row, const CmpiContext& ctx, CmpiR
             ASSOC_ERROR("%s: Error getting namespace, status.rc=%d!", op.c_str(), static_cast<int>(rc.rc));
         return CmpiStatus(rc);
     }
-    const std::string ns = nsText != nullptr ? nsText : "";
     if (row.pairs != nullptr) {
         row.pairs([&](const EndItem& a, const EndItem& b) {
-            const CmpiObjectPath p1 = row.end1.cls->makePath(row.end1.cls->className, ns.c_str(), a);
-            const CmpiObjectPath p2 = row.end2.cls->makePath(row.end2.cls->className, ns.c_str(), b);
+            const CmpiObjectPath p1 = row.end1.cls->makePath(row.end1.cls->className, kModelNamespace, a);
+            const CmpiObjectPath p2 = row.end2.cls->makePath(row.end2.cls->className, kModelNamespace, b);
             if (p1.isNull() || p2.isNull())
                 return;
             CmpiInstance instance(path);
@@ -395,7 +399,8 @@ CmpiStatus assocEnumInstanceNames(const AssocRow& row, const CmpiContext& ctx, C
     enteringLine(row, op);
     CMPIObjectPath* enc = path.getEnc();
     CMPIStatus rc = {CMPI_RC_OK, nullptr};
-    const char* nsText = textOf(enc->ft->getNameSpace(enc, &rc));
+    // The namespace is read for its status: a path without one is refused.
+    enc->ft->getNameSpace(enc, &rc);
     if (rc.rc != CMPI_RC_OK) {
         if (filtering(row))
             ASSOC_ERROR("%s: Error getting namespace i enumInstancesNames\n", row.file);
@@ -403,7 +408,6 @@ CmpiStatus assocEnumInstanceNames(const AssocRow& row, const CmpiContext& ctx, C
             ASSOC_ERROR("%s: Error getting namespace, status.rc=%d!", op.c_str(), static_cast<int>(rc.rc));
         return CmpiStatus(rc);
     }
-    const std::string ns = nsText != nullptr ? nsText : "";
     // Every answer is the request's path with the two role keys set anew; a
     // copy of it is changed, not the server's own object.
     CMPIObjectPath* copy = enc->ft->clone(enc, &rc);
@@ -416,8 +420,8 @@ CmpiStatus assocEnumInstanceNames(const AssocRow& row, const CmpiContext& ctx, C
         row.pairs([&](const EndItem& a, const EndItem& b) {
             if (stop)
                 return;
-            const CmpiObjectPath p1 = row.end1.cls->makePath(row.end1.cls->className, ns.c_str(), a);
-            const CmpiObjectPath p2 = row.end2.cls->makePath(row.end2.cls->className, ns.c_str(), b);
+            const CmpiObjectPath p1 = row.end1.cls->makePath(row.end1.cls->className, kModelNamespace, a);
+            const CmpiObjectPath p2 = row.end2.cls->makePath(row.end2.cls->className, kModelNamespace, b);
             // An end that no list slot matches (its list was built without
             // the adapter library) names no object: the pair is left out.
             if (p1.isNull() || p2.isNull())

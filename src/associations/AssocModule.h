@@ -42,6 +42,13 @@ struct _RegisteredProfile;
 // What a traversal hands back for each partner.
 enum FuncType { FUNC_ASSOC = 0, FUNC_ASSOCNAME = 1, FUNC_REF = 2, FUNC_REFNAME = 3 };
 
+// The namespace in which every class of the provider is served. Paths that
+// the provider builds for the objects of a search or an enumeration (the
+// partners, the ends of a pair) name it, whatever namespace the request came
+// in, so that a client can follow them: a request in the interop namespace
+// reaches ports and systems that are served only here.
+extern const char kModelNamespace[];
+
 // True if `role` is null or empty, or names `name` without regard to case.
 bool MatchRole(const char* role, const char* name);
 // True if `resultClass` is null or empty, or the class (on that namespace)

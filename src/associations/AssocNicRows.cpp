@@ -497,6 +497,12 @@ void onePair(const PairFn& pair)
 
 constexpr ExtraProperty kNoExtra{};
 
+// Every port, no key of the source read.
+bool everyPort(AssocRequest& rq)
+{
+    return eachPort([&](_CNAStruc* a, _CNAPortStruc* p) { return rq.partner(portItem(a, p)); });
+}
+
 }  // namespace
 
 #define NIC_ROW(X, cls, file, role1, end1, role2, end2, r2, r1, pairs, check2)                                    \
@@ -566,3 +572,39 @@ NIC_ROW(Nic_AssocPortControllerSoftwareInstallationService, "Vexlan_NIC_PortCont
         "Assoc_PortController_SoftwareInstallationService", "AffectedElement", kNicPortControllerEnd,
         "AffectingElement", kNicSoftwareInstallationServiceEnd, installerOfController, controllersOfInstaller,
         controllerInstallerPairs, nullptr);
+
+// The remote service access point's two: plain in style (the source known by
+// its class, the computer system also as CIM_System and CIM_ComputerSystem;
+// role and resultClass not tested), with the keys read and checked as the
+// other NIC rows read them.
+const AssocRow kAssocComputerSystemRemoteServiceAccessPoint = {
+    "Vexlan_NIC_ComputerSystemRemoteServiceAccessPoint",
+    "AssocComputerSystemRemoteServiceAccessPoint",
+    "Assoc_ComputerSystem_RemoteServiceAccessPoint",
+    AssocForm::PlainNoBuild,
+    {"Antecedent", &kComputerSystemEnd},
+    {"Dependent", &kRemoteServiceAccessPointEnd},
+    (portsByKey<macKey, &kName>),
+    hostByBackTest,
+    hostPortPairs,
+    kNoExtra,
+    nullptr,
+    getInstance_EthernetPort,
+    nullptr,
+    kAssocCheckedKeys};
+
+const AssocRow kAssocRemoteServiceAccessPointIPProtocolEndPoint = {
+    "Vexlan_NIC_RemoteServiceAccessPointIPProtocolEndpoint",
+    "AssocRemoteServiceAccessPointIPProtocolEndPoint",
+    "Assoc_RemoteServiceAccessPoint_IPProtocolEndPoint",
+    AssocForm::PlainNoBuild,
+    {"Antecedent", &kRemoteServiceAccessPointEnd},
+    {"Dependent", &kIPProtocolEndPointEnd},
+    everyPort,
+    (portsByKey<macKey, &kName>),
+    samePortPairs,
+    kNoExtra,
+    getInstance_ComputerSystem,
+    getInstance_EthernetPort,
+    nullptr,
+    kAssocCheckedKeys};

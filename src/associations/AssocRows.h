@@ -59,16 +59,28 @@
     X(Nic_AssocSoftwareIdentitySoftwareInstallationService)                          \
     X(Nic_AssocPortControllerSoftwareInstallationService)
 
+// The profile associations of the FC side and the remote service access
+// point's two, routed so that clients find the FC profiles' central
+// instances and can follow every class they name.
+#define VEXLAN_PROFILE_ASSOC_ROWS(X)                 \
+    X(AssocRegisteredProfileComputerSystem)          \
+    X(AssocRegisteredProfileObjectManager)           \
+    X(AssocRegisteredProfileRegisteredSubProfile)    \
+    X(AssocSoftwareIdentityRegisteredProfile)        \
+    X(AssocSoftwareIdentityRegisteredSubProfile)     \
+    X(AssocComputerSystemRemoteServiceAccessPoint)   \
+    X(AssocRemoteServiceAccessPointIPProtocolEndPoint)
+
 // The irregular module of profile conformance: one end of three classes.
-// The modules that no route reaches (the profile associations of the FC
-// side, the remote service access point's, the three-ended HBA, target and
-// LUN frame) are not written: the provider behaves the same without them.
+// The three-ended HBA, target and LUN frame has no relation to serve and no
+// association class, and is not written.
 #define VEXLAN_IRREGULAR_ASSOC_ROWS(X) X(AssocElementConformsToRegisteredProfile)
 
 #define VEXLAN_DECLARE_ASSOC_ROW(X) extern const AssocRow k##X;
 VEXLAN_FC_ASSOC_ROWS(VEXLAN_DECLARE_ASSOC_ROW)
 VEXLAN_NIC_ASSOC_ROWS(VEXLAN_DECLARE_ASSOC_ROW)
 VEXLAN_IRREGULAR_ASSOC_ROWS(VEXLAN_DECLARE_ASSOC_ROW)
+VEXLAN_PROFILE_ASSOC_ROWS(VEXLAN_DECLARE_ASSOC_ROW)
 #undef VEXLAN_DECLARE_ASSOC_ROW
 
 #endif

@@ -21,6 +21,7 @@
 #include "classes/Vexlan_NIC_NetworkPort.h"
 #include "classes/Vexlan_NIC_PortController.h"
 #include "classes/Vexlan_NIC_RegisteredProfile.h"
+#include "classes/Vexlan_NIC_RemoteServiceAccessPoint.h"
 #include "classes/Vexlan_FC_FCPortStatistics_CMPI.h"
 #include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "classes/Vexlan_FC_LogicalPortGroup_CMPI.h"
@@ -77,6 +78,9 @@ constexpr ClassOps ConcreteJob = CLASS_OPS(ConcreteJob);
 constexpr ClassOps Nic_SoftwareIdentity = CLASS_OPS(Nic_SoftwareIdentity);
 constexpr ClassOps Nic_SoftwareInstallationService = CLASS_OPS(Nic_SoftwareInstallationService);
 constexpr ClassOps Nic_SoftwareInstallationServiceCapabilities = CLASS_OPS(Nic_SoftwareInstallationServiceCapabilities);
+constexpr ClassOps RegisteredProfile = CLASS_OPS(RegisteredProfile);
+constexpr ClassOps RegisteredSubProfile = CLASS_OPS(RegisteredSubProfile);
+constexpr ClassOps RemoteServiceAccessPoint = CLASS_OPS(RemoteServiceAccessPoint);
 }  // namespace ops
 
 namespace lists {
@@ -153,6 +157,13 @@ constexpr ClassOps Nic_AssocPortControllerSoftwareInstallationService = ASSOC_CL
 constexpr ClassOps AssocComputerSystemIPProtocolEndPoint = ASSOC_CLASS_OPS(kAssocComputerSystemIPProtocolEndPoint);
 constexpr ClassOps AssocLANEndPointIPProtocolEndPoint = ASSOC_CLASS_OPS(kAssocLANEndPointIPProtocolEndPoint);
 constexpr ClassOps Nic_AssocComputerSystemSoftwareIdentity = ASSOC_CLASS_OPS(kNic_AssocComputerSystemSoftwareIdentity);
+constexpr ClassOps AssocRegisteredProfileComputerSystem = ASSOC_CLASS_OPS(kAssocRegisteredProfileComputerSystem);
+constexpr ClassOps AssocRegisteredProfileObjectManager = ASSOC_CLASS_OPS(kAssocRegisteredProfileObjectManager);
+constexpr ClassOps AssocRegisteredProfileRegisteredSubProfile = ASSOC_CLASS_OPS(kAssocRegisteredProfileRegisteredSubProfile);
+constexpr ClassOps AssocSoftwareIdentityRegisteredProfile = ASSOC_CLASS_OPS(kAssocSoftwareIdentityRegisteredProfile);
+constexpr ClassOps AssocSoftwareIdentityRegisteredSubProfile = ASSOC_CLASS_OPS(kAssocSoftwareIdentityRegisteredSubProfile);
+constexpr ClassOps AssocComputerSystemRemoteServiceAccessPoint = ASSOC_CLASS_OPS(kAssocComputerSystemRemoteServiceAccessPoint);
+constexpr ClassOps AssocRemoteServiceAccessPointIPProtocolEndPoint = ASSOC_CLASS_OPS(kAssocRemoteServiceAccessPointIPProtocolEndPoint);
 }  // namespace ops
 
 namespace lists {
@@ -219,6 +230,14 @@ constexpr InstanceRoute kInstanceRoutes[] = {
     {"Vexlan_FCHBA_SoftwareInstallationServiceSoftwareInstallationServiceCapabilities", ops::AssocSoftwareInstallationServiceSoftwareInstallationServiceCapabilities, nullptr, RouteGroup::Always},
     {"Vexlan_FCHBA_ComputerSystemSoftwareInstallationService", ops::AssocComputerSystemSoftwareInstallationService, nullptr, RouteGroup::Always},
     {"Vexlan_Adapter_ConcreteJob", ops::ConcreteJob, nullptr, RouteGroup::Always},
+    // The FC profiles and their associations, routed for profile discovery.
+    {"Vexlan_FCHBA_RegisteredProfile", ops::RegisteredProfile, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_RegisteredSubProfile", ops::RegisteredSubProfile, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_RegisteredProfileComputerSystem", ops::AssocRegisteredProfileComputerSystem, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_RegisteredProfileObjectManager", ops::AssocRegisteredProfileObjectManager, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_RegisteredProfileRegisteredSubProfile", ops::AssocRegisteredProfileRegisteredSubProfile, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_SoftwareIdentityRegisteredProfile", ops::AssocSoftwareIdentityRegisteredProfile, nullptr, RouteGroup::Always},
+    {"Vexlan_FCHBA_SoftwareIdentityRegisteredSubProfile", ops::AssocSoftwareIdentityRegisteredSubProfile, nullptr, RouteGroup::Always},
     // Group 2, walked only when g_SUPPORT_HDR is not zero
     {"Vexlan_FCHBA_StorageExtent", ops::StorageExtent, &lists::StorageExtentList, RouteGroup::SupportHdr},
     {"Vexlan_FCHBA_SCSIProtocolEndpointHBA", ops::SCSIProtocolEndpointHBA, nullptr, RouteGroup::SupportHdr},
@@ -258,6 +277,10 @@ constexpr InstanceRoute kInstanceRoutes[] = {
     {"Vexlan_NIC_ComputerSystemIPProtocolEndpoint", ops::AssocComputerSystemIPProtocolEndPoint, nullptr, RouteGroup::Nic},
     {"Vexlan_NIC_LANEndpointIPProtocolEndpoint", ops::AssocLANEndPointIPProtocolEndPoint, nullptr, RouteGroup::Nic},
     {"Vexlan_NIC_ComputerSystemSoftwareIdentity", ops::Nic_AssocComputerSystemSoftwareIdentity, nullptr, RouteGroup::Nic},
+    // The remote service access point and its two associations.
+    {"Vexlan_NIC_RemoteServiceAccessPoint", ops::RemoteServiceAccessPoint, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_ComputerSystemRemoteServiceAccessPoint", ops::AssocComputerSystemRemoteServiceAccessPoint, nullptr, RouteGroup::Nic},
+    {"Vexlan_NIC_RemoteServiceAccessPointIPProtocolEndpoint", ops::AssocRemoteServiceAccessPointIPProtocolEndPoint, nullptr, RouteGroup::Nic},
 };
 
 // ---- Build sequence ------------------------------------------------------------------
