@@ -38,7 +38,9 @@ const char kUsage[] =
     "  -m, --mof PATH           MOF file, or directory of *.mof files; repeatable\n"
     "      --reg FILE           sfcb registration file ([Class] sections with type:\n"
     "                           lines): the sfcb flavour then creates one MI per\n"
-    "                           section and provider type, as sfcb does; repeatable\n"
+    "                           section and provider type, as sfcb does; the pegasus\n"
+    "                           flavour calls the provider for its association\n"
+    "                           sections, as OpenPegasus does; repeatable\n"
     "  -N, --namespace NS       namespace of paths that name none (default root/cimv2)\n"
     "  -s, --strict             check every returned instance, path, return value and\n"
     "                           output argument against its MOF class (unknown\n"
@@ -729,7 +731,9 @@ int runCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
         if (s.name.empty()) s.name = installed->name;
         if (s.mofs.empty()) s.mofs.push_back(installed->mofDir);
         if (s.defaultNs.empty()) s.defaultNs = installed->nameSpace;
-        if (s.regs.empty() && s.flavour == Flavour::Sfcb && !installed->registration.empty())
+        // sfcb makes its MIs by the sections; OpenPegasus calls the provider
+        // for the association classes that the registration serves.
+        if (s.regs.empty() && !installed->registration.empty())
             s.regs.push_back(installed->registration);
     }
 

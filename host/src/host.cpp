@@ -196,6 +196,41 @@ std::string Host::Impl::sectionFor(const std::string& cls, MiType type) const {
     return std::string();
 }
 
+std::vector<std::string> Host::Impl::associationClassesFor(const std::string& sourceClass,
+                                                           const std::string& named) const {
+    // The provider's association classes: those its registration serves as
+    // associations, or without one every concrete association class that no
+    // other class of the repository derives from (a schema class with
+    // subclasses of the provider is not the provider's).
+    std::vector<std::string> own;
+    const std::vector<std::string> all = repo.classNames();
+    if (!registrations.empty()) {
+        for (const auto& r : registrations)
+            if (std::find(r.types.begin(), r.types.end(), MiType::Association) != r.types.end())
+                own.push_back(r.className);
+    } else {
+        for (const auto& c : all) {
+            const ClassDecl* d = repo.find(c);
+            if (!d || !d->association || d->abstract) continue;
+            bool hasSubclass = false;
+            for (const auto& other : all) {
+                const ClassDecl* o = repo.find(other);
+                hasSubclass = hasSubclass || (o && namesEqual(o->superClass, c));
+            }
+            if (!hasSubclass) own.push_back(c);
+        }
+    }
+    std::vector<std::string> out;
+    for (const auto& c : own) {
+        if (!named.empty() && !repo.isA(c, named)) continue;
+        bool refersToSource = false;
+        for (const auto& p : repo.allProperties(c))
+            refersToSource = refersToSource || (!p.refClass.empty() && repo.isA(sourceClass, p.refClass));
+        if (refersToSource) out.push_back(c);
+    }
+    return out;
+}
+
 void* Host::Impl::getMi(MiType type, const std::string& cls, OpResult& r) {
     std::lock_guard<std::mutex> g(miLock);
     const int t = static_cast<int>(type);
@@ -556,7 +591,71 @@ OpResult Host::deleteInstance(const ObjectPath& path) {
                                     const CMPIObjectPath* op) { return mi->ft->deleteInstance(mi, ctx, res, op); });
 }
 
-OpResult Host::associators(const ObjectPath& path, const AssocParams& p, const PropertyList& props) {
+namespace {
+
+// An association request as the flavour makes it. sfcb hands the provider
+// the client's association class as it stands. OpenPegasus calls the
+// provider once for each of its association classes that can reference the
+// source's class and is the named class or derives from it (every such
+// class when none is named), hands it that class as assocClass (associators)
+// or resultClass (references), and merges the answers; the first failure
+// ends the request.
+template <class Call>
+OpResult fanOut(Host::Impl& c, const ObjectPath& path, const std::string& named, Call call) {
+    if (c.flavour == Flavour::Sfcb) return call(named);
+    OpResult merged;
+    merged.done = true;
+    for (const std::string& cls : c.associationClassesFor(path.className, named)) {
+        OpResult one = call(cls);
+        merged.instances.insert(merged.instances.end(), one.instances.begin(), one.instances.end());
+        merged.paths.insert(merged.paths.end(), one.paths.begin(), one.paths.end());
+        merged.data.insert(merged.data.end(), one.data.begin(), one.data.end());
+        merged.strictErrors.insert(merged.strictErrors.end(), one.strictErrors.begin(), one.strictErrors.end());
+        merged.done = merged.done && one.done;
+        if (!one.ok()) {
+            merged.rc = one.rc;
+            merged.message = one.message;
+            break;
+        }
+    }
+    return merged;
+}
+
+}  // namespace
+
+OpResult Host::associators(const ObjectPath& path, const AssocParams& given, const PropertyList& props) {
+    return fanOut(*impl_, path, given.assocClass, [&](const std::string& cls) {
+        AssocParams p = given;
+        p.assocClass = cls;
+        return associatorsAsCalled(path, p, props);
+    });
+}
+
+OpResult Host::associatorNames(const ObjectPath& path, const AssocParams& given) {
+    return fanOut(*impl_, path, given.assocClass, [&](const std::string& cls) {
+        AssocParams p = given;
+        p.assocClass = cls;
+        return associatorNamesAsCalled(path, p);
+    });
+}
+
+OpResult Host::references(const ObjectPath& path, const AssocParams& given, const PropertyList& props) {
+    return fanOut(*impl_, path, given.resultClass, [&](const std::string& cls) {
+        AssocParams p = given;
+        p.resultClass = cls;
+        return referencesAsCalled(path, p, props);
+    });
+}
+
+OpResult Host::referenceNames(const ObjectPath& path, const AssocParams& given) {
+    return fanOut(*impl_, path, given.resultClass, [&](const std::string& cls) {
+        AssocParams p = given;
+        p.resultClass = cls;
+        return referenceNamesAsCalled(path, p);
+    });
+}
+
+OpResult Host::associatorsAsCalled(const ObjectPath& path, const AssocParams& p, const PropertyList& props) {
     CList pl(props);
     return runOp<CMPIAssociationMI>(
         *impl_, MiType::Association, path, ResultKind::Instances,
@@ -566,7 +665,7 @@ OpResult Host::associators(const ObjectPath& path, const AssocParams& p, const P
         });
 }
 
-OpResult Host::associatorNames(const ObjectPath& path, const AssocParams& p) {
+OpResult Host::associatorNamesAsCalled(const ObjectPath& path, const AssocParams& p) {
     return runOp<CMPIAssociationMI>(
         *impl_, MiType::Association, path, ResultKind::Paths,
         [&](CMPIAssociationMI* mi, const CMPIContext* ctx, const CMPIResult* res, const CMPIObjectPath* op) {
@@ -575,7 +674,7 @@ OpResult Host::associatorNames(const ObjectPath& path, const AssocParams& p) {
         });
 }
 
-OpResult Host::references(const ObjectPath& path, const AssocParams& p, const PropertyList& props) {
+OpResult Host::referencesAsCalled(const ObjectPath& path, const AssocParams& p, const PropertyList& props) {
     CList pl(props);
     return runOp<CMPIAssociationMI>(
         *impl_, MiType::Association, path, ResultKind::Instances,
@@ -584,7 +683,7 @@ OpResult Host::references(const ObjectPath& path, const AssocParams& p, const Pr
         });
 }
 
-OpResult Host::referenceNames(const ObjectPath& path, const AssocParams& p) {
+OpResult Host::referenceNamesAsCalled(const ObjectPath& path, const AssocParams& p) {
     return runOp<CMPIAssociationMI>(
         *impl_, MiType::Association, path, ResultKind::Paths,
         [&](CMPIAssociationMI* mi, const CMPIContext* ctx, const CMPIResult* res, const CMPIObjectPath* op) {

@@ -252,6 +252,11 @@ struct Host::Impl {
     // Operations.
     void* getMi(MiType type, const std::string& cls, OpResult& r);
     std::string sectionFor(const std::string& cls, MiType type) const;
+    // The provider's association classes that OpenPegasus would call it for
+    // from an object of `sourceClass`: each one that has a reference to that
+    // class or a class it derives from, and is `named` or derives from it
+    // (every such class when `named` is empty).
+    std::vector<std::string> associationClassesFor(const std::string& sourceClass, const std::string& named) const;
     std::string nsOf(const ObjectPath& p) const { return p.nameSpace.empty() ? defaultNs : p.nameSpace; }
     ObjectPath withNs(const ObjectPath& p) const {
         ObjectPath q = p;

@@ -157,6 +157,46 @@ TEST_F(HostTest, AssociationOperationsPassTheirFilters) {
     EXPECT_EQ(r.paths[0].key("Name")->s, "beta");
 }
 
+// The tiny provider answers only when it is handed no association class or
+// its own, Tiny_Link. OpenPegasus hands it Tiny_Link for a request that names
+// the parent Tiny_Relation or nothing, and never calls it for a class it does
+// not serve; sfcb hands over the client's class as it stands.
+TEST_F(HostTest, AssociationRequestsReachTheProviderAsEachServerMakesThem) {
+    const ObjectPath alpha = p("Tiny_Thing.Name=\"alpha\",Id=1");
+    struct Case {
+        const char* named;
+        std::size_t pegasus, sfcb;
+    } cases[] = {{"", 1, 1}, {"Tiny_Link", 1, 1}, {"Tiny_Relation", 1, 0}, {"Tiny_Thing", 0, 0}, {"No_Such", 0, 0}};
+    for (const Case& c : cases) {
+        for (Flavour f : {Flavour::Pegasus, Flavour::Sfcb}) {
+            h.setFlavour(f);
+            const std::size_t want = f == Flavour::Pegasus ? c.pegasus : c.sfcb;
+            const std::string what = std::string(flavourName(f)) + " " + c.named;
+            AssocParams ap;
+            ap.assocClass = c.named;
+            OpResult r = h.associatorNames(alpha, ap);
+            EXPECT_TRUE(r.ok()) << what << ": " << statusLine(r);
+            EXPECT_TRUE(r.done) << what;
+            EXPECT_EQ(r.paths.size(), want) << what;
+            EXPECT_EQ(h.associators(alpha, ap).instances.size(), want) << what;
+            ap = AssocParams();
+            ap.resultClass = c.named;
+            EXPECT_EQ(h.referenceNames(alpha, ap).paths.size(), want) << what;
+            EXPECT_EQ(h.references(alpha, ap).instances.size(), want) << what;
+        }
+    }
+    // The provider's association classes are its registration's when there is one.
+    h.setFlavour(Flavour::Pegasus);
+    h.setRegistrations({Registration{"Tiny_Thing", {MiType::Instance}}});
+    EXPECT_TRUE(h.associatorNames(alpha).paths.empty());
+    h.setRegistrations({Registration{"Tiny_Link", {MiType::Instance, MiType::Association}}});
+    EXPECT_EQ(h.associatorNames(alpha).paths.size(), 1u);
+    // The calls as made, whatever the flavour.
+    AssocParams parent;
+    parent.assocClass = "Tiny_Relation";
+    EXPECT_TRUE(h.associatorNamesAsCalled(alpha, parent).paths.empty());
+}
+
 TEST_F(HostTest, InvokeMethodPassesTypedArgumentsBothWays) {
     const ObjectPath alpha = p("Tiny_Thing.Name=\"alpha\",Id=1");
     OpResult r = h.invokeMethod(alpha, "Echo",

@@ -266,11 +266,21 @@ class GeneratedFiles(TreeTest):
                       '   namespace: root/vexlan_cmpi\n', reg)
         self.assertIn('namespace: root/vexlan_cmpi root/interop', reg)
         pg = self.tree.read('out/Vexlan_CNA_Provider_Registration.mof')
-        self.assertIn('Namespaces = {"root/vexlan_cmpi", "root/PG_InterOp"};', pg)
+        # OpenPegasus's interop namespace belongs to its own interop provider:
+        # the profiles go there as PG_ProviderProfileCapabilities, no class does.
+        self.assertNotIn('PG_InterOp"', pg)
+        self.assertIn('ClassName = "Vexlan_NIC_RegisteredProfile";\n    Namespaces = {"root/vexlan_cmpi"};', pg)
+        self.assertIn('RegisteredProfile = 6;', pg)
+        self.assertIn('RegisteredSubProfiles = {1019, 1024};', pg)
+        self.assertIn('ConformingElements = {"Vexlan_Adapter_ComputerSystem"};', pg)
         self.assertIn('ProviderType = {2, 5};', pg)
         self.assertIn('ProviderType = {4};', pg)
 
     def test_unregistered_rows_are_declared_but_not_registered(self):
+        self.tree.edit_row('Vexlan_NIC_RemoteServiceAccessPoint', 'types', '-')
+        for assoc in ('Vexlan_NIC_ComputerSystemRemoteServiceAccessPoint',
+                      'Vexlan_NIC_RemoteServiceAccessPointIPProtocolEndpoint'):
+            self.tree.edit_row(assoc, 'types', '-')
         self.gen()
         self.assertNotIn('[Vexlan_NIC_RemoteServiceAccessPoint]', self.tree.read('out/Vexlan_CNA_Provider.reg'))
         self.assertNotIn('"Vexlan_NIC_RemoteServiceAccessPoint"', self.tree.read('out/Vexlan_CNA_Provider_Registration.mof'))
@@ -296,10 +306,14 @@ class GeneratedFiles(TreeTest):
         self.gen()
         self.tree.replace('out/Vexlan_CNA_Provider.reg', '[Vexlan_FCHBA_FCPort]', '[Vexlan_FCHBA_FCPortX]')
         self.tree.replace('out/Vexlan_CNA_Provider_Registration.mof', 'ProviderType = {2, 5};', 'ProviderType = {2};')
-        self.tree.replace('out/Vexlan_CNA_Provider_Interop.mof', 'class Vexlan_FCHBA_Namespace ', 'class Vexlan_FCHBA_NamespaceX ')
+        self.tree.replace('out/Vexlan_CNA_Provider_Interop.mof', 'class Vexlan_FCHBA_RegisteredProfile ',
+                          'class Vexlan_FCHBA_RegisteredProfileX ')
+        self.tree.replace('out/Vexlan_CNA_Provider_Registration.mof', 'ConformingElements = {"Vexlan_NIC_NetworkPort"}',
+                          'ConformingElements = {"Vexlan_NIC_NetworkPortX"}')
         errors = self.tree.errors(generated=self.out)
         for fragment in ('Vexlan_FCHBA_FCPort has no section', 'section vexlan_fchba_fcportx has no registered row',
-                         'has ProviderType', 'Vexlan_CNA_Provider_Interop.mof: holds'):
+                         'has ProviderType', 'Vexlan_CNA_Provider_Interop.mof: holds',
+                         'names Vexlan_NIC_NetworkPortX, which the provider does not serve'):
             self.assertTrue(any(fragment in e for e in errors), (fragment, errors))
 
     def test_bad_table_stops_the_generator(self):

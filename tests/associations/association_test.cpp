@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <fstream>
+#include <map>
 #include <set>
 #include <sstream>
 #include <string>
@@ -124,12 +125,22 @@ protected:
 TEST_F(Associations, EveryEnumeratedPairIsFoundFromBothEnds)
 {
     const std::vector<std::string> classes = associationClasses();
-    ASSERT_EQ(classes.size(), 48u);
+    ASSERT_EQ(classes.size(), 55u);
+    // From the computer system the join compares each port's MAC with the
+    // system's Name, so only the way back finds these pairs.
+    const std::set<std::string> onlyFromSecondEnd = {"Vexlan_NIC_ComputerSystemRemoteServiceAccessPoint"};
+    // getInstance proves the access point through the computer system's
+    // class, which knows no access point.
+    const std::set<std::string> refusedByGetInstance = {"Vexlan_NIC_RemoteServiceAccessPointIPProtocolEndpoint"};
+    // The Server profile names the computer system's host, the object
+    // manager its own host name: where they differ there is no pair.
+    const std::set<std::string> hostDependent = {"Vexlan_FCHBA_RegisteredProfileObjectManager"};
     int walked = 0;
     for (const std::string& cls : classes) {
         OpResult pairs = host().enumerateInstanceNames(classPath(cls));
         expectClean(pairs, cls);
-        EXPECT_FALSE(pairs.paths.empty()) << cls << " has no pairs on the default host";
+        if (!hostDependent.count(cls))
+            EXPECT_FALSE(pairs.paths.empty()) << cls << " has no pairs on the default host";
         OpResult full = host().enumerateInstances(classPath(cls));
         expectClean(full, cls);
         EXPECT_EQ(full.instances.size(), pairs.paths.size()) << cls;
@@ -150,40 +161,115 @@ TEST_F(Associations, EveryEnumeratedPairIsFoundFromBothEnds)
             const OpResult from2 = host().associatorNames(end2, assoc(cls));
             expectClean(from1, cls + " from " + end1.className);
             expectClean(from2, cls + " from " + end2.className);
-            EXPECT_TRUE(identities(from1.paths).count(identity(end2))) << cls << ": " << identity(end1);
+            if (!onlyFromSecondEnd.count(cls))
+                EXPECT_TRUE(identities(from1.paths).count(identity(end2))) << cls << ": " << identity(end1);
             EXPECT_TRUE(identities(from2.paths).count(identity(end1))) << cls << ": " << identity(end2);
-            const OpResult refs = host().referenceNames(end1, result(cls));
+            const OpResult refs = host().referenceNames(onlyFromSecondEnd.count(cls) ? end2 : end1, result(cls));
             expectClean(refs, cls);
             EXPECT_TRUE(identities(refs.paths).count(identity(pair))) << cls;
             const OpResult got = host().getInstance(pair);
-            expectClean(got, cls);
-            EXPECT_EQ(got.instances.size(), 1u) << cls;
+            if (refusedByGetInstance.count(cls)) {
+                EXPECT_EQ(got.rc, CMPI_RC_ERR_NOT_FOUND) << cls;
+            } else {
+                expectClean(got, cls);
+                EXPECT_EQ(got.instances.size(), 1u) << cls;
+            }
             ++walked;
         }
     }
     EXPECT_GT(walked, 100);
 }
 
-TEST_F(Associations, ACimParentNameRunsEveryModuleOfItForTheSource)
+// The recipe walks of the FC HBA and NIC profiles name CIM parent classes.
+// OpenPegasus asks the provider once for each of its classes derived from the
+// parent (the host's pegasus flavour); sfcb hands the parent over as it is
+// (the call as made): both must give the same answers.
+TEST_F(Associations, ParentClassWalksAnswerAlikeInBothServers)
 {
-    const ObjectPath cs = firstOf(host(), "Vexlan_Adapter_ComputerSystem");
-    const OpResult r = host().referenceNames(cs, result("CIM_SystemDevice"));
-    expectClean(r, "CIM_SystemDevice");
-    EXPECT_EQ(classesOf(r.paths),
-              (std::vector<std::string>{"Vexlan_FCHBA_ComputerSystemFCPort", "Vexlan_FCHBA_ComputerSystemPortController",
-                                        "Vexlan_FCHBA_ComputerSystemSCSIProtocolController",
-                                        "Vexlan_FCHBA_ComputerSystemStorageExtent"}));
+    enum Op { Names, Refs };
+    struct Walk {
+        const char* source;
+        Op op;
+        const char* parent;
+        const char* resultClass;
+        std::vector<std::string> classes;   // association classes of the references, when known
+    } walks[] = {
+        {"Vexlan_Adapter_ComputerSystem", Names, "CIM_SystemDevice", "CIM_FCPort", {}},
+        {"Vexlan_Adapter_ComputerSystem", Refs, "CIM_SystemDevice", "",
+         {"Vexlan_FCHBA_ComputerSystemFCPort", "Vexlan_FCHBA_ComputerSystemPortController",
+          "Vexlan_FCHBA_ComputerSystemSCSIProtocolController", "Vexlan_FCHBA_ComputerSystemStorageExtent",
+          "Vexlan_NIC_ComputerSystemEthernetPort", "Vexlan_NIC_ComputerSystemNetworkPort",
+          "Vexlan_NIC_ComputerSystemPortController"}},
+        {"Vexlan_Adapter_ComputerSystem", Refs, "CIM_HostedAccessPoint", "", {}},
+        {"Vexlan_Adapter_ComputerSystem", Names, "CIM_HostedService", "", {}},
+        {"Vexlan_Adapter_ComputerSystem", Refs, "CIM_HostedService", "", {}},
+        {"Vexlan_Adapter_ComputerSystem", Names, "CIM_InstalledSoftwareIdentity", "", {}},
+        {"Vexlan_Adapter_ComputerSystem", Refs, "CIM_InstalledSoftwareIdentity", "",
+         {"Vexlan_FCHBA_ComputerSystemSoftwareIdentity", "Vexlan_NIC_ComputerSystemSoftwareIdentity"}},
+        {"Vexlan_FCHBA_FCPort", Names, "CIM_ControlledBy", "", {}},
+        {"Vexlan_FCHBA_FCPort", Names, "CIM_ElementStatisticalData", "", {}},
+        {"Vexlan_FCHBA_FCPort", Names, "CIM_DeviceSAPImplementation", "", {}},
+        {"Vexlan_FCHBA_FCPort", Refs, "CIM_Realizes", "",
+         {"Vexlan_FCHBA_PhysicalConnectorFCPort", "Vexlan_FCHBA_PhysicalPortFCPort"}},
+        {"Vexlan_FCHBA_SoftwareInstallationService", Names, "CIM_ElementCapabilities", "", {}},
+        {"Vexlan_NIC_SoftwareInstallationService", Refs, "CIM_ElementCapabilities", "", {}},
+        {"Vexlan_NIC_EthernetPort2", Refs, "CIM_SystemDevice", "", {"Vexlan_NIC_ComputerSystemEthernetPort"}},
+        {"Vexlan_NIC_EthernetPort2", Refs, "CIM_Realizes", "",
+         {"Vexlan_NIC_PhysicalConnectorEthernetPort", "Vexlan_NIC_PhysicalPortEthernetPort"}},
+        {"Vexlan_NIC_EthernetPort2", Names, "CIM_PortImplementsEndpoint", "", {}},
+        {"Vexlan_NIC_EthernetPort2", Refs, "CIM_PortImplementsEndpoint", "", {"Vexlan_NIC_EthernetPortLANEndpoint"}},
+        {"Vexlan_NIC_EthernetPort2", Refs, "CIM_ControlledBy", "", {"Vexlan_NIC_PortControllerEthernetPort"}},
+        {"Vexlan_NIC_LANEndpoint", Names, "CIM_BindsToLANEndpoint", "", {}},
+        {"Vexlan_NIC_LANEndpoint", Refs, "CIM_BindsToLANEndpoint", "", {"Vexlan_NIC_LANEndpointIPProtocolEndpoint"}},
+    };
+    for (const Walk& w : walks) {
+        const ObjectPath source = firstOf(host(), w.source);
+        const std::string what = std::string(w.source) + (w.op == Names ? " associatorNames " : " referenceNames ") +
+                                 w.parent;
+        AssocParams p;
+        (w.op == Names ? p.assocClass : p.resultClass) = w.parent;
+        if (w.op == Names)
+            p.resultClass = w.resultClass;
+        const OpResult pegasus = w.op == Names ? host().associatorNames(source, p) : host().referenceNames(source, p);
+        const OpResult sfcb =
+            w.op == Names ? host().associatorNamesAsCalled(source, p) : host().referenceNamesAsCalled(source, p);
+        expectClean(pegasus, what + " (OpenPegasus)");
+        expectClean(sfcb, what + " (sfcb)");
+        EXPECT_FALSE(sfcb.paths.empty()) << what;
+        EXPECT_EQ(identities(sfcb.paths), identities(pegasus.paths)) << what;
+        EXPECT_EQ(sfcb.paths.size(), pegasus.paths.size()) << what;
+        if (!w.classes.empty())
+            EXPECT_EQ(classesOf(sfcb.paths), w.classes) << what;
+    }
+    // The ports a client wants from the system: the FC ports are all there.
+    AssocParams ports = assoc("CIM_SystemDevice");
+    ports.resultClass = "CIM_FCPort";
+    const OpResult found = host().associatorNamesAsCalled(firstOf(host(), "Vexlan_Adapter_ComputerSystem"), ports);
+    std::set<std::string> got = identities(found.paths);
+    for (const ObjectPath& port : host().enumerateInstanceNames(classPath("Vexlan_FCHBA_FCPort")).paths)
+        EXPECT_TRUE(got.count(identity(port))) << identity(port);
+}
 
-    // The associator operations' gate knows the association classes by
-    // their own names only: a CIM parent name closes it.
-    const OpResult gated = host().associatorNames(cs, assoc("CIM_SystemDevice"));
-    expectClean(gated, "associatorNames CIM_SystemDevice");
+// What a server hands over that names no class keeps the dispatch table's
+// meaning: the misspelled parent of the FC port's realizations in
+// referenceNames, and an association class that doesn't stand at the source.
+TEST_F(Associations, TextsThatNameNoDerivedClassKeepTheirDispatch)
+{
+    const ObjectPath port = firstOf(host(), "Vexlan_FCHBA_FCPort");
+    const OpResult old = host().referenceNamesAsCalled(port, result("CIM_Reailizes"));
+    expectClean(old, "referenceNames CIM_Reailizes");
+    EXPECT_EQ(classesOf(old.paths), (std::vector<std::string>{"Vexlan_FCHBA_PhysicalConnectorFCPort",
+                                                              "Vexlan_FCHBA_PhysicalPortFCPort"}));
+    // OpenPegasus knows no such class and never asks the provider.
+    EXPECT_TRUE(host().referenceNames(port, result("CIM_Reailizes")).paths.empty());
+
+    const OpResult gated = host().associatorNamesAsCalled(firstOf(host(), "Vexlan_Adapter_Product"),
+                                                          assoc("Vexlan_FCHBA_ComputerSystemFCPort"));
+    expectClean(gated, "gate");
     EXPECT_TRUE(gated.paths.empty());
-
-    // The NIC associations answer to their own name only.
-    const OpResult nic = host().references(firstOf(host(), "Vexlan_NIC_EthernetPort2"), result("CIM_Realizes"));
-    expectClean(nic, "CIM_Realizes from a NIC port");
-    EXPECT_TRUE(nic.instances.empty());
+    const OpResult unrelated = host().associatorNamesAsCalled(port, assoc("CIM_MemberOfCollection"));
+    expectClean(unrelated, "CIM_MemberOfCollection from a port");
+    EXPECT_EQ(classesOf(unrelated.paths), (std::vector<std::string>{"Vexlan_FCHBA_LogicalPortGroup"}));
 }
 
 TEST_F(Associations, WithoutAnAssociationClassEveryRowOfTheSourceRuns)
@@ -200,58 +286,30 @@ TEST_F(Associations, WithoutAnAssociationClassEveryRowOfTheSourceRuns)
     EXPECT_TRUE(std::count(classes.begin(), classes.end(), "Vexlan_FCHBA_ComputerSystemFCPort"));
     EXPECT_TRUE(std::count(classes.begin(), classes.end(), "Vexlan_NIC_ComputerSystemEthernetPort"));
     EXPECT_TRUE(std::count(classes.begin(), classes.end(), "Vexlan_NIC_ComputerSystemSoftwareInstallationService"));
-    EXPECT_GT(countLog("m_assocLookupTableSize = 102"), 0);
-}
-
-TEST_F(Associations, FromAnFCPortReferenceNamesKnowsRealizesOnlyByItsOldSpelling)
-{
-    const ObjectPath port = firstOf(host(), "Vexlan_FCHBA_FCPort");
-    const OpResult right = host().referenceNames(port, result("CIM_Realizes"));
-    expectClean(right, "referenceNames CIM_Realizes");
-    EXPECT_TRUE(right.paths.empty());
-
-    const OpResult old = host().referenceNames(port, result("CIM_Reailizes"));
-    expectClean(old, "referenceNames CIM_Reailizes");
-    EXPECT_EQ(classesOf(old.paths), (std::vector<std::string>{"Vexlan_FCHBA_PhysicalConnectorFCPort",
-                                                              "Vexlan_FCHBA_PhysicalPortFCPort"}));
-
-    const OpResult refs = host().references(port, result("CIM_Realizes"));
-    expectClean(refs, "references CIM_Realizes");
-    EXPECT_EQ(refs.instances.size(), 2u);
-    const OpResult names = host().associatorNames(port, assoc("Vexlan_FCHBA_PhysicalPortFCPort"));
-    expectClean(names, "associatorNames of the physical port");
-    EXPECT_EQ(classesOf(names.paths), (std::vector<std::string>{"Vexlan_Adapter_PhysicalPort"}));
+    EXPECT_GT(countLog("m_assocLookupTableSize = 112"), 0);
 }
 
 TEST_F(Associations, AClassOutsideTheTableHasNoAssociatorsAndNothingFails)
 {
+    // OpenPegasus asks for each association class that can reference the
+    // job: the three conformance classes, whose managed element is any
+    // CIM_ManagedElement; the gate closes each time. sfcb asks once, with no
+    // association class.
     const ObjectPath job = classPath("Vexlan_Adapter_ConcreteJob");
     removeLog();
     OpResult r = host().associators(job);
     expectClean(r, "associators of a job");
     EXPECT_TRUE(r.instances.empty());
+    EXPECT_EQ(countLog("Class Vexlan_Adapter_ConcreteJob has no associators"), 3);
+    removeLog();
+    r = host().associatorsAsCalled(job, {});
+    expectClean(r, "associators of a job");
+    EXPECT_TRUE(r.instances.empty());
     EXPECT_EQ(countLog("Class Vexlan_Adapter_ConcreteJob has no associators"), 1);
-    r = host().associatorNames(job);
+    r = host().associatorNamesAsCalled(job, {});
     EXPECT_EQ(countLog("Class Vexlan_Adapter_ConcreteJob has no associatorNames"), 1);
-    r = host().referenceNames(job);
+    r = host().referenceNamesAsCalled(job, {});
     expectClean(r, "referenceNames of a job");
-    EXPECT_TRUE(r.paths.empty());
-
-    // The two classes of the lookup table that no test of the chain names:
-    // the gate opens, nothing runs.
-    r = host().associatorNames(firstOf(host(), "Vexlan_FCHBA_ObjectManager"),
-                               assoc("Vexlan_FCHBA_RegisteredProfileObjectManager"));
-    expectClean(r, "profile of the object manager");
-    EXPECT_TRUE(r.paths.empty());
-    EXPECT_GT(countLog("Class Vexlan_FCHBA_ObjectManager has associators"), 0);
-    r = host().referenceNames(firstOf(host(), "Vexlan_Adapter_ComputerSystem"),
-                              result("Vexlan_NIC_ComputerSystemRemoteServiceAccessPoint"));
-    expectClean(r, "remote service access point");
-    EXPECT_TRUE(r.paths.empty());
-
-    // An association class that doesn't stand at the source closes the gate.
-    r = host().associatorNames(firstOf(host(), "Vexlan_Adapter_Product"), assoc("Vexlan_FCHBA_ComputerSystemFCPort"));
-    expectClean(r, "gate");
     EXPECT_TRUE(r.paths.empty());
 }
 
@@ -389,6 +447,167 @@ TEST_F(Associations, NicSoftwareIdentitiesOfOtherKindsHaveNoPartners)
         const bool admitted = std::string(kind) == "2" || std::string(kind) == "3" || std::string(kind) == "258";
         EXPECT_EQ(r.paths.size(), admitted ? 1u : 0u) << kind;
     }
+}
+
+// The first steps of a management client: the profiles in the interop
+// namespace, then each profile's central instances through the CIM parent
+// of conformance, with ResultRole ManagedElement; in both servers. Every
+// path the provider returns names the namespace where its object is served.
+TEST_F(Associations, ProfilesInTheInteropNamespaceLeadToTheirCentralInstances)
+{
+    const std::string interop = "root/interop";
+    auto inInterop = [&](ObjectPath p) {
+        p.nameSpace = interop;
+        return p;
+    };
+    AssocParams conformance = assoc("CIM_ElementConformsToProfile");
+    conformance.resultRole = "ManagedElement";
+    struct Central {
+        const char* profileClass;
+        const char* registeredName;
+        const char* centralClass;
+    } centrals[] = {
+        {"Vexlan_FCHBA_RegisteredProfile", "FC HBA", "Vexlan_Adapter_ComputerSystem"},
+        {"Vexlan_NIC_RegisteredProfile", "Ethernet Port", "Vexlan_NIC_EthernetPort2"},
+        {"Vexlan_NIC_RegisteredProfile", "Host LAN Network Port", "Vexlan_NIC_NetworkPort"},
+        {"Vexlan_NIC_RegisteredProfile", "IP Interface", "Vexlan_NIC_IPProtocolEndpoint"},
+    };
+    for (const Central& c : centrals) {
+        OpResult profiles = host().enumerateInstances(inInterop(classPath(c.profileClass)));
+        expectClean(profiles, c.profileClass);
+        const Instance* profile = nullptr;
+        for (const Instance& i : profiles.instances)
+            if (propertyText(i, "RegisteredName") == c.registeredName)
+                profile = &i;
+        ASSERT_NE(profile, nullptr) << c.registeredName;
+        EXPECT_EQ(profile->path.nameSpace, interop);
+        const OpResult pegasus = host().associatorNames(profile->path, conformance);
+        const OpResult sfcb = host().associatorNamesAsCalled(profile->path, conformance);
+        expectClean(sfcb, c.registeredName);
+        const size_t have = enumerate(host(), c.centralClass).instances.size();
+        ASSERT_GT(have, 0u) << c.centralClass;
+        EXPECT_EQ(classesOf(sfcb.paths), std::vector<std::string>{c.centralClass}) << c.registeredName;
+        EXPECT_EQ(sfcb.paths.size(), have) << c.registeredName;
+        EXPECT_EQ(identities(pegasus.paths), identities(sfcb.paths)) << c.registeredName;
+        for (const ObjectPath& central : sfcb.paths) {
+            EXPECT_EQ(central.nameSpace, kNamespace) << identity(central);
+            EXPECT_EQ(host().getInstance(central).instances.size(), 1u) << identity(central);
+        }
+    }
+
+    // The issue a client met: the conformance pairs enumerated in the interop
+    // namespace name the ports where they are served.
+    const OpResult pairs =
+        host().enumerateInstanceNames(inInterop(classPath("Vexlan_NIC_ElementConformsToRegisteredProfile")));
+    expectClean(pairs, "conformance in the interop namespace");
+    ASSERT_FALSE(pairs.paths.empty());
+    for (const ObjectPath& pair : pairs.paths) {
+        EXPECT_EQ(pair.nameSpace, interop);
+        EXPECT_EQ(pair.key("ManagedElement")->ref->nameSpace, kNamespace);
+        EXPECT_EQ(pair.key("ConformantStandard")->ref->nameSpace, kNamespace);
+    }
+    // From a port back to its profile: the profile where every server serves it.
+    const OpResult back = host().associatorNames(firstOf(host(), "Vexlan_NIC_EthernetPort2"),
+                                                 assoc("CIM_ElementConformsToProfile"));
+    expectClean(back, "port to profile");
+    ASSERT_EQ(back.paths.size(), 1u);
+    EXPECT_EQ(back.paths[0].nameSpace, kNamespace);
+    EXPECT_EQ(back.paths[0].key("InstanceID")->s, "1");
+}
+
+// The FC profiles and the joins of their associations: the FC HBA profile's
+// central instance is the computer system; every FC profile of the host
+// reaches it, and the way back knows the FC HBA profile alone.
+TEST_F(Associations, TheFcProfilesAreServedWithTheirJoins)
+{
+    const OpResult profiles = enumerate(host(), "Vexlan_FCHBA_RegisteredProfile");
+    ASSERT_EQ(profiles.instances.size(), 4u);
+    ASSERT_EQ(enumerate(host(), "Vexlan_FCHBA_RegisteredSubProfile").instances.size(), 2u);
+    ObjectPath fcHba, server;
+    for (const Instance& i : profiles.instances) {
+        if (propertyText(i, "RegisteredName") == "FC HBA")
+            fcHba = i.path;
+        if (propertyText(i, "RegisteredName") == "Server")
+            server = i.path;
+        const OpResult got = host().getInstance(i.path);
+        expectClean(got, "profile");
+        EXPECT_EQ(got.instances.size(), 1u);
+        const OpResult system = host().associatorNames(i.path, assoc("Vexlan_FCHBA_RegisteredProfileComputerSystem"));
+        expectClean(system, propertyText(i, "RegisteredName"));
+        EXPECT_EQ(classesOf(system.paths), std::vector<std::string>{"Vexlan_Adapter_ComputerSystem"});
+    }
+    const ObjectPath cs = firstOf(host(), "Vexlan_Adapter_ComputerSystem");
+    const OpResult claimed = host().associatorNames(cs, assoc("Vexlan_FCHBA_RegisteredProfileComputerSystem"));
+    ASSERT_EQ(claimed.paths.size(), 1u);
+    EXPECT_EQ(identity(claimed.paths[0]), identity(fcHba));
+
+    const OpResult subs = host().associatorNames(fcHba, assoc("CIM_ReferencedProfile"));
+    expectClean(subs, "sub-profiles");
+    EXPECT_EQ(subs.paths.size(), 2u);
+    EXPECT_EQ(classesOf(subs.paths), std::vector<std::string>{"Vexlan_FCHBA_RegisteredSubProfile"});
+    for (const ObjectPath& sub : subs.paths) {
+        const OpResult up = host().associatorNames(sub, assoc("Vexlan_FCHBA_RegisteredProfileRegisteredSubProfile"));
+        ASSERT_EQ(up.paths.size(), 1u);
+        EXPECT_EQ(identity(up.paths[0]), identity(fcHba));
+    }
+    EXPECT_TRUE(host().associatorNames(server, assoc("Vexlan_FCHBA_RegisteredProfileRegisteredSubProfile")).paths.empty());
+
+    // An identity belongs to the profiles of its host; a profile of another
+    // host has none.
+    const ObjectPath identityPath = firstOf(host(), "Vexlan_FCHBA_SoftwareIdentity");
+    EXPECT_EQ(host().associatorNames(identityPath, assoc("Vexlan_FCHBA_SoftwareIdentityRegisteredProfile")).paths.size(), 4u);
+    EXPECT_EQ(host().associatorNames(identityPath, assoc("Vexlan_FCHBA_SoftwareIdentityRegisteredSubProfile")).paths.size(),
+              2u);
+    ObjectPath elsewhere = fcHba;
+    elsewhere.setKey("InstanceID", Value::fromString("Vexlan_FCHBAProfile_elsewhere"));
+    EXPECT_TRUE(host().associatorNames(elsewhere, assoc("Vexlan_FCHBA_SoftwareIdentityRegisteredProfile")).paths.empty());
+    EXPECT_TRUE(host().associatorNames(elsewhere, assoc("Vexlan_FCHBA_RegisteredProfileComputerSystem")).paths.empty());
+}
+
+// The software identities of a multi-port adapter share their InstanceID;
+// each leads to its installation service once.
+TEST_F(Associations, AnIdentityHasOneInstallationService)
+{
+    const OpResult identitiesOfHost = host().enumerateInstanceNames(classPath("Vexlan_FCHBA_SoftwareIdentity"));
+    ASSERT_FALSE(identitiesOfHost.paths.empty());
+    std::map<std::string, int> shared;
+    for (const ObjectPath& p : identitiesOfHost.paths)
+        ++shared[p.key("InstanceID")->s];
+    EXPECT_GT(std::max_element(shared.begin(), shared.end(),
+                               [](const auto& a, const auto& b) { return a.second < b.second; })
+                  ->second,
+              1)
+        << "the default host should hold a shared InstanceID";
+    for (const ObjectPath& p : identitiesOfHost.paths) {
+        const OpResult service =
+            host().associatorNames(p, assoc("Vexlan_FCHBA_SoftwareIdentitySoftwareInstallationService"));
+        expectClean(service, identity(p));
+        EXPECT_EQ(service.paths.size(), 1u) << identity(p);
+        EXPECT_EQ(host().referenceNames(p, result("CIM_ServiceAffectsElement")).paths.size(), 1u) << identity(p);
+    }
+}
+
+// The remote service access point's two associations, with their joins as
+// they are: from the system the port MACs are compared with its Name (no
+// partner), from an access point every port's IP endpoint answers.
+TEST_F(Associations, RemoteServiceAccessPointsJoinAsDescribed)
+{
+    const OpResult points = enumerate(host(), "Vexlan_NIC_RemoteServiceAccessPoint");
+    const size_t ports = enumerate(host(), "Vexlan_NIC_IPProtocolEndpoint").instances.size();
+    ASSERT_EQ(points.instances.size(), ports);
+    const ObjectPath point = points.instances.front().path;
+    const ObjectPath cs = firstOf(host(), "Vexlan_Adapter_ComputerSystem");
+    EXPECT_TRUE(host().associatorNames(cs, assoc("Vexlan_NIC_ComputerSystemRemoteServiceAccessPoint")).paths.empty());
+    const OpResult system = host().associatorNames(point, assoc("Vexlan_NIC_ComputerSystemRemoteServiceAccessPoint"));
+    ASSERT_EQ(system.paths.size(), 1u);
+    EXPECT_EQ(identity(system.paths[0]), identity(cs));
+    const std::string mac = propertyText(points.instances.front(), "Name");
+    EXPECT_EQ(host().associatorNames(point, assoc("CIM_SAPSAPDependency")).paths.size(), ports);
+    ObjectPath endpoint = classPath("Vexlan_NIC_IPProtocolEndpoint");
+    endpoint.setKey("Name", Value::fromString(mac));
+    const OpResult own = host().associatorNames(endpoint, assoc("Vexlan_NIC_RemoteServiceAccessPointIPProtocolEndpoint"));
+    ASSERT_EQ(own.paths.size(), 1u);
+    EXPECT_EQ(own.paths[0].key("Name")->s, mac);
 }
 
 }  // namespace

@@ -201,10 +201,13 @@ TEST_F(NicDefaultHost, EndpointsAndCapabilitiesShareThePortMac)
         EXPECT_EQ(propertyText(g.instances[0], "Name"), "027E5A244700") << cls;
     }
 
-    // The remote access point has no route: its class answers empty.
+    // The remote access point of each port is keyed by the same MAC.
     OpResult rsap = host().enumerateInstances(classPath("Vexlan_NIC_RemoteServiceAccessPoint"));
     EXPECT_TRUE(rsap.ok()) << rsap.message;
-    EXPECT_TRUE(rsap.instances.empty());
+    EXPECT_EQ(rsap.instances.size(), enumerate(host(), "Vexlan_NIC_LANEndpoint").instances.size());
+    g = host().getInstance(keyPath("Vexlan_NIC_RemoteServiceAccessPoint", "Name", "027e5a244700"));
+    ASSERT_EQ(g.instances.size(), 1u) << g.message;
+    EXPECT_EQ(propertyText(g.instances[0], "Name"), "027E5A244700");
 }
 
 TEST_F(NicDefaultHost, GetInstanceMissesAndOddKeys)

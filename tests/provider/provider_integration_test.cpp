@@ -328,7 +328,7 @@ TEST_F(ComputerSystem, AFailingOSNameLeavesThePropertyOut)
 
 TEST_F(ComputerSystem, AClassWithoutRouteAnswersEmptySuccess)
 {
-    for (const char* cls : {"Vexlan_FCHBA_RegisteredProfile", "CIM_ComputerSystem"}) {
+    for (const char* cls : {"CIM_RegisteredProfile", "CIM_ComputerSystem"}) {
         OpResult e = host_->enumerateInstances(classPath(cls));
         EXPECT_TRUE(e.ok()) << cls << ": " << e.message;
         EXPECT_TRUE(e.instances.empty()) << cls;

@@ -155,12 +155,29 @@ public:
     OpResult modifyInstance(const ObjectPath& path, const Instance& inst,
                             const PropertyList& props = std::nullopt);
     OpResult deleteInstance(const ObjectPath& path);
+    // Association requests as the flavour's server makes them: sfcb hands
+    // the provider the parameters as given; OpenPegasus calls the provider
+    // once per association class of the provider that can reference the
+    // source's class and is the given class or derives from it (all such
+    // classes when none is given), with that class as assocClass
+    // (associators) or resultClass (references), and merges the answers.
+    // The provider's association classes are those of the registrations
+    // (setRegistrations) with the association type, or without any the
+    // concrete association classes of the repository that have no subclass.
     OpResult associators(const ObjectPath& path, const AssocParams& p = {},
                          const PropertyList& props = std::nullopt);
     OpResult associatorNames(const ObjectPath& path, const AssocParams& p = {});
     OpResult references(const ObjectPath& path, const AssocParams& p = {},
                         const PropertyList& props = std::nullopt);
     OpResult referenceNames(const ObjectPath& path, const AssocParams& p = {});
+    // One call of the provider with the parameters as they stand, whatever
+    // the flavour.
+    OpResult associatorsAsCalled(const ObjectPath& path, const AssocParams& p,
+                                 const PropertyList& props = std::nullopt);
+    OpResult associatorNamesAsCalled(const ObjectPath& path, const AssocParams& p);
+    OpResult referencesAsCalled(const ObjectPath& path, const AssocParams& p,
+                                const PropertyList& props = std::nullopt);
+    OpResult referenceNamesAsCalled(const ObjectPath& path, const AssocParams& p);
     OpResult invokeMethod(const ObjectPath& path, const std::string& method, const std::vector<NamedValue>& in);
 
     // Subscribes with a WQL filter "SELECT * FROM <IndicationClass> [...]" whose
