@@ -133,9 +133,14 @@ awk -F '\t' -v version="$version" '
 
 # The profiles for OpenPegasus's interop provider: one PG_ProviderProfileCapabilities
 # each, tab-separated: capability, RegisteredProfile (its value map: 6 SNIA:FC HBA,
-# 8 SNIA:Host Discovered Resources, 0 Other), the name and organization of an
-# "Other" profile, version, sub-profiles (1019 SNIA:FC Initiator Ports, 1024
-# SNIA:Indication), and the classes whose every instance is a central instance.
+# 0 Other), the name and organization of an "Other" profile, version, sub-profiles
+# (1019 SNIA:FC Initiator Ports, 1024 SNIA:Indication; 3019 DMTF:Software Update,
+# 3009 DMTF:Ethernet Port, 3026 DMTF:Host LAN Network Port, 3027 DMTF:IP Interface),
+# and the classes whose every instance is a central instance. The interop
+# provider wants at least one sub-profile (its MOF compiler takes no empty
+# array), and its value map has the DMTF component profiles as sub-profiles
+# only: each of them names itself, which the interop provider folds into the
+# one profile. The HDR profile, which has no sub-profile, is not listed.
 awk -F '\t' '
     {
         print ""
@@ -150,7 +155,7 @@ awk -F '\t' '
             printf "    OtherProfileOrganization = \"%s\";\n", $4
         }
         printf "    ProfileVersion = \"%s\";\n", $5
-        printf "    RegisteredSubProfiles = {%s};\n", ($6 == "-") ? "" : $6
+        printf "    RegisteredSubProfiles = {%s};\n", $6
         n = split($7, c, " "); list = ""
         for (i = 1; i <= n; i++) list = list (i > 1 ? ", " : "") "\"" c[i] "\""
         printf "    ConformingElements = {%s};\n", list
@@ -158,11 +163,10 @@ awk -F '\t' '
     }
 ' >> "$out/Vexlan_CNA_Provider_Registration.mof.tmp" <<'PROFILES'
 Vexlan_FCHBA_Profile	6	-	-	1.1.0	1019, 1024	Vexlan_Adapter_ComputerSystem
-Vexlan_HDR_Profile	8	-	-	1.1.0	-	Vexlan_Adapter_ComputerSystem
-Vexlan_SoftwareUpdate_Profile	0	Software Update	DMTF	1.0.0	-	Vexlan_FCHBA_SoftwareInstallationService Vexlan_NIC_SoftwareInstallationService
-Vexlan_EthernetPort_Profile	0	Ethernet Port	DMTF	1.0.0	-	Vexlan_NIC_EthernetPort2
-Vexlan_HostLANNetworkPort_Profile	0	Host LAN Network Port	DMTF	1.0.0	-	Vexlan_NIC_NetworkPort
-Vexlan_IPInterface_Profile	0	IP Interface	DMTF	1.0.1	-	Vexlan_NIC_IPProtocolEndpoint
+Vexlan_SoftwareUpdate_Profile	0	Software Update	DMTF	1.0.0	3019	Vexlan_FCHBA_SoftwareInstallationService Vexlan_NIC_SoftwareInstallationService
+Vexlan_EthernetPort_Profile	0	Ethernet Port	DMTF	1.0.0	3009	Vexlan_NIC_EthernetPort2
+Vexlan_HostLANNetworkPort_Profile	0	Host LAN Network Port	DMTF	1.0.0	3026	Vexlan_NIC_NetworkPort
+Vexlan_IPInterface_Profile	0	IP Interface	DMTF	1.0.1	3027	Vexlan_NIC_IPProtocolEndpoint
 PROFILES
 mv "$out/Vexlan_CNA_Provider_Registration.mof.tmp" "$out/Vexlan_CNA_Provider_Registration.mof"
 
