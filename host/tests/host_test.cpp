@@ -293,6 +293,7 @@ TEST(HostLoad, ProviderCannotReachHostFunctionsOutsideTheBroker) {
 
 TEST(HostLoad, MissingFactoryIsNotSupported) {
     Host h;
+    ASSERT_TRUE(h.loadMof(TINY_MOF).ok());   // the association class the request goes to
     ASSERT_TRUE(h.load(TINY_NOASSOC_PROVIDER, "Tiny").ok());
     const OpResult r = h.associators(path("Tiny_Thing.Name=\"alpha\",Id=1", h));
     EXPECT_EQ(statusLine(r), "CMPI_RC_ERR_NOT_SUPPORTED: provider Tiny has no Tiny_Create_AssociationMI");
