@@ -330,6 +330,35 @@ bool passesGate(const CmpiObjectPath& path, const char* assocClass)
     return false;
 }
 
+// True when the class named `cls` in the namespace of `path` is
+// `ancestor` or derives from it; a class the server doesn't know there is
+// neither.
+bool classIsA(const CmpiObjectPath& path, const char* cls, const char* ancestor)
+{
+    try {
+        const CmpiObjectPath probe(path.getNameSpace(), cls);
+        return probe.classPathIsA(ancestor);
+    } catch (const CmpiStatus&) {
+        return false;
+    }
+}
+
+// Outside the provider's namespace (the interop namespace, where the
+// profiles are served with their conformance and sub-profile associations
+// only), a round without an association class runs only for the profile
+// associations: another class (a software identity's profiles, say) is not
+// served there, and its instances would name a class that the namespace
+// lacks (sfcb drops the connection).
+bool servedInRequestNamespace(const Request& rq, const char* assocClass)
+{
+    const CmpiString ns = rq.path.getNameSpace();
+    const char* text = ns.charPtr();
+    if (text == nullptr || strcasecmp(text, kModelNamespace) == 0)
+        return true;
+    return classIsA(rq.path, assocClass, "CIM_ElementConformsToProfile") ||
+           classIsA(rq.path, assocClass, "CIM_ReferencedProfile");
+}
+
 // The rounds: one per table row of the request's class, each with that row's
 // association class, or a single round with the asked association class.
 // Returns the status of the last module called.
@@ -343,7 +372,8 @@ CmpiStatus runRounds(const Request& rq)
         if (given) {
             std::snprintf(calcResultClass, sizeof(calcResultClass), "%s", rq.assocParameter);
         } else {
-            if (strcasecmp(row.sourceClass, sConstCopStr.c_str()) != 0)
+            if (strcasecmp(row.sourceClass, sConstCopStr.c_str()) != 0 ||
+                !servedInRequestNamespace(rq, row.assocClass))
                 continue;
             std::snprintf(calcResultClass, sizeof(calcResultClass), "%s", row.assocClass);
             if (rq.op == Op::ReferenceNames)
@@ -362,19 +392,6 @@ CmpiStatus runRounds(const Request& rq)
             break;
     }
     return last;
-}
-
-// True when the class named `cls` in the namespace of `path` is
-// `ancestor` or derives from it; a class the server doesn't know there is
-// neither.
-bool classIsA(const CmpiObjectPath& path, const char* cls, const char* ancestor)
-{
-    try {
-        const CmpiObjectPath probe(path.getNameSpace(), cls);
-        return probe.classPathIsA(ancestor);
-    } catch (const CmpiStatus&) {
-        return false;
-    }
 }
 
 bool isOwnAssociationClass(const char* name)

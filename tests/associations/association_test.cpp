@@ -506,6 +506,21 @@ TEST_F(Associations, ProfilesInTheInteropNamespaceLeadToTheirCentralInstances)
         EXPECT_EQ(pair.key("ManagedElement")->ref->nameSpace, kNamespace);
         EXPECT_EQ(pair.key("ConformantStandard")->ref->nameSpace, kNamespace);
     }
+    // A request without an association class in the interop namespace is
+    // answered for the profile associations served there only.
+    ObjectPath fcHba = inInterop(classPath("Vexlan_FCHBA_RegisteredProfile"));
+    for (const Instance& i : enumerate(host(), "Vexlan_FCHBA_RegisteredProfile").instances)
+        if (propertyText(i, "RegisteredName") == "FC HBA")
+            fcHba.keys = i.path.keys;
+    const OpResult inInteropRefs = host().referenceNamesAsCalled(fcHba, {});
+    expectClean(inInteropRefs, "references of the FC HBA profile in the interop namespace");
+    EXPECT_EQ(classesOf(inInteropRefs.paths),
+              (std::vector<std::string>{"Vexlan_FCHBA_RegisteredProfileComputerSystem",
+                                        "Vexlan_FCHBA_RegisteredProfileRegisteredSubProfile"}));
+    fcHba.nameSpace = kNamespace;
+    const std::vector<std::string> everywhere = classesOf(host().referenceNamesAsCalled(fcHba, {}).paths);
+    EXPECT_TRUE(std::count(everywhere.begin(), everywhere.end(), "Vexlan_FCHBA_SoftwareIdentityRegisteredProfile"));
+
     // From a port back to its profile: the profile where every server serves it.
     const OpResult back = host().associatorNames(firstOf(host(), "Vexlan_NIC_EthernetPort2"),
                                                  assoc("CIM_ElementConformsToProfile"));
