@@ -3,6 +3,7 @@
 #include <dlfcn.h>
 
 #include <algorithm>
+#include <cctype>
 #include <cstring>
 
 #include "cimhost/text.h"
@@ -101,6 +102,11 @@ struct CList {
 };
 
 const char* orNull(const std::string& s) { return s.empty() ? nullptr : s.c_str(); }
+
+std::string lowerCase(std::string s) {
+    for (auto& c : s) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    return s;
+}
 
 }  // namespace
 
@@ -209,15 +215,14 @@ std::vector<std::string> Host::Impl::associationClassesFor(const std::string& so
             if (std::find(r.types.begin(), r.types.end(), MiType::Association) != r.types.end())
                 own.push_back(r.className);
     } else {
+        std::set<std::string> parents;   // lower case
         for (const auto& c : all) {
             const ClassDecl* d = repo.find(c);
-            if (!d || !d->association || d->abstract) continue;
-            bool hasSubclass = false;
-            for (const auto& other : all) {
-                const ClassDecl* o = repo.find(other);
-                hasSubclass = hasSubclass || (o && namesEqual(o->superClass, c));
-            }
-            if (!hasSubclass) own.push_back(c);
+            if (d && !d->superClass.empty()) parents.insert(lowerCase(d->superClass));
+        }
+        for (const auto& c : all) {
+            const ClassDecl* d = repo.find(c);
+            if (d && d->association && !d->abstract && !parents.count(lowerCase(c))) own.push_back(c);
         }
     }
     std::vector<std::string> out;
