@@ -45,6 +45,7 @@ echo "sfcbstage \$*" >> "\$LOG"
 ns=root/cimv2 reg=
 while getopts n:r: o; do case \$o in n) ns=\$OPTARG;; r) reg=\$OPTARG;; esac; done
 shift \$((OPTIND - 1))
+sfcbmofpp "\$@" || exit 1     # sfcb's own runs its preprocessor by name
 [ -z "\$reg" ] || { mkdir -p $S/stage/regs && cp "\$reg" $S/stage/regs/; }
 [ \$# -eq 0 ] || { mkdir -p "$S/stage/mofs/\$ns" && cp "\$@" "$S/stage/mofs/\$ns/"; }
 EOF
@@ -58,6 +59,7 @@ shift \$((OPTIND - 1))
 for f in "\$@"; do rm -f "$S/stage/mofs/\$ns/\$f"; done
 EOF
 printf '#!/bin/sh\necho "sfcbrepos $*" >> "$LOG"\n' > "$S/bin/sfcbrepos"
+printf '#!/bin/sh\nexit 0\n' > "$S/bin/sfcbmofpp"
 printf '#!/bin/sh\nexit 1\n' > "$S/sbin/sfcbd"
 chmod +x "$S"/bin/* "$S"/sbin/*
 
@@ -109,6 +111,10 @@ run() { "$reg" "$@" > "$tmp/out" 2>&1; }
 
 # ---- sfcb ---------------------------------------------------------------------
 PATH_SFCB=$S/bin:$PATH
+# As a package manager runs it: sfcb's programs only in the settings file.
+printf 'type=sfcb\npath=%s\n' "$S/bin" > "$VEXLAN_CNA_REGISTER_CONF"
+PATH=/usr/bin:/bin run || { fail "sfcb: register from the settings file failed"; cat "$tmp/out"; }
+rm "$VEXLAN_CNA_REGISTER_CONF"
 PATH=$PATH_SFCB run || { fail "sfcb: register failed"; cat "$tmp/out"; }
 grep -q 'registering .* with sfcb' "$tmp/out" || fail "sfcb was not found without -t"
 while read -r ns file; do
