@@ -46,7 +46,12 @@ struct Worker {
     jobindication::Channel channel;
 };
 std::mutex workersLock;
-std::list<Worker> workers;
+// Made in storage of its own and never destroyed: the library's unload code
+// cleans a provider up (and so joins its workers) while the library's other
+// objects are being destroyed, in an order that nothing fixes. Empty once the
+// workers are joined, so it holds nothing then.
+alignas(std::list<Worker>) unsigned char workersStorage[sizeof(std::list<Worker>)];
+std::list<Worker>& workers = *new (workersStorage) std::list<Worker>;
 
 void markFinished()
 {
