@@ -9,7 +9,7 @@ JOBS       ?= $(shell nproc)
 PREFIX     ?= /usr/local
 GENERATOR  := $(shell command -v ninja >/dev/null 2>&1 && echo "-G Ninja")
 
-.PHONY: all deps build demo demo-real test test-asan test-tsan fuzz install clean bench
+.PHONY: all deps build demo demo-real test test-asan test-tsan fuzz install clean bench deb rpm
 
 all: build
 
@@ -72,6 +72,12 @@ bench: build
 deb: build
 	@scripts/install-deb-tools.sh
 	scripts/make-deb.sh $(BUILD) $(BUILD)
+
+# The RPM, from the plain build tree with rpmbuild and packaging/vexlan-cna-provider.spec:
+# $(BUILD)/vexlan-cna-provider-<version>-1.<arch>.rpm
+rpm: build
+	@scripts/install-rpm-tools.sh
+	scripts/make-rpm.sh $(BUILD) $(BUILD)
 
 clean:
 	rm -rf $(BUILD) $(ASAN_BUILD) $(TSAN_BUILD) $(FUZZ_BUILD)

@@ -13,13 +13,17 @@
 #       flavours: every registered class answers, and the default adapter
 #       description beside the installed adapter library is the one read.
 #       Run it under tests/isolate.sh (the provider writes under /opt).
-#   check_install.sh deb BUILD SOURCE BINDIR LIBDIR DATADIR MANDIR
-#       build the Debian package from the build tree (scripts/make-deb.sh):
-#       its file list, its control fields, no path of the build or source
-#       tree in it, and the unpacked package's cimhost finding the unpacked
-#       provider with no options (under tests/isolate.sh).
+#   check_install.sh packages BUILD SOURCE BINDIR LIBDIR DATADIR MANDIR SBINDIR
+#       build the Debian package and the RPM from the build tree
+#       (scripts/make-deb.sh, scripts/make-rpm.sh) without installing them:
+#       the deb's file list and control fields, the RPM's file list the same
+#       as the deb's, no path of the build or source tree in either, the
+#       unpacked package's cimhost finding the unpacked provider with no
+#       options (under tests/isolate.sh), and each package's scripts run
+#       with the arguments that dpkg and rpm give them (install, upgrade,
+#       removal) against a stand-in registration command.
 set -euo pipefail
-mode=$1 build=$2 src=$3 bindir=$4 libdir=$5 datadir=$6 mandir=$7
+mode=$1 build=$2 src=$3 bindir=$4 libdir=$5 datadir=$6 mandir=$7 sbindir=${8:-sbin}
 tmp=$(mktemp -d /tmp/vexlan-deploy.XXXXXX)
 trap 'rm -rf "$tmp"' EXIT
 failures=0
@@ -49,6 +53,7 @@ check_tree() {
   # The exact file list; the class files are checked against the table below.
   local want=(
     "$bindir/cimhost"
+    "$sbindir/vexlan-cna-register"
     "$libdir/libVexlan_CNA_Provider.so"
     "$libdir/libVexlan_CNA_Provider.so.1"
     "$libdir/libzorap_cna_provider.so"
@@ -60,8 +65,10 @@ check_tree() {
     "$datadir/vexlan-cna/Vexlan_CNA_Provider_Interop.mof"
     "$datadir/vexlan-cna/Vexlan_CNA_Provider_Registration.mof"
     "$datadir/vexlan-cna/Vexlan_CNA_Provider.reg"
+    "$datadir/vexlan-cna/registration.tsv"
     "$datadir/doc/vexlan-cna/deploy.md"
-    "$mandir/man8/vexlan-cna.8")
+    "$mandir/man8/vexlan-cna.8"
+    "$mandir/man8/vexlan-cna-register.8")
   local got extra missing
   got=$(cd "$root" && find . -mindepth 1 \( -type f -o -type l \) | sed 's|^\./||' |
         grep -v "^$datadir/vexlan-cna/mof/" | sort)
@@ -119,9 +126,16 @@ check_tree() {
     cp "$root/$mandir/man8/vexlan-cna.8" "$tmp/man.txt"
   fi
   local word
-  for word in cimmof sfcbstage sfcbrepos cimcli wbemcli cimhost root/PG_InterOp root/vexlan_cmpi; do
+  for word in vexlan-cna-register cimmof sfcbstage sfcbrepos cimcli wbemcli cimhost root/PG_InterOp root/vexlan_cmpi; do
     grep -q -- "$word" "$tmp/man.txt" || fail "man page does not mention $word"
   done
+  MANWIDTH=80 man -l "$root/$mandir/man8/vexlan-cna-register.8" 2>&1 | grep -q -- '-t pegasus' ||
+    fail "the man page of vexlan-cna-register does not format or does not describe -t"
+  # Every file of the registration table is installed beside it.
+  local row
+  while IFS=$'\t' read -r _ _ row; do
+    [ -f "$share/$row" ] || fail "registration.tsv names $row, which is not installed"
+  done < <(grep -v '^#' "$share/registration.tsv")
 }
 
 check_load() {
@@ -178,8 +192,11 @@ check_load() {
   grep -q '^CMPI_RC_ERR_NOT_FOUND' "$err" || { fail "an empty key in a batch line is not looked up"; cat "$err"; }
 }
 
-check_deb() {
-  command -v patchelf > /dev/null || { echo "SKIP: patchelf is missing (scripts/install-deb-tools.sh)"; exit 77; }
+check_packages() {
+  local tool
+  for tool in patchelf rpmbuild rpm2archive; do
+    command -v $tool > /dev/null || { echo "SKIP: $tool is missing (scripts/install-deps.sh)"; exit 77; }
+  done
   local deb
   deb=$(CMAKE=${CMAKE:-cmake} "$src/scripts/make-deb.sh" "$build" "$tmp/out") || { fail "make-deb.sh failed"; return; }
   [ -f "$deb" ] || { fail "no package written"; return; }
@@ -196,6 +213,7 @@ check_deb() {
               usr/share/vexlan-cna/Vexlan_CNA_Provider.mof usr/share/vexlan-cna/Vexlan_CNA_Provider_Interop.mof \
               usr/share/vexlan-cna/Vexlan_CNA_Provider_Registration.mof usr/share/vexlan-cna/Vexlan_CNA_Provider.reg \
               usr/share/vexlan-cna/mof/Vexlan_FCHBA_FCPort.mof usr/share/man/man8/vexlan-cna.8.gz \
+              usr/sbin/vexlan-cna-register usr/share/man/man8/vexlan-cna-register.8.gz usr/share/vexlan-cna/registration.tsv \
               usr/share/doc/vexlan-cna-provider/deploy.md usr/share/doc/vexlan-cna-provider/copyright; do
     grep -qx "$want" "$tmp/paths" || fail "the package lacks $want"
   done
@@ -218,13 +236,83 @@ check_deb() {
     fail "the packaged cimhost failed"; cat "$tmp/deb.err"
   fi
   grep -q '^root/vexlan_cmpi:Vexlan_FCHBA_FCPort\.' "$tmp/deb.out" || fail "the packaged cimhost shows no FC port"
+
+  # The RPM: the same files, no build path, the adapter library found
+  # beside the provider.
+  local rpm
+  rpm=$(CMAKE=${CMAKE:-cmake} "$src/scripts/make-rpm.sh" "$build" "$tmp/out") || { fail "make-rpm.sh failed"; return; }
+  [ -f "$rpm" ] || { fail "no RPM written"; return; }
+  rpm -qp --qf '[%{FILEMODES:perms} %{FILENAMES}\n]' "$rpm" 2> /dev/null | awk '$1 !~ /^d/ { sub(/^\//, "", $2); print $2 }' |
+    sort > "$tmp/rpm.paths"
+  find "$root" -mindepth 1 ! -type d | sed "s|^$root/||" | sort > "$tmp/deb.files"
+  [ -s "$tmp/rpm.paths" ] && cmp -s "$tmp/deb.files" "$tmp/rpm.paths" ||
+    fail "the RPM's files differ from the deb's: $(diff "$tmp/deb.files" "$tmp/rpm.paths" | head)"
+  if rpm -qlp "$rpm" 2> /dev/null | grep -e "$build" -e "$src" -e '/tmp/'; then fail "the RPM names a build path"; fi
+  [ "$(rpm -qp --qf '%{NAME} %{VERSION}' "$rpm" 2> /dev/null)" = "$(dpkg-deb -f "$deb" Package) $(dpkg-deb -f "$deb" Version)" ] ||
+    fail "the RPM's name and version differ from the deb's"
+  mkdir "$tmp/rpmroot"
+  (cd "$tmp/out" && rpm2archive "$rpm") && tar -xzf "$rpm.tgz" -C "$tmp/rpmroot"
+  [ "$(readelf -d "$tmp/rpmroot/usr/lib/libVexlan_CNA_Provider.so.1" | sed -n 's/.*(RUNPATH).*\[\(.*\)\]/\1/p')" = '$ORIGIN' ] ||
+    fail "the RPM's provider does not look for the adapter library beside itself"
+
+  # The scripts of both packages, run as dpkg and rpm run them, with a
+  # stand-in registration command and ldconfig that record their calls.
+  local scripts=$tmp/scripts stub=$tmp/stub calls=$tmp/calls
+  mkdir -p "$scripts/deb" "$scripts/rpm" "$stub"
+  printf '#!/bin/sh\necho "register${*:+ $*}" >> %s\n' "$calls" > "$stub/vexlan-cna-register"
+  printf '#!/bin/sh\necho ldconfig >> %s\n' "$calls" > "$stub/ldconfig"
+  chmod +x "$stub"/*
+  dpkg-deb -e "$deb" "$tmp/control"
+  local f
+  for f in postinst prerm postrm; do
+    [ -x "$tmp/control/$f" ] || fail "the deb has no executable $f"
+    cp "$tmp/control/$f" "$scripts/deb/$f"
+  done
+  [ ! -e "$tmp/control/preinst" ] || cp "$tmp/control/preinst" "$scripts/deb/preinst"
+  rpm -qp --scripts "$rpm" 2> /dev/null | awk -v dir="$scripts/rpm" '
+    /^[a-z]+ (scriptlet \(using \/bin\/sh\)|program): ?/ {
+      name = $1; out = dir "/" name
+      if ($2 == "program:") { print $3 > out; close(out); out = "" }
+      next }
+    out != "" { print > out }'
+  for f in preinstall postinstall preuninstall postuninstall; do
+    [ -s "$scripts/rpm/$f" ] || fail "the RPM has no $f scriptlet"
+  done
+  # package script arguments => calls, in order ("-" none)
+  local cases="
+    deb postinst configure|                 ldconfig,register
+    deb postinst abort-upgrade|1.5.6        ldconfig,register
+    deb prerm remove|                       register -d
+    deb prerm upgrade|1.5.7                 register -d
+    deb prerm failed-upgrade|1.5.7          -
+    deb postrm remove|                      ldconfig
+    deb postrm upgrade|1.5.7                -
+    rpm preinstall 1|                       -
+    rpm preinstall 2|                       register -d
+    rpm postinstall 1|                      ldconfig,register
+    rpm postinstall 2|                      ldconfig,register
+    rpm preuninstall 0|                     register -d
+    rpm preuninstall 1|                     -
+    rpm postuninstall 0|                    ldconfig
+  "
+  local kind script args want got
+  while read -r kind script args want; do
+    [ -n "$kind" ] || continue
+    [ -f "$scripts/$kind/$script" ] || { [ "$want" = - ] || fail "$kind: no $script"; continue; }
+    sed -e "s|/usr/sbin/vexlan-cna-register|$stub/vexlan-cna-register|g" -e "s|/sbin/ldconfig|$stub/ldconfig|g" \
+        -e "s|^\\( *\\)ldconfig\$|\\1$stub/ldconfig|" "$scripts/$kind/$script" > "$tmp/run.sh"
+    : > "$calls"
+    sh "$tmp/run.sh" ${args//|/ } > "$tmp/run.out" 2>&1 || fail "$kind $script ${args//|/ } exits with an error: $(cat "$tmp/run.out")"
+    got=$(paste -sd, "$calls"); [ -n "$got" ] || got=-
+    [ "$got" = "$want" ] || fail "$kind $script ${args//|/ }: calls '$got', expected '$want'"
+  done <<< "$cases"
 }
 
 case "$mode" in
   tree) check_tree ;;
   load) check_load ;;
-  deb) check_deb ;;
-  *) echo "usage: $0 tree|load|deb BUILD SOURCE BINDIR LIBDIR DATADIR MANDIR" >&2; exit 2 ;;
+  packages) check_packages ;;
+  *) echo "usage: $0 tree|load|packages BUILD SOURCE BINDIR LIBDIR DATADIR MANDIR [SBINDIR]" >&2; exit 2 ;;
 esac
 if [ "$failures" -gt 0 ]; then
   echo "$failures check(s) failed"
