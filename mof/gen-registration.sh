@@ -25,6 +25,8 @@
 #
 # Class files are read relative to the directory of TABLE. The class MOF
 # files keep the table's order, which is load order.
+# A row whose class file lies under dmtf/ is a class of the CIM schema: it
+# is registered like the others but left out of the class MOF.
 set -eu
 
 version=1.5.6
@@ -69,7 +71,7 @@ class_mof() {
     {
         echo "// Classes of the Vexlan CNA provider for the namespace \"$1\"."
         echo "// Generated from classes.tsv by gen-registration.sh."
-        awk -F '\t' -v ns="$1" '{ n = split($2, a, " "); for (i = 1; i <= n; i++) if (a[i] == ns) { print $6; break } }' "$rows" |
+        awk -F '\t' -v ns="$1" '$6 ~ /^dmtf\// { next } { n = split($2, a, " "); for (i = 1; i <= n; i++) if (a[i] == ns) { print $6; break } }' "$rows" |
         while IFS= read -r file; do
             [ -r "$mofdir/$file" ] || { echo "$0: missing class file $mofdir/$file" >&2; exit 1; }
             echo

@@ -3,7 +3,10 @@
 
 It answers the CIM server's ExportIndication requests (HTTP POST, CIM-XML) and
 prints every indication received: its class and its properties in the order
-the server sent them, or one JSON document per line with --json.
+the server sent them, or one JSON document per line with --json. An embedded
+instance (a property marked EmbeddedObject, such as the SourceInstance of a
+CIM_InstModification) is shown as an instance of its own with the properties
+that have a value.
 
     scripts/cimxml_listener.py --port 5990                # until Ctrl-C
     scripts/cimxml_listener.py --port 5990 --count 2 --timeout 300 --json
@@ -39,6 +42,33 @@ def property_value(prop):
     return None if value is None else (value.text or "")
 
 
+def embedded_instance(prop, value):
+    """(class name, [(name, type, value), ...]) of an embedded instance, else None."""
+    marked = prop.get("EmbeddedObject") or prop.get("EMBEDDEDOBJECT")
+    if not marked or not isinstance(value, str) or "<INSTANCE" not in value:
+        return None
+    try:
+        inst = ET.fromstring(value.strip())
+    except ET.ParseError:
+        return None
+    if inst.tag != "INSTANCE":
+        return None
+    return inst.get("CLASSNAME"), properties_of(inst, with_nulls=False)
+
+
+def properties_of(inst, with_nulls=True):
+    """[(name, type, value), ...] of an INSTANCE element; an embedded instance as a pair."""
+    out = []
+    for p in inst:
+        if p.tag not in ("PROPERTY", "PROPERTY.ARRAY"):
+            continue
+        value = property_value(p)
+        value = embedded_instance(p, value) or value
+        if value is not None or with_nulls:
+            out.append((p.get("NAME"), p.get("TYPE", ""), value))
+    return out
+
+
 def indications_of(body):
     """(message id, [(class name, [(name, type, value), ...]), ...]) of a request."""
     root = ET.fromstring(body)
@@ -50,27 +80,33 @@ def indications_of(body):
             continue
         for param in call.findall("EXPPARAMVALUE"):
             for inst in param.findall("INSTANCE"):
-                props = [
-                    (p.get("NAME"), p.get("TYPE", ""), property_value(p))
-                    for p in inst
-                    if p.tag in ("PROPERTY", "PROPERTY.ARRAY")
-                ]
-                found.append((inst.get("CLASSNAME"), props))
+                found.append((inst.get("CLASSNAME"), properties_of(inst)))
     return message_id, found
 
 
-def format_text(class_name, props):
+def format_text(class_name, props, indent=""):
     lines = ["instance of %s {" % class_name]
     for name, _type, value in props:
         if value is None:
             shown = "NULL"
+        elif isinstance(value, tuple):
+            shown = format_text(value[0], value[1], indent + "    ")
         elif isinstance(value, list):
             shown = "{" + ", ".join(json.dumps(v) for v in value) + "}"
         else:
             shown = json.dumps(value)
-        lines.append("    %s = %s;" % (name, shown))
-    lines.append("};")
+        lines.append("%s    %s = %s;" % (indent, name, shown))
+    lines.append(indent + "}" if indent else "};")
     return "\n".join(lines)
+
+
+def as_json(props):
+    """{"properties": ..., "types": ...} with embedded instances as such documents."""
+    def value(v):
+        if isinstance(v, tuple):
+            return dict({"className": v[0]}, **as_json(v[1]))
+        return v
+    return {"properties": {n: value(v) for n, _t, v in props}, "types": {n: t for n, t, _v in props}}
 
 
 class Listener(http.server.BaseHTTPRequestHandler):
@@ -112,9 +148,7 @@ class ListenerServer(http.server.ThreadingHTTPServer):
     def report(self, class_name, props):
         with self.lock:
             if self.as_json:
-                doc = {"className": class_name,
-                       "properties": {n: v for n, _t, v in props},
-                       "types": {n: t for n, t, _v in props}}
+                doc = dict({"className": class_name}, **as_json(props))
                 print(json.dumps(doc), flush=True)
             else:
                 print("// indication\n" + format_text(class_name, props) + "\n", flush=True)

@@ -75,6 +75,9 @@ const char kUsage[] =
     "  listen CLASSPATH SECS    activate a filter on the indication class (source\n"
     "                           namespace from CLASSPATH), print the indications that\n"
     "                           arrive within SECS seconds, deactivate\n"
+    "  subscribe CLASSPATH      (in a batch) activate a filter as listen does for the\n"
+    "                           rest of the batch; what arrives is printed after each\n"
+    "                           later line and while sleep waits\n"
     "  batch [FILE|-]           one operation per line from FILE or standard input, in\n"
     "                           one process (the provider is loaded once); '#' starts a\n"
     "                           comment; words split as a shell does; per-line options:\n"
@@ -112,6 +115,7 @@ struct Session {
     bool verbose = false;
     std::string defaultNs;
     bool inBatch = false;
+    std::vector<int> subscriptions;   // filters of `subscribe`, active until the batch ends
     Host host;
     std::ostream* out = nullptr;
     std::ostream* err = nullptr;
@@ -382,48 +386,80 @@ bool needProvider(Session& s, int& code) {
     return false;
 }
 
-int doListen(Session& s, const std::vector<std::string>& words, const OpOptions& o) {
-    if (words.size() != 3) return usage(s, "listen takes CLASSPATH SECONDS");
-    ObjectPath cp;
-    std::string err;
-    const std::string ns = o.nameSpace.empty() ? s.host.defaultNamespace() : o.nameSpace;
-    if (!parsePath(words[1], cp, err, &s.host.classes(), ns)) return usage(s, "bad class path: " + err);
-    char* end = nullptr;
-    const double secs = std::strtod(words[2].c_str(), &end);
-    if (!end || *end != '\0' || secs < 0 || secs > 86400) return usage(s, "bad number of seconds: " + words[2]);
-    int code = 0;
-    if (!needProvider(s, code)) return code;
-    const std::string query = o.query.empty() ? "SELECT * FROM " + cp.className : o.query;
-    int id = 0;
-    Status st = s.host.activateFilter(query, cp.nameSpace, id);
-    if (!st.ok()) return fail(s, st);
-    const auto deadline = std::chrono::steady_clock::now() + std::chrono::microseconds(static_cast<long long>(secs * 1e6));
+// Prints one received indication; kExitFailed when it failed the strict check.
+int printIndication(Session& s, const Indication& ind) {
+    int result = kExitOk;
+    if (!ind.error.empty()) {
+        *s.err << statusLine(Status{kRcFailed, "strict check: " + ind.error}) << "\n";
+        result = kExitFailed;
+    }
+    if (s.json) {
+        Json j;
+        j["namespace"] = ind.nameSpace;
+        j["deliveredTo"] = ind.deliveredTo;
+        j["indication"] = instanceJson(ind.instance);
+        *s.out << j.dump() << "\n";
+    } else {
+        *s.out << "// indication for " << ind.nameSpace << "\n" << formatInstanceMof(ind.instance) << "\n";
+    }
+    s.out->flush();
+    return result;
+}
+
+// Prints the indications that arrive until `deadline` (those already
+// received when it has passed); the worst exit status.
+int printIndicationsUntil(Session& s, std::chrono::steady_clock::time_point deadline) {
     int result = kExitOk;
     Indication ind;
     while (true) {
         const auto now = std::chrono::steady_clock::now();
-        if (now >= deadline) break;
-        if (!s.host.waitIndication(ind, std::chrono::duration_cast<std::chrono::milliseconds>(deadline - now) +
-                                            std::chrono::milliseconds(1)))
-            continue;
-        if (!ind.error.empty()) {
-            *s.err << statusLine(Status{kRcFailed, "strict check: " + ind.error}) << "\n";
-            result = kExitFailed;
-        }
-        if (s.json) {
-            Json j;
-            j["namespace"] = ind.nameSpace;
-            j["deliveredTo"] = ind.deliveredTo;
-            j["indication"] = instanceJson(ind.instance);
-            *s.out << j.dump() << "\n";
-        } else {
-            *s.out << "// indication for " << ind.nameSpace << "\n" << formatInstanceMof(ind.instance) << "\n";
-        }
-        s.out->flush();
+        const auto wait = now >= deadline ? std::chrono::milliseconds(0)
+                                          : std::chrono::duration_cast<std::chrono::milliseconds>(deadline - now) +
+                                                std::chrono::milliseconds(1);
+        if (s.host.waitIndication(ind, wait))
+            result = std::max(result, printIndication(s, ind));
+        else if (std::chrono::steady_clock::now() >= deadline)
+            return result;
     }
-    st = s.host.deactivateFilter(id);
+}
+
+// The filter of listen and subscribe: CLASSPATH's class (or -q) with its
+// namespace as source namespace.
+int activateFor(Session& s, const std::string& classPath, const OpOptions& o, int& id) {
+    ObjectPath cp;
+    std::string err;
+    const std::string ns = o.nameSpace.empty() ? s.host.defaultNamespace() : o.nameSpace;
+    if (!parsePath(classPath, cp, err, &s.host.classes(), ns)) return usage(s, "bad class path: " + err);
+    int code = 0;
+    if (!needProvider(s, code)) return code;
+    const std::string query = o.query.empty() ? "SELECT * FROM " + cp.className : o.query;
+    const Status st = s.host.activateFilter(query, cp.nameSpace, id);
+    if (!st.ok()) return fail(s, st);
+    return kExitOk;
+}
+
+int doListen(Session& s, const std::vector<std::string>& words, const OpOptions& o) {
+    if (words.size() != 3) return usage(s, "listen takes CLASSPATH SECONDS");
+    char* end = nullptr;
+    const double secs = std::strtod(words[2].c_str(), &end);
+    if (!end || *end != '\0' || secs < 0 || secs > 86400) return usage(s, "bad number of seconds: " + words[2]);
+    int id = 0;
+    const int code = activateFor(s, words[1], o, id);
+    if (code != kExitOk) return code;
+    const auto deadline = std::chrono::steady_clock::now() + std::chrono::microseconds(static_cast<long long>(secs * 1e6));
+    const int result = printIndicationsUntil(s, deadline);
+    const Status st = s.host.deactivateFilter(id);
     if (!st.ok()) return fail(s, st);
     return result;
+}
+
+int doSubscribe(Session& s, const std::vector<std::string>& words, const OpOptions& o) {
+    if (words.size() != 2) return usage(s, "subscribe takes CLASSPATH");
+    if (!s.inBatch) return usage(s, "subscribe is for batch files (listen waits on its own)");
+    int id = 0;
+    const int code = activateFor(s, words[1], o, id);
+    if (code == kExitOk) s.subscriptions.push_back(id);
+    return code;
 }
 
 int runVerb(Session& s, const std::vector<std::string>& words, const OpOptions& o);
@@ -485,7 +521,9 @@ int runVerb(Session& s, const std::vector<std::string>& words, const OpOptions& 
         char* end = nullptr;
         const double secs = std::strtod(words[1].c_str(), &end);
         if (!end || *end != '\0' || secs < 0 || secs > 86400) return usage(s, "bad number of seconds: " + words[1]);
-        std::this_thread::sleep_for(std::chrono::microseconds(static_cast<long long>(secs * 1e6)));
+        const auto wait = std::chrono::microseconds(static_cast<long long>(secs * 1e6));
+        if (!s.subscriptions.empty()) return printIndicationsUntil(s, std::chrono::steady_clock::now() + wait);
+        std::this_thread::sleep_for(wait);
         return kExitOk;
     }
     if (verb == "reload") {
@@ -500,6 +538,7 @@ int runVerb(Session& s, const std::vector<std::string>& words, const OpOptions& 
         return kExitOk;
     }
     if (verb == "listen") return doListen(s, words, o);
+    if (verb == "subscribe") return doSubscribe(s, words, o);
 
     static const char* const kPathVerbs[] = {"ei", "ein", "gi", "ci", "mi", "di", "ai", "ain", "ri", "rin", "cm"};
     bool known = false;
@@ -610,8 +649,14 @@ int doBatch(Session& s, const std::vector<std::string>& words) {
         if (w.empty()) continue;
         const int code = runVerb(s, w, o);
         result = std::max(result, code);
+        if (!s.subscriptions.empty()) result = std::max(result, printIndicationsUntil(s, std::chrono::steady_clock::now()));
         s.out->flush();
     }
+    for (int id : s.subscriptions) {
+        const Status st = s.host.deactivateFilter(id);
+        if (!st.ok()) result = std::max(result, fail(s, st));
+    }
+    s.subscriptions.clear();
     s.inBatch = false;
     return result;
 }

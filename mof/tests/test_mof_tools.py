@@ -286,6 +286,17 @@ class GeneratedFiles(TreeTest):
         self.assertNotIn('"Vexlan_NIC_RemoteServiceAccessPoint"', self.tree.read('out/Vexlan_CNA_Provider_Registration.mof'))
         self.assertIn('class Vexlan_NIC_RemoteServiceAccessPoint ', self.tree.read('out/Vexlan_CNA_Provider.mof'))
 
+    def test_schema_classes_are_registered_but_not_declared(self):
+        self.gen()
+        self.assertIn('[CIM_InstModification]\n   provider: Vexlan_CNA_Provider\n   location: Vexlan_CNA_Provider\n'
+                      '   type: indication\n   namespace: root/vexlan_cmpi\n', self.tree.read('out/Vexlan_CNA_Provider.reg'))
+        self.assertIn('ClassName = "CIM_InstCreation";', self.tree.read('out/Vexlan_CNA_Provider_Registration.mof'))
+        self.assertNotIn('class CIM_Inst', self.tree.read('out/Vexlan_CNA_Provider.mof'))
+        # A class MOF that declares one anyway disagrees with the table.
+        self.tree.write('out/Vexlan_CNA_Provider.mof', self.tree.read('out/Vexlan_CNA_Provider.mof') +
+                        self.tree.read('dmtf/CIM_InstCreation.mof'))
+        self.assertTrue(any('Vexlan_CNA_Provider.mof' in e for e in self.tree.errors(generated=self.out)))
+
     def test_a_new_row_is_registered(self):
         self.tree.write('vexlan/Vexlan_FCHBA_FCPortTwo.mof', 'class Vexlan_FCHBA_FCPortTwo : Vexlan_FCHBA_FCPort {};\n')
         self.tree.write('classes.tsv', self.tree.read('classes.tsv') +

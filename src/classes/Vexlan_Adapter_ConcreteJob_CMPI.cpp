@@ -32,6 +32,14 @@ const PropertyRow<JobRow> kProperties[] = {
     {"TimeOfLastStateChange", CMPI_dateTime,
      CLASS_VALUE(JobRow, CmpiData(CmpiDateTime(e.job->timeOfLastStateChange, false)))},
     {"TimeBeforeRemoval", CMPI_dateTime, CLASS_VALUE(JobRow, CmpiData(CmpiDateTime("00000000003000.000000:000")))},
+    // Last, so that the properties before it keep their order; unset when
+    // the job can't know it.
+    {"PercentComplete", CMPI_uint16, [](const JobRow& e) -> PropertyValue {
+         const std::optional<unsigned short> percent = JobPercentComplete(*e.job);
+         if (!percent)
+             return std::nullopt;
+         return CmpiData(static_cast<CMPIUint16>(*percent));
+     }},
 };
 const char* const kKeys[] = {"InstanceID", nullptr};
 const auto kKeyRows = classmodule::rowsOfKeys(kKeys, kProperties, 1);

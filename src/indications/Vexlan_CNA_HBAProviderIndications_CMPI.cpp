@@ -8,7 +8,8 @@
 #include <cstdarg>
 #include <cstdio>
 #include <cstring>
-#include <deque>
+#include <list>
+#include <new>
 #include <mutex>
 #include <string>
 
@@ -54,7 +55,13 @@ struct PendingAlarm {
 // Guards the receiver and the queue. Taken before the receiver's mutex.
 std::mutex gHandOffMutex;
 ThreadArgs* gReceiver = nullptr;
-std::deque<PendingAlarm> gPending;
+// Made in storage of its own and never destroyed: the library's unload code
+// stops the polling thread while the library's other objects are being
+// destroyed, and the thread takes this queue until it stops (a list: empty,
+// as the thread leaves it, it holds no memory).
+using AlarmQueue = std::list<PendingAlarm>;
+alignas(AlarmQueue) unsigned char pendingStorage[sizeof(AlarmQueue)];
+AlarmQueue& gPending = *new (pendingStorage) AlarmQueue;
 // Set with the receiver's mutex held too, so the polling thread's wait can't
 // miss it.
 std::atomic<bool> gAlarmsPending{false};
@@ -96,9 +103,9 @@ void handOver(PendingAlarm&& alarm)
 
 // The alarms handed over so far; later ones wait for the next round, so a
 // stream of alarms never holds off the poll.
-std::deque<PendingAlarm> takePendingAlarms()
+AlarmQueue takePendingAlarms()
 {
-    std::deque<PendingAlarm> taken;
+    AlarmQueue taken;
     std::lock_guard<std::mutex> lock(gHandOffMutex);
     taken.swap(gPending);
     gAlarmsPending = false;

@@ -10,6 +10,7 @@
 #include <cstdlib>
 #include <ctime>
 
+#include "indications/Vexlan_Adapter_JobIndications.h"
 #include "inventory/AdapterFunc.h"
 #include "provider/Vexlan_CNA_Provider_Tables.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
@@ -165,6 +166,7 @@ Vexlan_CNA_Provider::Vexlan_CNA_Provider(const CmpiBroker& mbp, const CmpiContex
       CmpiAssociationMI(mbp, ctx),
       CmpiIndicationMI(mbp, ctx),
       CmpiMethodMI(mbp, ctx),
+      methodContext(nullptr),
       initialized(false),
       initializing(false),
       pollingEnabled(false),
@@ -227,6 +229,9 @@ CmpiStatus Vexlan_CNA_Provider::initialize(const CmpiContext& ctx)
         sleep(2);
         return CmpiStatus(CMPI_RC_OK);
     }
+    // From here until cleanup the flash workers may send their jobs'
+    // lifecycle indications.
+    jobindication::open();
     // The running thread keeps the context it attached with until it ends.
     if (!pollingEnabled)
         threadArgs.context = prepareThreadContext(ctx);
@@ -243,8 +248,11 @@ CmpiStatus Vexlan_CNA_Provider::cleanup(CmpiContext&)
 {
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider cleanup was called *****");
-    // A flash worker still writing is waited for: no code of the provider may
-    // run once the last cleanup has returned.
+    // No job indication is built or delivered from here on; a worker that
+    // is delivering one is waited for. Then a flash worker still writing is
+    // waited for: no code of the provider may run once the last cleanup has
+    // returned.
+    jobindication::close();
     WaitForFlashWorkers();
     bool started = initializing || initialized;
     if (initializing) {
@@ -375,6 +383,12 @@ CmpiStatus Vexlan_CNA_Provider::invokeMethod(const CmpiContext& ctx, CmpiResult&
                                              methodName != nullptr ? methodName : "");
         std::size_t count = 0;
         const MethodRoute* routes = methodRoutes(count);
+        // Cleared on every way out, exceptions included.
+        struct MethodContextScope {
+            Vexlan_CNA_Provider& provider;
+            MethodContextScope(Vexlan_CNA_Provider& p, const CmpiContext& c) : provider(p) { p.methodContext = &c; }
+            ~MethodContextScope() { provider.methodContext = nullptr; }
+        } scope(*this, ctx);
         for (std::size_t i = 0; i < count; ++i) {
             if (ref.classPathIsA(routes[i].className)) {
                 routes[i].invokeMethod(ctx, rslt, ref, methodName, in, out);

@@ -143,6 +143,10 @@ public:
 
     // Every known update job by id, under jobStoreLock().
     ConcreteJobMap jobMap;
+    // The context of the method request being served, set by invokeMethod
+    // under provider_lock for the length of the call; the start functions
+    // prepare each flash worker's own context from it. Null otherwise.
+    const CmpiContext* methodContext;
 
     // Set by the polling thread: initializing as the first build begins,
     // initialized when it has finished. Read without a lock by invokeMethod

@@ -9,6 +9,7 @@
 #include <fstream>
 #include <iostream>
 #include <mutex>
+#include <new>
 #include <strings.h>
 
 bool g_EnableZORAPLog = false;
@@ -124,12 +125,14 @@ Vexlan_NIC_Properties* Vexlan_NIC_Properties::singleton = nullptr;
 
 Vexlan_NIC_Properties* Vexlan_NIC_Properties::instance() {
     // The first callers may be the polling thread and a request thread at
-    // once: a function-local static is created exactly once, and it is
-    // destroyed when the server unloads the library, so nothing is left behind.
+    // once: a function-local static is created exactly once. The object lives
+    // in storage of its own and is never destroyed: the library's unload code
+    // stops the polling thread, which reads it, while the library's other
+    // objects are being destroyed. It owns no memory.
     static Vexlan_NIC_Properties* const created = [] {
-        static Vexlan_NIC_Properties object;
-        singleton = &object;
-        return &object;
+        alignas(Vexlan_NIC_Properties) static unsigned char storage[sizeof(Vexlan_NIC_Properties)];
+        singleton = new (storage) Vexlan_NIC_Properties;
+        return singleton;
     }();
     return created;
 }

@@ -6,6 +6,7 @@
 #include <cstdlib>
 
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "update/FlashUpdate.h"
 
 namespace {
 // Ids are 0 to 65534, so at most this many jobs can stand in the map.
@@ -22,6 +23,15 @@ unsigned short JobStateOfStatus(unsigned int status)
     default:
         return 4;
     }
+}
+
+std::optional<unsigned short> JobPercentComplete(const Concrete_Job& job)
+{
+    if (job.status == 2)
+        return 100;
+    if (job.status == 0 && FlashWorkerRunsJob(job.id))
+        return 0;
+    return std::nullopt;
 }
 
 std::recursive_mutex& jobStoreLock()

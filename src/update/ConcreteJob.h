@@ -14,6 +14,7 @@
 #include <cstdint>
 #include <map>
 #include <mutex>
+#include <optional>
 #include <string>
 
 #include "zorap_cna.h"
@@ -45,6 +46,13 @@ using ConcreteJobMap = std::map<unsigned int, Concrete_Job>;
 // `status` as the JobState of Vexlan_Adapter_ConcreteJob: 1 gives 10
 // (Exception), 2 gives 7 (Completed), any other value 4 (Running).
 unsigned short JobStateOfStatus(unsigned int status);
+
+// PercentComplete of a job, where the job can know it. The adapter library's
+// write reports nothing until it returns, so a job is at 0 while its worker
+// writes in this provider and at 100 once it completed; a failed job, and a
+// job that the job file shows running with no worker of this provider behind
+// it, can't tell (nullopt: the property stays unset).
+std::optional<unsigned short> JobPercentComplete(const Concrete_Job& job);
 
 // The lock over every job map and the job file.
 std::recursive_mutex& jobStoreLock();

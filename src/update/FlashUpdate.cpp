@@ -9,7 +9,10 @@
 #include <list>
 #include <mutex>
 #include <new>
+#include <string>
+#include <utility>
 
+#include "indications/Vexlan_Adapter_JobIndications.h"
 #include "inventory/AdapterFunc.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
@@ -31,13 +34,24 @@ namespace {
 
 // The worker threads not yet joined. A worker marks itself finished as its
 // last act; finished ones are joined when the next job starts, all of them
-// (waiting for the running ones) when the provider is cleaned up.
+// (waiting for the running ones) when the provider is cleaned up. `channel`
+// is what the worker sends its job's lifecycle indications through: the
+// provider's broker and a context prepared for the worker by the request
+// that started it, which the worker attaches with and detaches (the broker
+// then frees it).
 struct Worker {
     pthread_t thread;
     bool finished;
+    unsigned int jobId;
+    jobindication::Channel channel;
 };
 std::mutex workersLock;
-std::list<Worker> workers;
+// Made in storage of its own and never destroyed: the library's unload code
+// cleans a provider up (and so joins its workers) while the library's other
+// objects are being destroyed, in an order that nothing fixes. Empty once the
+// workers are joined, so it holds nothing then.
+alignas(std::list<Worker>) unsigned char workersStorage[sizeof(std::list<Worker>)];
+std::list<Worker>& workers = *new (workersStorage) std::list<Worker>;
 
 void markFinished()
 {
@@ -46,6 +60,66 @@ void markFinished()
         if (pthread_equal(w.thread, pthread_self()))
             w.finished = true;
 }
+
+// The channel of the calling worker, handed over to it: the record keeps
+// none, so nothing else uses the context the worker detaches.
+jobindication::Channel takeChannel()
+{
+    std::lock_guard<std::mutex> guard(workersLock);
+    jobindication::Channel channel;
+    for (Worker& w : workers)
+        if (pthread_equal(w.thread, pthread_self()))
+            std::swap(channel, w.channel);
+    return channel;
+}
+
+// A context for a new worker, prepared from the method request that starts
+// it; none when the start comes from elsewhere or the broker gives none.
+jobindication::Channel prepareChannel(Vexlan_CNA_Provider& provider)
+{
+    jobindication::Channel channel;
+    if (provider.threadArgs.broker == nullptr || provider.methodContext == nullptr)
+        return channel;
+    try {
+        channel.context = provider.threadArgs.broker->prepareAttachThread(*provider.methodContext).getEnc();
+        channel.broker = provider.threadArgs.broker;
+    } catch (...) {
+        FLASH_ERROR("Flash update job: no thread context for its lifecycle indications");
+    }
+    return channel;
+}
+
+// A worker's own side of its channel: attached while it runs.
+class AttachedWorker {
+public:
+    AttachedWorker() : channel_(takeChannel())
+    {
+        if (!channel_.usable())
+            return;
+        try {
+            channel_.broker->attachThread(CmpiContext(channel_.context));
+        } catch (...) {
+            FLASH_ERROR("Flash update job: attachThread failed, no lifecycle indications");
+            channel_ = jobindication::Channel();
+        }
+    }
+    ~AttachedWorker()
+    {
+        if (!channel_.usable())
+            return;
+        try {
+            channel_.broker->detachThread(CmpiContext(channel_.context));
+        } catch (...) {
+            FLASH_ERROR("Flash update job: detachThread failed");
+        }
+    }
+    AttachedWorker(const AttachedWorker&) = delete;
+    AttachedWorker& operator=(const AttachedWorker&) = delete;
+    const jobindication::Channel& channel() const { return channel_; }
+
+private:
+    jobindication::Channel channel_;
+};
 
 // Joins the workers that are done (all of them with `all`, waiting for the
 // rest). Never called by a worker.
@@ -103,6 +177,7 @@ bool startJob(Vexlan_CNA_Provider& provider, Concrete_Job& job, void* (*proc)(vo
     // The worker's own copy is complete before it starts, and the map's entry
     // stands before the worker can reach the map (it waits for this lock).
     provider.jobMap.insert({job.id, job});
+    const jobindication::Channel channel = prepareChannel(provider);
     pthread_t thread;
     {
         std::lock_guard<std::mutex> workersGuard(workersLock);
@@ -114,9 +189,15 @@ bool startJob(Vexlan_CNA_Provider& provider, Concrete_Job& job, void* (*proc)(vo
             FLASH_ERROR("Error %d creating the flash update job thread", rc);
             provider.jobMap.erase(job.id);
             delete heapJob;
+            if (channel.usable()) {
+                try {
+                    channel.broker->detachThread(CmpiContext(channel.context));
+                } catch (...) {
+                }
+            }
             return false;
         }
-        workers.push_back(Worker{thread, false});
+        workers.push_back(Worker{thread, false, job.id, channel});
     }
     provider.jobMap[job.id].threadId = thread;
     provider.SerializeConcreteJobInfo();
@@ -127,9 +208,12 @@ bool startJob(Vexlan_CNA_Provider& provider, Concrete_Job& job, void* (*proc)(vo
 }
 
 // The end of a worker: the job's final state in the map (twice, the second
-// time with the end time), the flag cleared, the jobs saved, the copy freed.
-void finishJob(Concrete_Job* job, unsigned int result)
+// time with the end time), the flag cleared, the jobs saved, the change of
+// JobState sent, the copy freed.
+void finishJob(Concrete_Job* job, unsigned int result, const AttachedWorker& attached,
+               const std::string& creationIdentifier)
 {
+    const Concrete_Job previous = *job;
     job->status = result == 0 ? 2 : 1;
     job->result = result;
     gbFlashUpdateInProgress = false;
@@ -144,8 +228,8 @@ void finishJob(Concrete_Job* job, unsigned int result)
             provider->SerializeConcreteJobInfo();
         }
     }
+    jobindication::sendModification(attached.channel(), previous, *job, creationIdentifier);
     delete job;
-    markFinished();
 }
 
 // A worker started without its job (or with the other side's) ends at once.
@@ -156,6 +240,7 @@ bool refuseWithoutJob(Concrete_Job* job, bool nic)
     FLASH_ERROR(nic ? "**** Error: Thread context not established for NIC flash update thread"
                     : "**** Error: Thread context not established for FC flash update thread");
     gbFlashUpdateInProgress = false;
+    { AttachedWorker releasesItsContext; }
     markFinished();
     return true;
 }
@@ -165,6 +250,21 @@ const unsigned char* bytesOf(const std::string& s)
     return reinterpret_cast<const unsigned char*>(s.c_str());
 }
 
+// The life of a worker with its job: attached to the broker, the creation
+// sent, the write, the end of the job with its modification, detached, and
+// marked finished last.
+template <class Write>
+void runWorker(Concrete_Job* job, Write&& write)
+{
+    {
+        AttachedWorker attached;
+        const std::string creation = jobindication::sendCreation(attached.channel(), *job);
+        const unsigned result = write(*job);
+        finishJob(job, result, attached, creation);
+    }
+    markFinished();
+}
+
 }  // namespace
 
 void* FCFlashUpdateProc(void* arg)
@@ -172,11 +272,13 @@ void* FCFlashUpdateProc(void* arg)
     auto* job = static_cast<Concrete_Job*>(arg);
     if (refuseWithoutJob(job, false))
         return nullptr;
-    FLASH_DEBUG("FCFlashUpdateProc: Will do asynchronous update on adapter with serial number = %s, with flash file = %s.",
-                job->serialNumber.c_str(), job->imageFile.c_str());
-    const ZORAP_STATUS result = ZORAP_doOptionROMUpdate(job->device, bytesOf(job->imageFile), 0);
-    FLASH_DEBUG("FCFlashUpdateProc: ZORAP_UpdateFlash returns %u", static_cast<unsigned>(result));
-    finishJob(job, static_cast<unsigned>(result));
+    runWorker(job, [](Concrete_Job& j) {
+        FLASH_DEBUG("FCFlashUpdateProc: Will do asynchronous update on adapter with serial number = %s, with flash file = %s.",
+                    j.serialNumber.c_str(), j.imageFile.c_str());
+        const ZORAP_STATUS result = ZORAP_doOptionROMUpdate(j.device, bytesOf(j.imageFile), 0);
+        FLASH_DEBUG("FCFlashUpdateProc: ZORAP_UpdateFlash returns %u", static_cast<unsigned>(result));
+        return static_cast<unsigned>(result);
+    });
     return nullptr;
 }
 
@@ -185,18 +287,29 @@ void* NICFlashUpdateProc(void* arg)
     auto* job = static_cast<Concrete_Job*>(arg);
     if (refuseWithoutJob(job, true))
         return nullptr;
-    FLASH_DEBUG("NICFlashUpdateProc: Will do asynchronous update on adapter with serial number = %s, index = %u, with "
-                "flash file = %s.",
-                job->serialNumber.c_str(), job->adapterInstance, job->imageFile.c_str());
-    const ZORAP_STATUS result = ZORAP_UpdateFlash(job->adapterInstance, bytesOf(job->imageFile), 0);
-    FLASH_DEBUG("NICFlashUpdateProc: ZORAP_UpdateFlash returns %u", static_cast<unsigned>(result));
-    finishJob(job, static_cast<unsigned>(result));
+    runWorker(job, [](Concrete_Job& j) {
+        FLASH_DEBUG("NICFlashUpdateProc: Will do asynchronous update on adapter with serial number = %s, index = %u, "
+                    "with flash file = %s.",
+                    j.serialNumber.c_str(), j.adapterInstance, j.imageFile.c_str());
+        const ZORAP_STATUS result = ZORAP_UpdateFlash(j.adapterInstance, bytesOf(j.imageFile), 0);
+        FLASH_DEBUG("NICFlashUpdateProc: ZORAP_UpdateFlash returns %u", static_cast<unsigned>(result));
+        return static_cast<unsigned>(result);
+    });
     return nullptr;
 }
 
 void WaitForFlashWorkers()
 {
     joinWorkers(true);
+}
+
+bool FlashWorkerRunsJob(unsigned int id)
+{
+    std::lock_guard<std::mutex> guard(workersLock);
+    for (const Worker& w : workers)
+        if (w.jobId == id && !w.finished)
+            return true;
+    return false;
 }
 
 int FlashWorkerCount()

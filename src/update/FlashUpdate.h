@@ -1,8 +1,11 @@
 // The flash update workers: one thread per asynchronous update, started by
 // Vexlan_CNA_Provider::StartFCFlashUpdateThread / StartNICFlashUpdateThread.
 // A worker writes the image through the adapter library, records the job's
-// end in the job map and the job file, and ends. It calls no broker service
-// and takes no provider lock.
+// end in the job map and the job file, and ends. It takes no provider lock.
+// Its only broker services are those of the job's lifecycle indications
+// (src/indications/Vexlan_Adapter_JobIndications.h): attached with a context
+// that the starting request prepared, it sends them while a filter is active
+// and the provider is not being cleaned up.
 #ifndef VEXLAN_UPDATE_FLASHUPDATE_H
 #define VEXLAN_UPDATE_FLASHUPDATE_H
 
@@ -14,6 +17,8 @@ void* NICFlashUpdateProc(void* job);
 // Joins every worker thread, waiting for those still writing; the provider's
 // cleanup calls it first, so no worker runs once the library may go.
 void WaitForFlashWorkers();
+// True while the worker of job `id` runs (its write not yet ended).
+bool FlashWorkerRunsJob(unsigned int id);
 // Number of workers not yet joined (running or finished).
 int FlashWorkerCount();
 

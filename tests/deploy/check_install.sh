@@ -175,9 +175,10 @@ check_load() {
   done
   # Both flavours see the same objects.
   cmp -s "$tmp/pegasus.out" "$tmp/sfcb.out" || fail "the two flavours answer differently"
-  # grep reads the whole text: with -q it would stop at the match, and the
-  # broken pipe of cimhost would fail the pipeline under pipefail.
-  "$prefix/$bindir/cimhost" --help | grep -- '--reg FILE' > /dev/null || fail "cimhost --help does not describe --reg"
+  # Captured first: grep -q stops reading at the match, and a help text longer
+  # than one write would then end cimhost with SIGPIPE, which pipefail reports.
+  help=$("$prefix/$bindir/cimhost" --help)
+  grep -q -- '--reg FILE' <<<"$help" || fail "cimhost --help does not describe --reg"
   # With no options the installed cimhost finds the installed provider, its
   # class files and namespace; an empty key in a batch line is the empty text.
   out=$tmp/plain.out err=$tmp/plain.err

@@ -1,6 +1,7 @@
 #!/usr/bin/env python3
 """scripts/cimxml_listener.py answers an ExportIndication as a CIM server
-expects and prints the indication with its properties in order."""
+expects and prints the indication with its properties in order, an embedded
+instance as an instance of its own."""
 
 import http.client
 import json
@@ -16,6 +17,10 @@ REQUEST = """<?xml version="1.0" encoding="utf-8" ?>
 <PROPERTY NAME="Message" TYPE="string"><VALUE>FC Port 3100027E5A160042 in HBA VXF0000042 status changed to Error</VALUE></PROPERTY>
 <PROPERTY NAME="PerceivedSeverity" TYPE="uint16"><VALUE>6</VALUE></PROPERTY>
 <PROPERTY NAME="OtherSeverity" TYPE="string"></PROPERTY>
+<PROPERTY NAME="SourceInstance" TYPE="string" EmbeddedObject="instance"><VALUE>&lt;INSTANCE CLASSNAME="Vexlan_Adapter_ConcreteJob"&gt;
+&lt;PROPERTY NAME="Owner" TYPE="string"&gt;&lt;/PROPERTY&gt;
+&lt;PROPERTY NAME="JobState" TYPE="uint16"&gt;&lt;VALUE&gt;7&lt;/VALUE&gt;&lt;/PROPERTY&gt;
+&lt;/INSTANCE&gt;</VALUE></PROPERTY>
 </INSTANCE></EXPPARAMVALUE></EXPMETHODCALL></SIMPLEEXPREQ></MESSAGE></CIM>
 """
 
@@ -40,10 +45,13 @@ def main(listener):
         doc = json.loads(out.strip().splitlines()[-1])
         assert doc["className"] == "VexlanCNA_AlertIndication_AdapterStatusChange", doc
         assert list(doc["properties"]) == ["IndicationIdentifier", "CorrelatedIndications", "Message",
-                                           "PerceivedSeverity", "OtherSeverity"], doc
+                                           "PerceivedSeverity", "OtherSeverity", "SourceInstance"], doc
         assert doc["properties"]["CorrelatedIndications"] == [""], doc
         assert doc["properties"]["PerceivedSeverity"] == "6" and doc["types"]["PerceivedSeverity"] == "uint16", doc
         assert doc["properties"]["OtherSeverity"] is None, doc
+        assert doc["properties"]["SourceInstance"] == {"className": "Vexlan_Adapter_ConcreteJob",
+                                                       "properties": {"JobState": "7"},
+                                                       "types": {"JobState": "uint16"}}, doc
     finally:
         if proc.poll() is None:
             proc.kill()
