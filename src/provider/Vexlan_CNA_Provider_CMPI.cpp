@@ -11,6 +11,7 @@
 #include <ctime>
 
 #include "inventory/AdapterFunc.h"
+#include "provider/ClassTests.h"
 #include "provider/Vexlan_CNA_Provider_Tables.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "update/FlashUpdate.h"
@@ -81,12 +82,13 @@ void walkRoutes(const CmpiObjectPath& cop, Call&& call)
     std::size_t count = 0;
     const InstanceRoute* routes = instanceRoutes(count);
     const RouteGroup groups[] = {RouteGroup::Always, RouteGroup::SupportHdr, RouteGroup::Nic};
+    const PathClassTests classes(cop);
     for (RouteGroup group : groups) {
         if (group == RouteGroup::SupportHdr && g_SUPPORT_HDR == 0)
             continue;
         for (std::size_t i = 0; i < count; ++i) {
             const InstanceRoute& route = routes[i];
-            if (route.group != group || !cop.classPathIsA(route.className))
+            if (route.group != group || !classes.isA(route.className))
                 continue;
             if (route.rebuild != nullptr) {
                 route.rebuild->remove();
@@ -289,6 +291,7 @@ void Vexlan_CNA_Provider::cleanupAgent()
     }
     ZORAP_UnRegisterAlarmNotificationCallback(kPollingSteps.alarmCallback);
     ZORAP_Uninitialize();
+    classtests::forget();
 }
 
 // ---- Instance requests -------------------------------------------------------------
@@ -375,8 +378,9 @@ CmpiStatus Vexlan_CNA_Provider::invokeMethod(const CmpiContext& ctx, CmpiResult&
                                              methodName != nullptr ? methodName : "");
         std::size_t count = 0;
         const MethodRoute* routes = methodRoutes(count);
+        const PathClassTests classes(ref);
         for (std::size_t i = 0; i < count; ++i) {
-            if (ref.classPathIsA(routes[i].className)) {
+            if (classes.isA(routes[i].className)) {
                 routes[i].invokeMethod(ctx, rslt, ref, methodName, in, out);
                 break;
             }

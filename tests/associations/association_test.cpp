@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <fstream>
+#include <functional>
 #include <map>
 #include <set>
 #include <sstream>
@@ -623,6 +624,33 @@ TEST_F(Associations, RemoteServiceAccessPointsJoinAsDescribed)
     const OpResult own = host().associatorNames(endpoint, assoc("Vexlan_NIC_RemoteServiceAccessPointIPProtocolEndpoint"));
     ASSERT_EQ(own.paths.size(), 1u);
     EXPECT_EQ(own.paths[0].key("Name")->s, mac);
+}
+
+// Once the provider has seen a class, its dispatch class tests (routes, gate,
+// chain, rounds, the modules' role tests, a parent class asked for) need no
+// broker call: a repeated request makes no classPathIsA call.
+TEST_F(Associations, ARequestSeenBeforeAsksTheBrokerNoClassTest)
+{
+    const ObjectPath cs = firstOf(host(), "Vexlan_Adapter_ComputerSystem");
+    const ObjectPath port = firstOf(host(), "Vexlan_FCHBA_FCPort");
+    AssocParams parent;
+    parent.resultClass = "CIM_SystemDevice";
+    const std::vector<std::pair<std::string, std::function<OpResult()>>> requests = {
+        {"getInstance of the system", [&] { return host().getInstance(cs); }},
+        {"associatorNames of a port", [&] { return host().associatorNames(port); }},
+        {"references of the system", [&] { return host().references(cs); }},
+        {"one call without a class", [&] { return host().associatorNamesAsCalled(port, {}); }},
+        {"one call with a parent class", [&] { return host().referenceNamesAsCalled(port, parent); }},
+        {"a method", [&] { return host().invokeMethod(classPath("Vexlan_FCHBA_FCPort"), "NoSuchMethod", {}); }},
+    };
+    for (const auto& [what, request] : requests) {
+        const OpResult first = request();
+        const int before = host().counters().classPathIsACalls;
+        const OpResult again = request();
+        EXPECT_EQ(host().counters().classPathIsACalls, before) << what;
+        EXPECT_EQ(identities(again.paths), identities(first.paths)) << what;
+        EXPECT_EQ(again.instances.size(), first.instances.size()) << what;
+    }
 }
 
 }  // namespace

@@ -1,0 +1,42 @@
+// The class tests of dispatch (instance and method routes, the association
+// gate, chain and rounds, the modules' role and result class tests), asked of
+// the broker once per provider life and kept. The provider's classes and
+// their parents cannot change without a new registration, which loads the
+// provider again; the kept answers are forgotten at its cleanup.
+//
+// Answers are kept by namespace, class of the path and tested class, all
+// without regard to case. A broker call that fails throws as
+// CmpiObjectPath::classPathIsA does, and nothing is kept for it.
+#ifndef VEXLAN_PROVIDER_CLASSTESTS_H
+#define VEXLAN_PROVIDER_CLASSTESTS_H
+
+#include <cstddef>
+#include <string>
+
+#include "CmpiImpl.h"
+
+// The tests of one path: its namespace and class are read once.
+class PathClassTests {
+public:
+    explicit PathClassTests(const CmpiObjectPath& path);
+    // classPathIsA(cls) of the path.
+    bool isA(const char* cls) const;
+
+private:
+    const CmpiObjectPath& path_;
+    std::string prefix_;   // the key's namespace and class; empty when unreadable
+};
+
+namespace classtests {
+// classPathIsA(cls) of `path`.
+bool isA(const CmpiObjectPath& path, const char* cls);
+// Whether the class `cls` of namespace `ns` is `ancestor` or derives from it
+// (classPathIsA of a path of that class).
+bool classIsA(const char* ns, const char* cls, const char* ancestor);
+// Forgets every kept answer (the provider's cleanup).
+void forget();
+// How many answers are kept.
+std::size_t kept();
+}  // namespace classtests
+
+#endif
