@@ -7,10 +7,18 @@
 namespace {
 
 std::mutex g_lock;
+
+// The library's unload code may run the provider's cleanup after the
+// library's other objects are gone; the kept answers say when they are.
+bool g_answersGone = false;
+struct Answers {
+    std::unordered_map<std::string, bool> map;
+    ~Answers() { g_answersGone = true; }
+} g_answers;
+
 std::unordered_map<std::string, bool>& answers()
 {
-    static std::unordered_map<std::string, bool> kept;
-    return kept;
+    return g_answers.map;
 }
 
 void appendLower(std::string& key, const char* text)
@@ -44,7 +52,7 @@ const char* pathText(const CmpiObjectPath& path, CMPIString* (*get)(const CMPIOb
 template <class Ask>
 bool answer(const std::string& prefix, const char* tested, Ask&& ask)
 {
-    if (prefix.empty() || tested == nullptr)
+    if (prefix.empty() || tested == nullptr || g_answersGone)
         return ask();
     std::string key = prefix;
     appendLower(key, tested);
@@ -89,13 +97,8 @@ bool classIsA(const char* ns, const char* cls, const char* ancestor)
 void forget()
 {
     std::lock_guard<std::mutex> guard(g_lock);
-    answers().clear();
-}
-
-std::size_t kept()
-{
-    std::lock_guard<std::mutex> guard(g_lock);
-    return answers().size();
+    if (!g_answersGone)
+        answers().clear();
 }
 
 }  // namespace classtests

@@ -10,7 +10,6 @@
 #ifndef VEXLAN_PROVIDER_CLASSTESTS_H
 #define VEXLAN_PROVIDER_CLASSTESTS_H
 
-#include <cstddef>
 #include <string>
 
 #include "CmpiImpl.h"
@@ -35,8 +34,6 @@ bool isA(const CmpiObjectPath& path, const char* cls);
 bool classIsA(const char* ns, const char* cls, const char* ancestor);
 // Forgets every kept answer (the provider's cleanup).
 void forget();
-// How many answers are kept.
-std::size_t kept();
 }  // namespace classtests
 
 #endif
