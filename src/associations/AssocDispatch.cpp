@@ -19,6 +19,7 @@
 
 #include "associations/AssocRows.h"
 #include "provider/ClassTests.h"
+#include "provider/RequestLists.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
@@ -435,6 +436,7 @@ CmpiStatus dispatch(const Request& rq)
     bool gateClosed = false;
     {
         ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+        const RequestScope request;
         if (rq.op == Op::Associators)
             DISPATCH_DEBUG("Vexlan_CNA_Provider::associators entered");
         try {

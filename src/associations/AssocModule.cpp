@@ -8,6 +8,7 @@
 #include <cstring>
 
 #include "provider/ClassTests.h"
+#include "provider/RequestLists.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 namespace {
@@ -501,14 +502,14 @@ void assocBuild(const AssocRow& row)
 {
     if (row.form != AssocForm::Plain)
         return;
-    row.end1.cls->list.build();
-    row.end2.cls->list.build();
+    requestlists::build(row.end1.cls->list);
+    requestlists::build(row.end2.cls->list);
 }
 
 void assocRemove(const AssocRow& row)
 {
     if (row.form != AssocForm::Plain)
         return;
-    row.end1.cls->list.remove();
-    row.end2.cls->list.remove();
+    requestlists::remove(row.end1.cls->list);
+    requestlists::remove(row.end2.cls->list);
 }

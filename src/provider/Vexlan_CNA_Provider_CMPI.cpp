@@ -12,6 +12,7 @@
 
 #include "inventory/AdapterFunc.h"
 #include "provider/ClassTests.h"
+#include "provider/RequestLists.h"
 #include "provider/Vexlan_CNA_Provider_Tables.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "update/FlashUpdate.h"
@@ -91,8 +92,8 @@ void walkRoutes(const CmpiObjectPath& cop, Call&& call)
             if (route.group != group || !classes.isA(route.className))
                 continue;
             if (route.rebuild != nullptr) {
-                route.rebuild->remove();
-                route.rebuild->build();
+                requestlists::remove(*route.rebuild);
+                requestlists::build(*route.rebuild);
             }
             call(route.ops);
             break;
@@ -123,6 +124,7 @@ CmpiStatus dispatchInstanceRequest(const char* name, CmpiResult& rslt, const Cmp
 {
     {
         ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+        const RequestScope request;
         try {
             CMPIStatus rc;
             const char* className = classNameText(cop, rc);

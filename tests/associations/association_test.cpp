@@ -653,4 +653,24 @@ TEST_F(Associations, ARequestSeenBeforeAsksTheBrokerNoClassTest)
     }
 }
 
+// One request rebuilds each list at most once, however many of its rounds
+// and modules ask for the rebuild: the FC port list is built once (one port
+// property read per FC function) for a call that runs every row of a port.
+TEST_F(Associations, OneRequestRebuildsAListOnce)
+{
+    const size_t ports = host().enumerateInstanceNames(classPath("Vexlan_FCHBA_FCPort")).paths.size();
+    ASSERT_GT(ports, 1u);
+    const ObjectPath port = firstOf(host(), "Vexlan_FCHBA_FCPort");
+    zorap_sim_reset();
+    const OpResult all = host().associatorNamesAsCalled(port, {});
+    expectClean(all, "every row of a port");
+    EXPECT_EQ(zorap_sim_call_count(ZORAP_FN_GetHbaDevicePortProperty), ports);
+    EXPECT_TRUE(std::count_if(all.paths.begin(), all.paths.end(),
+                              [](const ObjectPath& p) { return p.className == "Vexlan_FCHBA_FCPortStatistics"; }));
+    // The next request builds it again: it sees data no older than itself.
+    zorap_sim_reset();
+    expectClean(host().associatorNamesAsCalled(port, {}), "again");
+    EXPECT_EQ(zorap_sim_call_count(ZORAP_FN_GetHbaDevicePortProperty), ports);
+}
+
 }  // namespace
