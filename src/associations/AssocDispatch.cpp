@@ -283,7 +283,7 @@ CmpiStatus runChain(const Request& rq, const char* sConstCopStr, const char* cal
         if (row.hdr && g_SUPPORT_HDR == 0)
             continue;
         const bool sourceMatches =
-            testedByIsA(test.source) ? rq.pathClasses.isA(test.source) : strcasecmp(sConstCopStr, test.source) == 0;
+            testedByIsA(test.source) ? rq.pathClasses.isAFixed(test.source) : strcasecmp(sConstCopStr, test.source) == 0;
         if (!sourceMatches)
             continue;
         const char* alternative =
@@ -327,7 +327,7 @@ void returnDoneQuietly(CmpiResult& rslt) noexcept
 bool passesGate(const PathClassTests& path, const char* assocClass)
 {
     for (const AssocLookupRow& row : tables().lookup)
-        if (path.isA(row.sourceClass) &&
+        if (path.isAFixed(row.sourceClass) &&
             (assocClass == nullptr || strcasecmp(row.assocClass, assocClass) == 0))
             return true;
     return false;
@@ -420,7 +420,7 @@ std::vector<const char*> derivedClassesAsked(const Request& rq)
     for (const AssocClassRow& row : kAssociations) {
         bool atSource = false;
         for (const char* source : row.sources)
-            atSource = atSource || (source != nullptr && rq.pathClasses.isA(source));
+            atSource = atSource || (source != nullptr && rq.pathClasses.isAFixed(source));
         if (atSource && classIsA(rq.path, row.assocClass, rq.assocParameter))
             classes.push_back(row.assocClass);
     }

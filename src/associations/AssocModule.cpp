@@ -58,16 +58,16 @@ void exitingLine(const AssocRow& row, const std::string& op)
 // CIM classes it derives from.
 bool isRole1(const AssocRow& row, const CmpiObjectPath& path)
 {
-    if (classtests::isA(path, row.end1.cls->className))
+    if (classtests::isAFixed(path, row.end1.cls->className))
         return true;
     if (filtering(row) || std::strcmp(row.end1.cls->className, "Vexlan_Adapter_ComputerSystem") != 0)
         return false;
-    return classtests::isA(path, "CIM_System") || classtests::isA(path, "CIM_ComputerSystem");
+    return classtests::isAFixed(path, "CIM_System") || classtests::isAFixed(path, "CIM_ComputerSystem");
 }
 
 bool isRole2(const AssocRow& row, const CmpiObjectPath& path)
 {
-    return classtests::isA(path, row.end2.cls->className);
+    return classtests::isAFixed(path, row.end2.cls->className);
 }
 
 // A source of neither end: the class name goes into the thrown status. A row
@@ -130,7 +130,7 @@ CmpiStatus traverse(const AssocRow& row, const std::string& op, CmpiResult& rslt
         return CmpiStatus(CMPI_RC_OK);
     for (int sourceRole = 1; sourceRole <= 2; ++sourceRole) {
         const bool role1 = sourceRole == 1;
-        if (!(role1 ? classtests::isA(path, row.end1.cls->className) : isRole2(row, path)))
+        if (!(role1 ? classtests::isAFixed(path, row.end1.cls->className) : isRole2(row, path)))
             continue;
         const AssocEnd& own = role1 ? row.end1 : row.end2;
         const AssocEnd& other = role1 ? row.end2 : row.end1;

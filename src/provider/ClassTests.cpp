@@ -2,9 +2,21 @@
 
 #include <cctype>
 #include <mutex>
+#include <string>
 #include <unordered_map>
 
+namespace classtests {
+// The answers for one class of one namespace, by tested class: by its text
+// (lower case) and, for fixed texts, by its address.
+struct KeptAnswers {
+    std::unordered_map<std::string, bool> byText;
+    std::unordered_map<const char*, bool> byAddress;
+};
+}  // namespace classtests
+
 namespace {
+
+using classtests::KeptAnswers;
 
 std::mutex g_lock;
 
@@ -12,31 +24,29 @@ std::mutex g_lock;
 // library's other objects are gone; the kept answers say when they are.
 bool g_answersGone = false;
 struct Answers {
-    std::unordered_map<std::string, bool> map;
+    std::unordered_map<std::string, std::shared_ptr<KeptAnswers>> byClass;
     ~Answers() { g_answersGone = true; }
 } g_answers;
 
-std::unordered_map<std::string, bool>& answers()
+std::string lower(const char* text)
 {
-    return g_answers.map;
+    std::string out(text);
+    for (char& c : out)
+        c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    return out;
 }
 
-void appendLower(std::string& key, const char* text)
+// The answers of class `cls` in namespace `ns`; null when either is missing.
+std::shared_ptr<KeptAnswers> answersOf(const char* ns, const char* cls)
 {
-    for (; *text != '\0'; ++text)
-        key += static_cast<char>(std::tolower(static_cast<unsigned char>(*text)));
-    key += '\x1f';
-}
-
-// The key's namespace and class part, or "" when either is missing.
-std::string prefixOf(const char* ns, const char* cls)
-{
-    std::string key;
-    if (ns == nullptr || cls == nullptr)
-        return key;
-    appendLower(key, ns);
-    appendLower(key, cls);
-    return key;
+    if (ns == nullptr || cls == nullptr || g_answersGone)
+        return nullptr;
+    const std::string key = lower(ns) + '\x1f' + lower(cls);
+    std::lock_guard<std::mutex> guard(g_lock);
+    std::shared_ptr<KeptAnswers>& kept = g_answers.byClass[key];
+    if (!kept)
+        kept = std::make_shared<KeptAnswers>();
+    return kept;
 }
 
 const char* pathText(const CmpiObjectPath& path, CMPIString* (*get)(const CMPIObjectPath*, CMPIStatus*))
@@ -48,23 +58,19 @@ const char* pathText(const CmpiObjectPath& path, CMPIString* (*get)(const CMPIOb
     return s->ft->getCharPtr(s, nullptr);
 }
 
-// The kept answer of `key` + `tested`, or the one `ask` gives, then kept.
-template <class Ask>
-bool answer(const std::string& prefix, const char* tested, Ask&& ask)
+// The kept answer for `key` in `table`, or the one `ask` gives, then kept.
+template <class Map, class Ask>
+bool answer(Map& table, const typename Map::key_type& key, Ask&& ask)
 {
-    if (prefix.empty() || tested == nullptr || g_answersGone)
-        return ask();
-    std::string key = prefix;
-    appendLower(key, tested);
     {
         std::lock_guard<std::mutex> guard(g_lock);
-        const auto it = answers().find(key);
-        if (it != answers().end())
+        const auto it = table.find(key);
+        if (it != table.end())
             return it->second;
     }
     const bool is = ask();
     std::lock_guard<std::mutex> guard(g_lock);
-    answers().emplace(std::move(key), is);
+    table.emplace(key, is);
     return is;
 }
 
@@ -73,32 +79,45 @@ bool answer(const std::string& prefix, const char* tested, Ask&& ask)
 PathClassTests::PathClassTests(const CmpiObjectPath& path) : path_(path)
 {
     if (path.getEnc() != nullptr)
-        prefix_ = prefixOf(pathText(path, path.getEnc()->ft->getNameSpace),
-                           pathText(path, path.getEnc()->ft->getClassName));
+        kept_ = answersOf(pathText(path, path.getEnc()->ft->getNameSpace),
+                          pathText(path, path.getEnc()->ft->getClassName));
 }
 
 bool PathClassTests::isA(const char* cls) const
 {
-    return answer(prefix_, cls, [&] { return path_.classPathIsA(cls); });
+    if (!kept_ || cls == nullptr)
+        return path_.classPathIsA(cls);
+    return answer(kept_->byText, lower(cls), [&] { return path_.classPathIsA(cls); });
+}
+
+bool PathClassTests::isAFixed(const char* cls) const
+{
+    if (!kept_ || cls == nullptr)
+        return path_.classPathIsA(cls);
+    return answer(kept_->byAddress, cls, [&] { return isA(cls); });
 }
 
 namespace classtests {
 
-bool isA(const CmpiObjectPath& path, const char* cls)
+bool isAFixed(const CmpiObjectPath& path, const char* cls)
 {
-    return PathClassTests(path).isA(cls);
+    return PathClassTests(path).isAFixed(cls);
 }
 
 bool classIsA(const char* ns, const char* cls, const char* ancestor)
 {
-    return answer(prefixOf(ns, cls), ancestor, [&] { return CmpiObjectPath(ns, cls).classPathIsA(ancestor); });
+    const std::shared_ptr<KeptAnswers> kept = answersOf(ns, cls);
+    auto ask = [&] { return CmpiObjectPath(ns, cls).classPathIsA(ancestor); };
+    if (!kept || ancestor == nullptr)
+        return ask();
+    return answer(kept->byText, lower(ancestor), ask);
 }
 
 void forget()
 {
     std::lock_guard<std::mutex> guard(g_lock);
     if (!g_answersGone)
-        answers().clear();
+        g_answers.byClass.clear();
 }
 
 }  // namespace classtests

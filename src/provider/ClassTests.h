@@ -10,25 +10,32 @@
 #ifndef VEXLAN_PROVIDER_CLASSTESTS_H
 #define VEXLAN_PROVIDER_CLASSTESTS_H
 
-#include <string>
+#include <memory>
 
 #include "CmpiImpl.h"
 
-// The tests of one path: its namespace and class are read once.
+namespace classtests {
+struct KeptAnswers;
+}
+
+// The tests of one path: its namespace and class are read and looked up once.
 class PathClassTests {
 public:
     explicit PathClassTests(const CmpiObjectPath& path);
     // classPathIsA(cls) of the path.
     bool isA(const char* cls) const;
+    // The same for a class named by a table of the provider or a literal: a
+    // text that never changes, whose address is kept as its name.
+    bool isAFixed(const char* cls) const;
 
 private:
     const CmpiObjectPath& path_;
-    std::string prefix_;   // the key's namespace and class; empty when unreadable
+    std::shared_ptr<classtests::KeptAnswers> kept_;   // null when the path's names are unreadable
 };
 
 namespace classtests {
-// classPathIsA(cls) of `path`.
-bool isA(const CmpiObjectPath& path, const char* cls);
+// classPathIsA(cls) of `path`, `cls` a fixed text as for isAFixed.
+bool isAFixed(const CmpiObjectPath& path, const char* cls);
 // Whether the class `cls` of namespace `ns` is `ancestor` or derives from it
 // (classPathIsA of a path of that class).
 bool classIsA(const char* ns, const char* cls, const char* ancestor);

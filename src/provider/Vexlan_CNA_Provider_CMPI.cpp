@@ -89,7 +89,7 @@ void walkRoutes(const CmpiObjectPath& cop, Call&& call)
             continue;
         for (std::size_t i = 0; i < count; ++i) {
             const InstanceRoute& route = routes[i];
-            if (route.group != group || !classes.isA(route.className))
+            if (route.group != group || !classes.isAFixed(route.className))
                 continue;
             if (route.rebuild != nullptr) {
                 requestlists::remove(*route.rebuild);
@@ -382,7 +382,7 @@ CmpiStatus Vexlan_CNA_Provider::invokeMethod(const CmpiContext& ctx, CmpiResult&
         const MethodRoute* routes = methodRoutes(count);
         const PathClassTests classes(ref);
         for (std::size_t i = 0; i < count; ++i) {
-            if (classes.isA(routes[i].className)) {
+            if (classes.isAFixed(routes[i].className)) {
                 routes[i].invokeMethod(ctx, rslt, ref, methodName, in, out);
                 break;
             }
