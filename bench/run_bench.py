@@ -4,13 +4,16 @@ runs the driver (vexlan_bench) on each under callgrind, splits the counted
 instructions by who spent them, and writes docs/performance.md with a plot.
 
     run_bench.py --build DIR [--sizes 1,16,256,1024] [--out docs/performance.md]
-                 [--no-callgrind] [--check] [--as-before]
+                 [--no-callgrind] [--check] [--as-before] [--walks-only]
 
 Instruction counts are callgrind's (deterministic); wall times are medians of
 native runs and only indicative. --no-callgrind --check runs the whole chain
 natively on the given sizes into a temporary directory and fails when a request
 fails or a table comes out empty (the test of the benchmark). --as-before also
-stores the tables as the "before" section that later runs keep.
+stores the tables as the "before" section that later runs keep. --walks-only
+counts only the fixed cost of a request (GetInstance of the computer system)
+and the associations from the system, one FC port and one storage extent, and
+prints their table instead of writing the document.
 """
 import argparse
 import copy
@@ -33,6 +36,10 @@ ADAPTER_OBJECT = "libzorap_cna_provider.so"
 DRIVER_OBJECT = "vexlan_bench"
 # The host's result functions: handing results over.
 DELIVERY = re.compile(r"\brs(Data|Instance|Path|Done)\(")
+# The host's broker functions (its broker, encapsulated-object factory and
+# extended function tables): the calls that are messages in a server whose
+# provider runs in an agent process.
+BROKER_CALL = re.compile(r"(^|[^A-Za-z0-9_])[bex][A-Z][A-Za-z0-9]*\(")
 # The list builds that FCPort and FCPortStatistics requests run first.
 REBUILDS = {"Vexlan_FCHBA_FCPort": "buildFCPortList()",
             "Vexlan_FCHBA_FCPortStatistics": "buildFCPortStatisticsList()"}
@@ -149,7 +156,7 @@ def instance_classes():
 
 # ---------------------------------------------------------------- runs
 
-def run_driver(build, work, description, callgrind, repeat):
+def run_driver(build, work, description, callgrind, repeat, walks_only=False, provider=None):
     os.makedirs(work, exist_ok=True)
     desc_path = os.path.join(work, "host.json")
     with open(desc_path, "w") as f:
@@ -158,9 +165,9 @@ def run_driver(build, work, description, callgrind, repeat):
     with open(os.path.join(work, "vexlancna.properties"), "w") as f:
         f.write("LinkStatusPollIntervalSeconds=1000000\n")
     cmd = [os.path.join(build, "bin", "vexlan_bench"),
-           "--provider", os.path.join(build, "lib", "libVexlan_CNA_Provider.so.1"),
+           "--provider", provider or os.path.join(build, "lib", "libVexlan_CNA_Provider.so.1"),
            "--mof", os.path.join(build, "share", "vexlan-cna", "mof"),
-           "--repeat", str(repeat)] + instance_classes()
+           "--repeat", str(repeat)] + (["--walks-only"] if walks_only else []) + instance_classes()
     if callgrind:
         cmd = ["valgrind", "--tool=callgrind", "--callgrind-out-file=" + os.path.join(work, "cg.out"),
                "--dump-line=no"] + cmd
@@ -201,8 +208,9 @@ def parse_callgrind(path):
     names = {"ob": {}, "fn": {}}
     ob = cob = fn = cfn = None
     self_cost = {}        # (ob, fn) -> Ir
-    calls = []            # (caller ob, caller fn, callee ob, callee fn, Ir)
+    calls = []            # (caller ob, caller fn, callee ob, callee fn, Ir, count)
     pending_call = False
+    call_count = 0
 
     def name_of(kind, text):
         m = re.match(r"\((\d+)\)(?: (.*))?$", text)
@@ -229,11 +237,12 @@ def parse_callgrind(path):
                 cfn = name_of("fn", line[4:])
             elif line.startswith("calls="):
                 pending_call = True
+                call_count = int(line[6:].split()[0])
             elif line and (line[0].isdigit() or line[0] in "+-*"):
                 parts = line.split()
                 cost = int(parts[1]) if len(parts) > 1 else 0
                 if pending_call:
-                    calls.append((ob, fn, cob if cob is not None else ob, cfn, cost))
+                    calls.append((ob, fn, cob if cob is not None else ob, cfn, cost, call_count))
                     pending_call = False
                     cob = None
                 else:
@@ -242,11 +251,13 @@ def parse_callgrind(path):
     def is_provider(o):
         return o is not None and PROVIDER_OBJECT in o
 
-    split = {"own": 0, "broker": 0, "delivery": 0, "adapter": 0, "rebuild": {}}
+    split = {"own": 0, "broker": 0, "delivery": 0, "adapter": 0, "rebuild": {}, "broker_calls": 0}
     for (o, f), c in self_cost.items():
         if is_provider(o):
             split["own"] += c
-    for o, f, co, cf, c in calls:
+    for o, f, co, cf, c, n in calls:
+        if is_provider(o) and co is not None and co.endswith(DRIVER_OBJECT) and cf and BROKER_CALL.search(cf):
+            split["broker_calls"] += n
         if f in REBUILDS.values() and is_provider(o):
             split["rebuild"][f] = split["rebuild"].get(f, 0) + c
         if not is_provider(o) or is_provider(co):
@@ -264,6 +275,10 @@ def parse_callgrind(path):
 
 
 # ---------------------------------------------------------------- report
+
+def instructions(split):
+    return split["own"] + split["broker"] + split["delivery"] + split["adapter"]
+
 
 def kilo(n):
     return "%.1fk" % (n / 1000.0)
@@ -338,8 +353,8 @@ def scenario_tables(title, runs, counted):
         for c in classes:
             f, l = big.get("gi first " + c), big.get("gi last " + c)
             if f and l and "split" in f and "split" in l:
-                rows.append(["`%s`" % c, kilo(sum(v for k, v in f["split"].items() if k != "rebuild")),
-                             kilo(sum(v for k, v in l["split"].items() if k != "rebuild"))])
+                rows.append(["`%s`" % c, kilo(instructions(f["split"])),
+                             kilo(instructions(l["split"]))])
         doc.append(table(["class", "first entry", "last entry"], rows))
         rebuild_rows = []
         for s in sizes:
@@ -354,23 +369,24 @@ def scenario_tables(title, runs, counted):
             doc.append(table(["adapters", "class", "functions", "rebuild per function"], rebuild_rows))
         doc.append("\n### Associations at %d adapters\n" % sizes[-1])
         rows = []
-        for end in ("system", "port"):
+        for end in ("system", "port", "extent"):
             for op in ("ai", "ain", "ri", "rin"):
                 r = big.get("%s %s" % (op, end))
                 if r and "split" in r:
                     s = r["split"]
-                    rows.append([op, end, r["results"], kilo(s["own"] + s["broker"] + s["delivery"] + s["adapter"]),
-                                 kilo(s["own"]), kilo(s["broker"]), kilo(s["delivery"]), kilo(s["adapter"])])
+                    rows.append([op, end, r["results"], kilo(instructions(s)), kilo(s["own"]), kilo(s["broker"]),
+                                 kilo(s["delivery"]), kilo(s["adapter"]), s.get("broker_calls", "-")])
         doc.append(table(["request", "from", "results", "total", "provider own", "broker build",
-                          "host delivery", "adapter library"], rows))
+                          "host delivery", "adapter library", "broker calls"], rows))
+        doc.append("\n" + walk_table(runs))
         assoc = big.get("ai system")
         if assoc and "split" in assoc:
             enum_total = 0
             for c in assoc.get("classes", []):
                 r = big.get("ei " + c)
                 if r and "split" in r:
-                    enum_total += sum(v for k, v in r["split"].items() if k != "rebuild")
-            a_total = sum(v for k, v in assoc["split"].items() if k != "rebuild")
+                    enum_total += instructions(r["split"])
+            a_total = instructions(assoc["split"])
             doc.append("\nAssociators of the computer system against EnumerateInstances of the same result "
                        "classes: %s against %s, ratio %s.\n" % (kilo(a_total), kilo(enum_total),
                                                                 ratio(a_total, enum_total)))
@@ -379,10 +395,33 @@ def scenario_tables(title, runs, counted):
         for s in sizes:
             r = by_label(runs[s]).get("start")
             if r and "split" in r:
-                t = sum(v for k, v in r["split"].items() if k != "rebuild")
+                t = instructions(r["split"])
                 rows.append([s, kilo(t), kilo(r["split"]["adapter"])])
         doc.append(table(["adapters", "total", "adapter library"], rows))
     return "".join(doc)
+
+
+WALKS = [("gi first Vexlan_Adapter_ComputerSystem", "GetInstance of the computer system")] + [
+    ("%s %s" % (op, end), "%s from %s" % (name, what))
+    for end, what in (("port", "one FC port"), ("extent", "one StorageExtent"))
+    for op, name in (("ain", "AssociatorNames"), ("rin", "ReferenceNames"))]
+
+
+def walk_table(runs):
+    """The fixed cost of a request and the walks from one element at every
+    size: instructions (total and the provider's own) and broker calls."""
+    sizes = sorted(runs)
+    rows = []
+    for label, name in WALKS:
+        for s in sizes:
+            r = by_label(runs[s]).get(label)
+            if r and "split" in r:
+                sp = r["split"]
+                rows.append([name, "%d (%d FC functions)" % (s, 4 * s), r["results"], kilo(instructions(sp)),
+                             kilo(sp["own"]), kilo(sp["adapter"]), sp.get("broker_calls", "-")])
+    return ("### Fixed cost of a request and walks from one element (instructions and broker calls per request)\n"
+            + table(["request", "adapters", "results", "total", "provider own", "adapter library",
+                     "broker calls"], rows))
 
 
 def wall_tables(runs):
@@ -479,6 +518,9 @@ def main():
     ap.add_argument("--as-before", action="store_true")
     ap.add_argument("--work", default=None)
     ap.add_argument("--commit", default=None, help="the commit measured, when the build is of another tree")
+    ap.add_argument("--walks-only", action="store_true",
+                    help="count only the fixed cost and the walks; print their table")
+    ap.add_argument("--provider", default=None, help="the provider library to load instead of the build's")
     args = ap.parse_args()
     build = os.path.abspath(args.build)
     sizes = [int(s) for s in args.sizes.split(",") if s]
@@ -487,6 +529,15 @@ def main():
     counted = not args.no_callgrind
 
     fc_runs, fc_wall, mixed_runs = {}, {}, {}
+    if args.walks_only:
+        for s in sizes:
+            print("run_bench: %d adapters under callgrind, walks only" % s, flush=True)
+            fc_runs[s] = run_driver(build, os.path.join(work, "fc-%d-walks" % s), describe("fc", s), True, 1,
+                                    walks_only=True, provider=args.provider)
+        print(walk_table(fc_runs))
+        if not args.work:
+            shutil.rmtree(work, ignore_errors=True)
+        return
     for s in sizes:
         desc = describe("fc", s)
         if counted:

@@ -4,13 +4,17 @@
 // request is counted on its own: the counters are zeroed before it and dumped
 // after it under the request's label. bench/run_bench.py drives it.
 //
-//   vexlan_bench --provider LIB --mof DIR [--repeat N] CLASS...
+//   vexlan_bench --provider LIB --mof DIR [--repeat N] [--walks-only] CLASS...
+//
+// --walks-only runs the start, GetInstance of the computer system (the fixed
+// cost of a request) and the associations from the system, the first FC port
+// and the first storage extent, and nothing else.
 //
 // The requests: the first one (the provider's start and its first build);
 // EnumerateInstanceNames, EnumerateInstances and GetInstance of the first and
 // last entry of every class given; associators and references (and their
-// names) from the computer system and from the first FC port (or Ethernet
-// port); then the process's resident memory.
+// names) from the computer system, from the first FC port (or Ethernet
+// port) and from the first storage extent; then the process's resident memory.
 #include <sys/resource.h>
 
 #include <algorithm>
@@ -45,6 +49,7 @@ struct Options {
     std::string provider;
     std::string mof;
     int repeat = 3;
+    bool walksOnly = false;
     std::vector<std::string> classes;
 };
 
@@ -142,7 +147,7 @@ void associationsFrom(const Options& opt, cimhost::Host& host, const std::string
 
 int usage()
 {
-    std::fprintf(stderr, "usage: vexlan_bench --provider LIB --mof DIR [--repeat N] CLASS...\n");
+    std::fprintf(stderr, "usage: vexlan_bench --provider LIB --mof DIR [--repeat N] [--walks-only] CLASS...\n");
     return 2;
 }
 
@@ -161,6 +166,8 @@ int main(int argc, char** argv)
                 opt.mof = v;
             else
                 opt.repeat = std::atoi(v.c_str());
+        } else if (a == "--walks-only") {
+            opt.walksOnly = true;
         } else if (!a.empty() && a[0] == '-') {
             return usage();
         } else {
@@ -192,7 +199,19 @@ int main(int argc, char** argv)
     printMemory("memory after start");
 
     cimhost::ObjectPath port;
-    for (const auto& cls : opt.classes) {
+    cimhost::ObjectPath extent;
+    if (opt.walksOnly) {
+        if (!systems.paths.empty()) {
+            const cimhost::ObjectPath cs = systems.paths.front();
+            measure(opt, "gi first " + system, "gi first", system, [&] { return host.getInstance(cs); });
+        }
+        for (const char* cls : {"Vexlan_FCHBA_FCPort", "Vexlan_FCHBA_StorageExtent"}) {
+            const cimhost::OpResult names = host.enumerateInstanceNames(classPath(cls));
+            if (names.ok() && !names.paths.empty())
+                (std::strcmp(cls, "Vexlan_FCHBA_FCPort") == 0 ? port : extent) = names.paths.front();
+        }
+    }
+    for (const auto& cls : opt.walksOnly ? std::vector<std::string>{} : opt.classes) {
         const cimhost::ObjectPath cp = classPath(cls);
         cimhost::OpResult names = measure(opt, "ein " + cls, "ein", cls, [&] { return host.enumerateInstanceNames(cp); });
         measure(opt, "ei " + cls, "ei", cls, [&] { return host.enumerateInstances(cp); });
@@ -204,12 +223,16 @@ int main(int argc, char** argv)
         measure(opt, "gi last " + cls, "gi last", cls, [&] { return host.getInstance(lastPath); });
         if (port.className.empty() && (cls == "Vexlan_FCHBA_FCPort" || cls == "Vexlan_NIC_EthernetPort2"))
             port = firstPath;
+        if (cls == "Vexlan_FCHBA_StorageExtent")
+            extent = firstPath;
     }
 
     if (!systems.paths.empty())
         associationsFrom(opt, host, "system", systems.paths.front());
     if (!port.className.empty())
         associationsFrom(opt, host, "port", port);
+    if (!extent.className.empty())
+        associationsFrom(opt, host, "extent", extent);
 
     printMemory("memory at end");
     return 0;

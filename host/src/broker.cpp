@@ -1062,6 +1062,10 @@ CMPISelectExp* eNewSelectExp(const CMPIBroker* mb, const char* query, const char
 CMPIBoolean eClassPathIsA(const CMPIBroker* mb, const CMPIObjectPath* op, const char* type, CMPIStatus* rc) {
     Host::Impl* core = coreOf(mb);
     EncPath* p = asPath(op);
+    if (core) {
+        std::lock_guard<std::mutex> g(core->counterLock);
+        core->counters.classPathIsACalls++;
+    }
     return guarded<CMPIBoolean>(rc, core && p, [&] {
         if (!type) return setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER), CMPIBoolean(0);
         return CMPIBoolean(core->repo.isA(p->p.className, type) ? 1 : 0);

@@ -18,6 +18,8 @@
 #include <vector>
 
 #include "associations/AssocRows.h"
+#include "provider/ClassTests.h"
+#include "provider/RequestLists.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
@@ -246,6 +248,7 @@ struct Request {
     const CmpiContext& ctx;
     CmpiResult& rslt;
     const CmpiObjectPath& path;
+    const PathClassTests& pathClasses;   // the class tests of `path`
     const char* assocParameter;   // resultClass of the reference operations, assocClass of the others
     const char* resultClass;
     const char* role;
@@ -280,7 +283,7 @@ CmpiStatus runChain(const Request& rq, const char* sConstCopStr, const char* cal
         if (row.hdr && g_SUPPORT_HDR == 0)
             continue;
         const bool sourceMatches =
-            testedByIsA(test.source) ? rq.path.classPathIsA(test.source) : strcasecmp(sConstCopStr, test.source) == 0;
+            testedByIsA(test.source) ? rq.pathClasses.isAFixed(test.source) : strcasecmp(sConstCopStr, test.source) == 0;
         if (!sourceMatches)
             continue;
         const char* alternative =
@@ -321,10 +324,10 @@ void returnDoneQuietly(CmpiResult& rslt) noexcept
 // The gate of the associator operations: true if some row of the lookup
 // table has the path's class (or a class it derives from) as its source, and
 // the asked association class when one is asked for.
-bool passesGate(const CmpiObjectPath& path, const char* assocClass)
+bool passesGate(const PathClassTests& path, const char* assocClass)
 {
     for (const AssocLookupRow& row : tables().lookup)
-        if (path.classPathIsA(row.sourceClass) &&
+        if (path.isAFixed(row.sourceClass) &&
             (assocClass == nullptr || strcasecmp(row.assocClass, assocClass) == 0))
             return true;
     return false;
@@ -336,8 +339,7 @@ bool passesGate(const CmpiObjectPath& path, const char* assocClass)
 bool classIsA(const CmpiObjectPath& path, const char* cls, const char* ancestor)
 {
     try {
-        const CmpiObjectPath probe(path.getNameSpace(), cls);
-        return probe.classPathIsA(ancestor);
+        return classtests::classIsA(path.getNameSpace().charPtr(), cls, ancestor);
     } catch (const CmpiStatus&) {
         return false;
     }
@@ -418,7 +420,7 @@ std::vector<const char*> derivedClassesAsked(const Request& rq)
     for (const AssocClassRow& row : kAssociations) {
         bool atSource = false;
         for (const char* source : row.sources)
-            atSource = atSource || (source != nullptr && rq.path.classPathIsA(source));
+            atSource = atSource || (source != nullptr && rq.pathClasses.isAFixed(source));
         if (atSource && classIsA(rq.path, row.assocClass, rq.assocParameter))
             classes.push_back(row.assocClass);
     }
@@ -434,6 +436,7 @@ CmpiStatus dispatch(const Request& rq)
     bool gateClosed = false;
     {
         ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+        const RequestScope request;
         if (rq.op == Op::Associators)
             DISPATCH_DEBUG("Vexlan_CNA_Provider::associators entered");
         try {
@@ -466,7 +469,7 @@ CmpiStatus dispatch(const Request& rq)
                     last = runRounds(one);
                 }
                 rq.rslt.returnDone();
-            } else if (associatorOp && !passesGate(rq.path, rq.assocParameter)) {
+            } else if (associatorOp && !passesGate(rq.pathClasses, rq.assocParameter)) {
                 rq.rslt.returnDone();
                 gateClosedFor = className;   // logged once the lock is given back
                 gateClosed = true;
@@ -512,24 +515,28 @@ CmpiStatus Vexlan_CNA_Provider::associators(const CmpiContext& ctx, CmpiResult& 
                                             const char* assocClass, const char* resultClass, const char* role,
                                             const char* resultRole, const char** properties)
 {
-    return dispatch({Op::Associators, ctx, rslt, op, assocClass, resultClass, role, resultRole, properties});
+    const PathClassTests classes(op);
+    return dispatch({Op::Associators, ctx, rslt, op, classes, assocClass, resultClass, role, resultRole, properties});
 }
 
 CmpiStatus Vexlan_CNA_Provider::associatorNames(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
                                                 const char* assocClass, const char* resultClass, const char* role,
                                                 const char* resultRole)
 {
-    return dispatch({Op::AssociatorNames, ctx, rslt, op, assocClass, resultClass, role, resultRole, nullptr});
+    const PathClassTests classes(op);
+    return dispatch({Op::AssociatorNames, ctx, rslt, op, classes, assocClass, resultClass, role, resultRole, nullptr});
 }
 
 CmpiStatus Vexlan_CNA_Provider::references(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
                                            const char* resultClass, const char* role, const char** properties)
 {
-    return dispatch({Op::References, ctx, rslt, op, resultClass, nullptr, role, nullptr, properties});
+    const PathClassTests classes(op);
+    return dispatch({Op::References, ctx, rslt, op, classes, resultClass, nullptr, role, nullptr, properties});
 }
 
 CmpiStatus Vexlan_CNA_Provider::referenceNames(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
                                                const char* resultClass, const char* role)
 {
-    return dispatch({Op::ReferenceNames, ctx, rslt, op, resultClass, nullptr, role, nullptr, nullptr});
+    const PathClassTests classes(op);
+    return dispatch({Op::ReferenceNames, ctx, rslt, op, classes, resultClass, nullptr, role, nullptr, nullptr});
 }

@@ -7,6 +7,8 @@
 #include <cstdint>
 #include <cstring>
 
+#include "provider/ClassTests.h"
+#include "provider/RequestLists.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 namespace {
@@ -56,16 +58,16 @@ void exitingLine(const AssocRow& row, const std::string& op)
 // CIM classes it derives from.
 bool isRole1(const AssocRow& row, const CmpiObjectPath& path)
 {
-    if (path.classPathIsA(row.end1.cls->className))
+    if (classtests::isAFixed(path, row.end1.cls->className))
         return true;
     if (filtering(row) || std::strcmp(row.end1.cls->className, "Vexlan_Adapter_ComputerSystem") != 0)
         return false;
-    return path.classPathIsA("CIM_System") || path.classPathIsA("CIM_ComputerSystem");
+    return classtests::isAFixed(path, "CIM_System") || classtests::isAFixed(path, "CIM_ComputerSystem");
 }
 
 bool isRole2(const AssocRow& row, const CmpiObjectPath& path)
 {
-    return path.classPathIsA(row.end2.cls->className);
+    return classtests::isAFixed(path, row.end2.cls->className);
 }
 
 // A source of neither end: the class name goes into the thrown status. A row
@@ -128,7 +130,7 @@ CmpiStatus traverse(const AssocRow& row, const std::string& op, CmpiResult& rslt
         return CmpiStatus(CMPI_RC_OK);
     for (int sourceRole = 1; sourceRole <= 2; ++sourceRole) {
         const bool role1 = sourceRole == 1;
-        if (!(role1 ? path.classPathIsA(row.end1.cls->className) : isRole2(row, path)))
+        if (!(role1 ? classtests::isAFixed(path, row.end1.cls->className) : isRole2(row, path)))
             continue;
         const AssocEnd& own = role1 ? row.end1 : row.end2;
         const AssocEnd& other = role1 ? row.end2 : row.end1;
@@ -195,8 +197,7 @@ bool MatchResultClass(const char* resultClass, const char* nameSpace, const char
 {
     if (resultClass == nullptr || resultClass[0] == '\0')
         return true;
-    CmpiObjectPath path(nameSpace, className);
-    return path.classPathIsA(resultClass);
+    return classtests::classIsA(nameSpace, className, resultClass);
 }
 
 bool MatchResultClass(const char* resultClass, const CmpiString& nameSpace, const char* className)
@@ -501,14 +502,14 @@ void assocBuild(const AssocRow& row)
 {
     if (row.form != AssocForm::Plain)
         return;
-    row.end1.cls->list.build();
-    row.end2.cls->list.build();
+    requestlists::build(row.end1.cls->list);
+    requestlists::build(row.end2.cls->list);
 }
 
 void assocRemove(const AssocRow& row)
 {
     if (row.form != AssocForm::Plain)
         return;
-    row.end1.cls->list.remove();
-    row.end2.cls->list.remove();
+    requestlists::remove(row.end1.cls->list);
+    requestlists::remove(row.end2.cls->list);
 }

@@ -12,6 +12,8 @@
 
 #include "indications/Vexlan_Adapter_JobIndications.h"
 #include "inventory/AdapterFunc.h"
+#include "provider/ClassTests.h"
+#include "provider/RequestLists.h"
 #include "provider/Vexlan_CNA_Provider_Tables.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "update/FlashUpdate.h"
@@ -82,16 +84,17 @@ void walkRoutes(const CmpiObjectPath& cop, Call&& call)
     std::size_t count = 0;
     const InstanceRoute* routes = instanceRoutes(count);
     const RouteGroup groups[] = {RouteGroup::Always, RouteGroup::SupportHdr, RouteGroup::Nic};
+    const PathClassTests classes(cop);
     for (RouteGroup group : groups) {
         if (group == RouteGroup::SupportHdr && g_SUPPORT_HDR == 0)
             continue;
         for (std::size_t i = 0; i < count; ++i) {
             const InstanceRoute& route = routes[i];
-            if (route.group != group || !cop.classPathIsA(route.className))
+            if (route.group != group || !classes.isAFixed(route.className))
                 continue;
             if (route.rebuild != nullptr) {
-                route.rebuild->remove();
-                route.rebuild->build();
+                requestlists::remove(*route.rebuild);
+                requestlists::build(*route.rebuild);
             }
             call(route.ops);
             break;
@@ -122,6 +125,7 @@ CmpiStatus dispatchInstanceRequest(const char* name, CmpiResult& rslt, const Cmp
 {
     {
         ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+        const RequestScope request;
         try {
             CMPIStatus rc;
             const char* className = classNameText(cop, rc);
@@ -297,6 +301,7 @@ void Vexlan_CNA_Provider::cleanupAgent()
     }
     ZORAP_UnRegisterAlarmNotificationCallback(kPollingSteps.alarmCallback);
     ZORAP_Uninitialize();
+    classtests::forget();
 }
 
 // ---- Instance requests -------------------------------------------------------------
@@ -389,8 +394,9 @@ CmpiStatus Vexlan_CNA_Provider::invokeMethod(const CmpiContext& ctx, CmpiResult&
             MethodContextScope(Vexlan_CNA_Provider& p, const CmpiContext& c) : provider(p) { p.methodContext = &c; }
             ~MethodContextScope() { provider.methodContext = nullptr; }
         } scope(*this, ctx);
+        const PathClassTests classes(ref);
         for (std::size_t i = 0; i < count; ++i) {
-            if (ref.classPathIsA(routes[i].className)) {
+            if (classes.isAFixed(routes[i].className)) {
                 routes[i].invokeMethod(ctx, rslt, ref, methodName, in, out);
                 break;
             }

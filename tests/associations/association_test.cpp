@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <fstream>
+#include <functional>
 #include <map>
 #include <set>
 #include <sstream>
@@ -623,6 +624,53 @@ TEST_F(Associations, RemoteServiceAccessPointsJoinAsDescribed)
     const OpResult own = host().associatorNames(endpoint, assoc("Vexlan_NIC_RemoteServiceAccessPointIPProtocolEndpoint"));
     ASSERT_EQ(own.paths.size(), 1u);
     EXPECT_EQ(own.paths[0].key("Name")->s, mac);
+}
+
+// Once the provider has seen a class, its dispatch class tests (routes, gate,
+// chain, rounds, the modules' role tests, a parent class asked for) need no
+// broker call: a repeated request makes no classPathIsA call.
+TEST_F(Associations, ARequestSeenBeforeAsksTheBrokerNoClassTest)
+{
+    const ObjectPath cs = firstOf(host(), "Vexlan_Adapter_ComputerSystem");
+    const ObjectPath port = firstOf(host(), "Vexlan_FCHBA_FCPort");
+    AssocParams parent;
+    parent.resultClass = "CIM_SystemDevice";
+    const std::vector<std::pair<std::string, std::function<OpResult()>>> requests = {
+        {"getInstance of the system", [&] { return host().getInstance(cs); }},
+        {"associatorNames of a port", [&] { return host().associatorNames(port); }},
+        {"references of the system", [&] { return host().references(cs); }},
+        {"one call without a class", [&] { return host().associatorNamesAsCalled(port, {}); }},
+        {"one call with a parent class", [&] { return host().referenceNamesAsCalled(port, parent); }},
+        {"a method", [&] { return host().invokeMethod(classPath("Vexlan_FCHBA_FCPort"), "NoSuchMethod", {}); }},
+    };
+    for (const auto& [what, request] : requests) {
+        const OpResult first = request();
+        const int before = host().counters().classPathIsACalls;
+        const OpResult again = request();
+        EXPECT_EQ(host().counters().classPathIsACalls, before) << what;
+        EXPECT_EQ(identities(again.paths), identities(first.paths)) << what;
+        EXPECT_EQ(again.instances.size(), first.instances.size()) << what;
+    }
+}
+
+// One request rebuilds each list at most once, however many of its rounds
+// and modules ask for the rebuild: the FC port list is built once (one port
+// property read per FC function) for a call that runs every row of a port.
+TEST_F(Associations, OneRequestRebuildsAListOnce)
+{
+    const size_t ports = host().enumerateInstanceNames(classPath("Vexlan_FCHBA_FCPort")).paths.size();
+    ASSERT_GT(ports, 1u);
+    const ObjectPath port = firstOf(host(), "Vexlan_FCHBA_FCPort");
+    zorap_sim_reset();
+    const OpResult all = host().associatorNamesAsCalled(port, {});
+    expectClean(all, "every row of a port");
+    EXPECT_EQ(zorap_sim_call_count(ZORAP_FN_GetHbaDevicePortProperty), ports);
+    EXPECT_TRUE(std::count_if(all.paths.begin(), all.paths.end(),
+                              [](const ObjectPath& p) { return p.className == "Vexlan_FCHBA_FCPortStatistics"; }));
+    // The next request builds it again: it sees data no older than itself.
+    zorap_sim_reset();
+    expectClean(host().associatorNamesAsCalled(port, {}), "again");
+    EXPECT_EQ(zorap_sim_call_count(ZORAP_FN_GetHbaDevicePortProperty), ports);
 }
 
 }  // namespace

@@ -120,9 +120,12 @@ TEST_F(Lifecycle, SfcbIdleUnloadsEndEveryLifeAfterRequestsToManyClasses)
     prepareHost(host, cimhost::Flavour::Sfcb);
     const int threadsBefore = threadCount();
     for (int life = 1; life <= 2; ++life) {
+        const int classTestsBefore = host.counters().classPathIsACalls;
         for (const char* cls : {"Vexlan_Adapter_ComputerSystem", "Vexlan_FCHBA_FCPort", "Vexlan_FCHBA_PortController",
                                 "Vexlan_Adapter_PhysicalPackage", "Vexlan_NIC_EthernetPort2"})
             ASSERT_TRUE(host.enumerateInstanceNames(classPath(cls)).ok()) << cls;
+        // Each life asks the broker its class tests afresh.
+        EXPECT_GT(host.counters().classPathIsACalls, classTestsBefore) << "life " << life;
         ASSERT_TRUE(host.associatorNames(hostPath(Value::fromString("x"))).ok());
         EXPECT_EQ(host.invokeMethod(classPath("Vexlan_FCHBA_FCPort"), "NoSuchMethod", {}).rc, 0);
         EXPECT_GE(host.counters().factoryCalls[0], 5 * life);

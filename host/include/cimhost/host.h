@@ -98,6 +98,7 @@ struct Counters {
     int indicationsDelivered = 0;
     int indicationsDropped = 0;
     int indicationsFromUnattachedThreads = 0;   // deliverIndication on a thread the host does not know
+    int classPathIsACalls = 0;   // the broker's classPathIsA, every call
     std::vector<std::string> events;   // "activateFilter first=1", "enableIndications", ...
 };
 
