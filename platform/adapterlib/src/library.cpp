@@ -31,17 +31,16 @@
 #include <condition_variable>
 #include <cstdio>
 #include <cstring>
-#include <fstream>
 #include <list>
 #include <map>
 #include <mutex>
 #include <new>
 #include <set>
-#include <sstream>
 #include <thread>
 #include <unordered_map>
 #include <unordered_set>
 
+#include "bounded_file.h"
 #include "encode.h"
 #include "livestate.h"
 #include "model.h"
@@ -85,8 +84,11 @@ constexpr const char* kFunctionNames[ZORAP_FN_COUNT] = {
 // that still walks one (the alarm thread of a caller may, without a lock).
 constexpr size_t kRetiredTrees = 2;
 
-// A description file larger than this is refused unread.
-constexpr off_t kMaxDescriptionBytes = 16 * 1024 * 1024;
+// A description file larger than this is refused (the largest host the
+// benchmark generates, 1,024 adapters, takes about 6 MB).
+constexpr size_t kMaxDescriptionBytes = 16 * 1024 * 1024;
+// A flash image larger than this is refused (images are a few MB).
+constexpr size_t kMaxFlashImageBytes = 64 * 1024 * 1024;
 
 // How long shutdown waits for a running alarm callback.
 constexpr int kCallbackGraceMs = 2000;
@@ -170,20 +172,15 @@ Loaded readSource(const Source& src) {
         out.path = src.kind == Source::File ? src.path : defaultPath();
         out.stamp = stampOf(out.path);
         what = "adapter description " + out.path;
-        if (out.stamp.exists && out.stamp.size > kMaxDescriptionBytes) {
-            complain(what + ": larger than 16 MiB; no adapters");
+        // Opened without blocking and taken only as a regular file within the
+        // bound: a FIFO, a device, a directory or a huge file gives no adapters.
+        bounded_file::Result read = bounded_file::readRegular(out.path.c_str(), kMaxDescriptionBytes);
+        if (read.outcome != bounded_file::Outcome::Taken) {
+            complain(what + ": " + read.reason + "; no adapters");
             out.host.osName = defaultOsName();
             return out;
         }
-        std::ifstream in(out.path, std::ios::binary);
-        if (!in) {
-            complain(what + ": cannot be read (" + std::strerror(errno) + "); no adapters");
-            out.host.osName = defaultOsName();
-            return out;
-        }
-        std::ostringstream ss;
-        ss << in.rdbuf();
-        text = ss.str();
+        text = std::move(read.text);
     }
     try {
         out.host = parseDescription(text);
@@ -622,10 +619,14 @@ public:
         const char* name = reinterpret_cast<const char*>(image);
         const size_t n = strnlen(name, kMaxImageName);
         std::string text(name, n);
-        struct stat st {};
-        const long long bytes = n < kMaxImageName && ::stat(text.c_str(), &st) == 0 && S_ISREG(st.st_mode)
-                                    ? static_cast<long long>(st.st_size)
-                                    : -1;
+        long long bytes = -1;
+        if (n < kMaxImageName) {
+            const bounded_file::Result file = bounded_file::checkRegular(text.c_str(), kMaxFlashImageBytes);
+            if (file.outcome == bounded_file::Outcome::Taken)
+                bytes = static_cast<long long>(file.size);
+            else if (file.outcome == bounded_file::Outcome::Refused)
+                complain("flash image " + text + ": " + file.reason);
+        }
         std::lock_guard<std::mutex> l(flashMu);
         flashImageSeen = true;
         lastFlashImage = std::move(text);
@@ -1380,6 +1381,11 @@ __attribute__((destructor)) static void zorap_sim_unload() {
         // Blocks still handed out are the caller's leak; the set that knew
         // them goes, so that a leak checker sees them.
         zorap_sim::releaseAll(L.allocations);
+        std::lock_guard<std::mutex> f(L.flashMu);
+        L.flashImageSeen = false;
+        zorap_sim::releaseAll(L.lastFlashImage);
+        L.lastFlashBytes = -1;
+        zorap_sim::sysfs::forgetRefusals();
     } catch (...) {
     }
 }
