@@ -123,6 +123,39 @@ FileStamp stampOf(const std::string& path) {
     return s;
 }
 
+// The last complaint about a description file, with the state of the file it
+// was about: the file is read again by the look that noticed the change and
+// by the backup build after it, and one line is enough for one state of the
+// file. Static storage, never destroyed; emptied at unload.
+struct LastComplaint {
+    std::mutex mu;
+    std::string text;
+};
+
+LastComplaint& lastComplaint() {
+    alignas(LastComplaint) static unsigned char storage[sizeof(LastComplaint)];
+    static LastComplaint* instance = new (storage) LastComplaint();
+    return *instance;
+}
+
+void complainOnce(const std::string& message, const FileStamp& stamp) {
+    const std::string key = message + '\n' + std::to_string(stamp.dev) + ':' + std::to_string(stamp.ino) + ':' +
+                            std::to_string(stamp.size) + ':' + std::to_string(stamp.mtimeNs);
+    {
+        LastComplaint& last = lastComplaint();
+        std::lock_guard<std::mutex> l(last.mu);
+        if (last.text == key) return;
+        last.text = key;
+    }
+    complain(message);
+}
+
+void forgetComplaints() {
+    LastComplaint& last = lastComplaint();
+    std::lock_guard<std::mutex> l(last.mu);
+    std::string().swap(last.text);
+}
+
 struct Source {
     enum Kind { Default, File, Text } kind = Default;
     std::string path;  // File
@@ -176,11 +209,12 @@ Loaded readSource(const Source& src) {
         // bound: a FIFO, a device, a directory or a huge file gives no adapters.
         bounded_file::Result read = bounded_file::readRegular(out.path.c_str(), kMaxDescriptionBytes);
         if (read.outcome != bounded_file::Outcome::Taken) {
-            complain(what + ": " + read.reason + "; no adapters");
+            complainOnce(what + ": " + read.reason + "; no adapters", out.stamp);
             out.host.osName = defaultOsName();
             return out;
         }
         text = std::move(read.text);
+        forgetComplaints();  // a later refusal is news again
     }
     try {
         out.host = parseDescription(text);
@@ -1386,6 +1420,7 @@ __attribute__((destructor)) static void zorap_sim_unload() {
         zorap_sim::releaseAll(L.lastFlashImage);
         L.lastFlashBytes = -1;
         zorap_sim::sysfs::forgetRefusals();
+        zorap_sim::forgetComplaints();
     } catch (...) {
     }
 }
