@@ -328,11 +328,20 @@ class Soak:
                                     stdout=listener_out, stderr=subprocess.DEVNULL)
         threads = []
         try:
+            # The provider is loaded first, by one request, before the
+            # subscriptions and the clients come at once.
+            self.wbemcli("ein", "%s/%s:Vexlan_Adapter_ComputerSystem" % (self.url, self.a.namespace))
+            time.sleep(self.a.warm_up)
             self.teardown_indications()
             self.setup_indications()
             self.sample()
+            # The subscriptions first, the load after them.
+            subscriptions = threading.Thread(target=self.subscriptions_loop, daemon=True)
+            subscriptions.start()
+            threads.append(subscriptions)
+            time.sleep(self.a.warm_up)
             workers = [threading.Thread(target=self.client, args=(i,), daemon=True) for i in range(self.a.clients)]
-            workers += [threading.Thread(target=t, daemon=True) for t in (self.jobs_loop, self.subscriptions_loop)]
+            workers += [threading.Thread(target=self.jobs_loop, daemon=True)]
             workers.append(threading.Thread(target=self.description_loop, args=(original,), daemon=True))
             for t in workers:
                 t.start()
@@ -413,6 +422,8 @@ def main():
     ap.add_argument("--job-pause", type=float, default=10.0, help="seconds between jobs (10)")
     ap.add_argument("--subscribed-for", type=float, default=120.0)
     ap.add_argument("--unsubscribed-for", type=float, default=30.0)
+    ap.add_argument("--warm-up", type=float, default=5.0,
+                    help="seconds between the first request and the rest (5; 0 brings everything at once)")
     ap.add_argument("--work", default=None, help="directory for the image and the listener's output")
     a = ap.parse_args()
     if not a.description:
