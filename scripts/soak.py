@@ -37,6 +37,7 @@ import json
 import os
 import random
 import re
+import signal
 import subprocess
 import sys
 import tempfile
@@ -430,6 +431,8 @@ def main():
         a.description = os.path.join(a.prefix, "lib", "zorap_sim_adapters.json")
     if not a.work:
         a.work = tempfile.mkdtemp(prefix="vexlan-soak-", dir="/tmp")
+    # A SIGTERM ends the run like its end: the description is put back.
+    signal.signal(signal.SIGTERM, lambda *_: sys.exit(143))
     Soak(a).run()
 
 

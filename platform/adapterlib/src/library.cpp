@@ -824,6 +824,7 @@ ZORAP_EXPORT ZORAP_STATUS ZORAP_Uninitialize(void) {
         L.initialized = false;
         L.modelLoaded = false;
         L.configChanged = false;
+        zorap_sim::sysfs::forgetRefusals();  // a new start reports its refusals again
         L.trace("uninitialized");
         return ZORAP_OK;
     });
