@@ -5,7 +5,9 @@
 
 #include <gtest/gtest.h>
 
+#include <sys/socket.h>
 #include <sys/stat.h>
+#include <sys/un.h>
 #include <unistd.h>
 
 #include <string>
@@ -295,6 +297,16 @@ TEST_F(SettingsTest, ASettingsFileThatIsNoRegularFileLeavesTheDefaults) {
          "a directory, not a regular file"},
         {"over 1 MiB", [](std::string const& p, std::string const& big) { writeFile(p, big); },
          "larger than 1048576 bytes"},
+        {"socket",  // open() fails (ENXIO): the entry's kind is still named
+         [](std::string const& p, std::string const&) {
+             sockaddr_un address{};
+             address.sun_family = AF_UNIX;
+             std::snprintf(address.sun_path, sizeof address.sun_path, "%s", p.c_str());
+             int const fd = socket(AF_UNIX, SOCK_STREAM, 0);
+             (void)!bind(fd, reinterpret_cast<sockaddr const*>(&address), sizeof address);
+             close(fd);
+         },
+         "a socket, not a regular file"},
     };
     for (Row const& row : rows) {
         SCOPED_TRACE(row.what);
