@@ -14,6 +14,7 @@
 #include "classes/Vexlan_FC_PortController_CMPI.h"
 #include "inventory/AdapterFunc.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "support/ProviderFiles.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "support/ossimpl.h"
 #include "update/InstallHelpers.h"
@@ -270,7 +271,8 @@ CmpiStatus invokeMethod_SoftwareInstallationService(const CmpiContext&, CmpiResu
         if (uriText == nullptr)
             fail(false, CMPI_RC_ERR_INVALID_PARAMETER, "URI argument is NULL!");
         char fileName[kFlashFileNameSize];
-        if (!FlashFileNameOfURI(uriText, fileName) || !fileExists(fileName))
+        // Only a regular image file within its bound counts as there.
+        if (!FlashFileNameOfURI(uriText, fileName) || !fileExists(fileName) || !FlashImageUsable(fileName))
             fail(false, CMPI_RC_ERR_INVALID_PARAMETER, "Invalid or unsupported URI!");
 
         int index = -1;

@@ -17,6 +17,7 @@
 #include "classes/Vexlan_FCHBA_SoftwareInstallationService_CMPI.h"
 #include "inventory/AdapterFunc.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "support/ProviderFiles.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "support/Vexlan_NIC_Utils.h"
 #include "update/InstallHelpers.h"
@@ -194,7 +195,9 @@ unsigned int installFromURI(const CmpiObjectPath& ref, const CmpiArgs& in, CmpiA
         NIC_DEBUG("Vexlan_NIC_SoftwareInstallationService: Detected the leading 'file://' tag.  After removing the "
                   "tag, flashFileName=%s",
                   fileName);
-    if (!fileExists(fileName))
+    // Only a regular image file within its bound is handed on (a FIFO or a
+    // device would stall the write); anything else counts as not there.
+    if (!fileExists(fileName) || !FlashImageUsable(fileName))
         raiseLogged(CMPI_RC_ERR_INVALID_PARAMETER, "Invalid or unsupported URI!");
     NIC_DEBUG("Vexlan_NIC_SoftwareInstallationService: URI=%s.  File exists.", uriText);
     NIC_DEBUG("Vexlan_NIC_SoftwareInstallationService: flashFileName = %s", fileName);

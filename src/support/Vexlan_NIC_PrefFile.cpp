@@ -12,6 +12,7 @@
 #include <string>
 #include <vector>
 
+#include "support/ProviderFiles.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 const unsigned char kPrefFileName[] = "vxln_cna_provider.config";
@@ -49,18 +50,20 @@ void refusedLine(const char* path)
                path);
 }
 
-// The file at `path`, opened for reading and writing without following a
-// link; null when it is missing or not the provider's own private file.
+// The file at `path`, opened for reading and writing without following a link
+// and without blocking; null when it is missing, not a regular file, larger
+// than kJobFileMax or not the provider's own private file.
 FILE* openOwnFile(const char* path)
 {
-    const int fd = open(path, O_RDWR | O_NOFOLLOW | O_CLOEXEC | O_NOCTTY);
+    bounded_file::Result result;
+    struct stat st {};
+    const int fd = bounded_file::openRegular(path, O_RDWR | O_NOFOLLOW, kJobFileMax, result, &st);
     if (fd < 0) {
-        if (errno == ELOOP)
-            refusedLine(path);
+        if (result.outcome == bounded_file::Outcome::Refused)
+            ReportRefusedFile("preference file", path, result.reason);
         return nullptr;
     }
-    struct stat st {};
-    if (fstat(fd, &st) != 0 || !isOwnPrivateFile(st)) {
+    if (!isOwnPrivateFile(st)) {
         refusedLine(path);
         close(fd);
         return nullptr;

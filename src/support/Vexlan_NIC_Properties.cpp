@@ -3,14 +3,20 @@
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "support/Vexlan_NIC_Utils.h"
 
+#include <cctype>
+#include <cerrno>
+#include <climits>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <fstream>
 #include <iostream>
 #include <mutex>
 #include <new>
+#include <sstream>
+#include <string>
 #include <strings.h>
+
+#include "support/ProviderFiles.h"
 
 bool g_EnableZORAPLog = false;
 #define VEXLAN_DEFAULT_INTEROP_NAMESPACE "root/PG_InterOp"
@@ -61,8 +67,11 @@ void LoadProviderProperties() {
     char path[256];
     std::snprintf(path, sizeof path, VEXLAN_PROPERTIES_DIRECTORY_FORMAT, VEXLAN_PROPERTIES_FILE_NAME);
 
-    std::ifstream file(path);
-    if (file.is_open()) {
+    // Opened without blocking and read whole within its bound; a FIFO, a
+    // device, a directory or a huge file is refused and the defaults stand.
+    bounded_file::Result read = ReadProviderFile("settings file", path, kSettingsFileMax);
+    if (read.outcome == bounded_file::Outcome::Taken) {
+        std::istringstream file(read.text);
         long errorLog = 0;
         long debugLog = 0;
         long zorapLog = 0;
@@ -166,6 +175,50 @@ bool switchValue(char const* value) {
     return strcasecmp(value, "true") == 0 || std::strtol(value, nullptr, 10) != 0;
 }
 
+// The next word of `text` from `at`, as fscanf's "%255s" takes it: white
+// space skipped, then at most 255 other bytes (the rest of a longer word is
+// the next word); the word ends at an embedded NUL. False at the end.
+bool nextWord(std::string const& text, std::size_t& at, char (&word)[256]) {
+    while (at < text.size() && std::isspace(static_cast<unsigned char>(text[at]))) ++at;
+    if (at >= text.size()) return false;
+    std::size_t length = 0;
+    while (at < text.size() && length < 255 && !std::isspace(static_cast<unsigned char>(text[at])))
+        word[length++] = text[at++];
+    word[length] = '\0';
+    return true;
+}
+
+// The poll interval as strtol reads it into the int field: no bound, a word
+// that is no number gives 0, a value beyond an int wraps as the conversion
+// does. A value that makes polling run at once every round (or every other
+// round) is said in the log, with what it was read as.
+int pollInterval(char const* value) {
+    errno = 0;
+    char* end = nullptr;
+    const long read = std::strtol(value, &end, 10);
+    const bool overflow = errno == ERANGE || read < INT_MIN || read > INT_MAX;
+    const int interval = static_cast<int>(static_cast<unsigned int>(static_cast<unsigned long>(read)));
+    char const* what = nullptr;
+    if (end == value)
+        what = "no number";
+    else if (overflow)
+        what = "beyond the range of an int";
+    else if (interval < 0)
+        what = "negative";
+    else if (interval == 0)
+        what = "zero";
+    if (what == nullptr) return interval;
+    // The loop polls when more seconds than the interval have passed.
+    char period[48];
+    if (interval < 0)
+        std::snprintf(period, sizeof period, "every second");
+    else
+        std::snprintf(period, sizeof period, "about every %lld seconds", static_cast<long long>(interval) + 2);
+    ReportProviderNotice("Config: LinkStatusPollIntervalSeconds=%.64s is %s, read as %d: a poll %s.", value, what,
+                         interval, period);
+    return interval;
+}
+
 }  // namespace
 
 void Vexlan_NIC_Properties::reload() {
@@ -173,11 +226,12 @@ void Vexlan_NIC_Properties::reload() {
     if (getPropertyFilePath(name, sizeof name) == 0) return;
     std::cerr << "Vexlan_NIC_Properties::reload, properties file name: " << name << std::endl;
 
-    FILE* file = std::fopen(name, "r");
-    if (file == nullptr) return;
+    bounded_file::Result read = ReadProviderFile("settings file", name, kSettingsFileMax);
+    if (read.outcome != bounded_file::Outcome::Taken) return;
 
     char word[256];
-    while (std::fscanf(file, "%255s", word) == 1) {
+    std::size_t at = 0;
+    while (nextWord(read.text, at, word)) {
         char const* start = word;
         while (*start == ' ' || *start == '\t') ++start;
         if (*start == '#') continue;  // only this word: the rest of a comment line is read on
@@ -192,7 +246,7 @@ void Vexlan_NIC_Properties::reload() {
             case NicKey::ErrorLog: errorLog = switchValue(value); break;
             case NicKey::DebugLog: debugLog = switchValue(value); break;
             case NicKey::LinkStatusPollIntervalSeconds:
-                linkStatusPollIntervalSeconds = static_cast<int>(std::strtol(value, nullptr, 10));
+                linkStatusPollIntervalSeconds = pollInterval(value);
                 break;
             case NicKey::InteropNamespace:
                 std::strncpy(interopNamespace, value, 255);
@@ -202,5 +256,4 @@ void Vexlan_NIC_Properties::reload() {
             break;
         }
     }
-    std::fclose(file);
 }

@@ -1,9 +1,11 @@
 #include "support/ossimpl.h"
 
+#include "support/ProviderFiles.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <csignal>
 #include <cstdio>
@@ -18,16 +20,20 @@ void* CoreZMalloc(std::size_t size) { return std::calloc(1, size); }
 void CoreFree(void* block) { std::free(block); }
 
 void GetLinuxDistributionType() {
-    FILE* file = std::fopen("/etc/SuSE-release", "rt");
-    if (file == nullptr) file = std::fopen("/etc/redhat-release", "rt");
-    if (file == nullptr) return;
+    // The release files are opened without blocking and read only as regular
+    // files of a few kB (a FIFO in their place would hold the load).
+    constexpr std::size_t kReleaseFileMax = 64 * 1024;
+    bounded_file::Result read = ReadProviderFile("release file", "/etc/SuSE-release", kReleaseFileMax);
+    if (read.outcome != bounded_file::Outcome::Taken)
+        read = ReadProviderFile("release file", "/etc/redhat-release", kReleaseFileMax);
+    if (read.outcome != bounded_file::Outcome::Taken || read.text.empty()) return;
 
+    // The first line, at most 126 characters of it, as fgets gives it.
     char line[127];
-    if (std::fgets(line, sizeof line, file) != nullptr) {
-        line[std::strcspn(line, "\n(")] = '\0';
-        std::snprintf(g_hostSystemType, sizeof g_hostSystemType, "Linux - %s", line);
-    }
-    std::fclose(file);
+    std::snprintf(line, sizeof line, "%.*s", static_cast<int>(std::min<std::size_t>(read.text.size(), 126)),
+                  read.text.c_str());
+    line[std::strcspn(line, "\n(")] = '\0';
+    std::snprintf(g_hostSystemType, sizeof g_hostSystemType, "Linux - %s", line);
 }
 
 int OSSInitCriticalSection() {

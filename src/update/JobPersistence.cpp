@@ -1,10 +1,14 @@
 // The job map to and from the job file "vxln_cna_provider.config".
 #include "update/JobPersistence.h"
 
+#include <fcntl.h>
+#include <unistd.h>
+
 #include <cstdio>
 #include <cstring>
 
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "support/ProviderFiles.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "support/Vexlan_NIC_PrefFile.h"
 #include "support/Vexlan_NIC_Utils.h"
@@ -163,10 +167,21 @@ unsigned long long GetDataFromFile(const char* path, unsigned long long size, un
 {
     if (path == nullptr || buffer == nullptr)
         return 0;
-    FILE* file = std::fopen(path, "rb");
-    if (file == nullptr)
+    // Opened without blocking, only as a regular flash image within its bound.
+    bounded_file::Result result;
+    const int fd = bounded_file::openRegular(path, O_RDONLY, kFlashImageMax, result);
+    if (fd < 0) {
+        if (result.outcome == bounded_file::Outcome::Refused)
+            ReportRefusedFile("flash image", path, result.reason);
         return 0;
-    const std::size_t got = std::fread(buffer, 1, static_cast<std::size_t>(size), file);
-    std::fclose(file);
+    }
+    unsigned long long got = 0;
+    while (got < size) {
+        const long n = bounded_file::readSome(fd, buffer + got, static_cast<std::size_t>(size - got));
+        if (n <= 0)
+            break;
+        got += static_cast<unsigned long long>(n);
+    }
+    close(fd);
     return got == size ? got : 0;
 }

@@ -1,6 +1,7 @@
 #include "provider_env.h"
 
 #include <dirent.h>
+#include <fcntl.h>
 #include <netdb.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -31,6 +32,82 @@ void writeSettings(const std::string& optSettings, const std::string& cwdSetting
         writeFile("/opt/Vexlan_Corporation/CNAProviders/vexlancna.properties", optSettings);
     if (!cwdSettings.empty())
         writeFile("vexlancna.properties", cwdSettings);
+}
+
+const Planted kPlantedKinds[4] = {Planted::Fifo, Planted::DevZeroLink, Planted::Directory, Planted::Oversize};
+
+void plant(Planted kind, const std::string& path, std::size_t oversizeBytes)
+{
+    if (std::remove(path.c_str()) != 0)
+        rmdir(path.c_str());
+    switch (kind) {
+    case Planted::Fifo:
+        ASSERT_EQ(mkfifo(path.c_str(), 0600), 0) << path;
+        break;
+    case Planted::DevZeroLink:
+        ASSERT_EQ(symlink("/dev/zero", path.c_str()), 0) << path;
+        break;
+    case Planted::Directory:
+        ASSERT_EQ(mkdir(path.c_str(), 0700), 0) << path;
+        break;
+    case Planted::Oversize: {
+        const int fd = open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0600);
+        ASSERT_GE(fd, 0) << path;
+        EXPECT_EQ(ftruncate(fd, static_cast<off_t>(oversizeBytes)), 0);
+        close(fd);
+        break;
+    }
+    }
+}
+
+std::string plantedReason(Planted kind, std::size_t bound)
+{
+    switch (kind) {
+    case Planted::Fifo:
+        return "a FIFO, not a regular file";
+    case Planted::DevZeroLink:
+        return "a character device, not a regular file";
+    case Planted::Directory:
+        return "a directory, not a regular file";
+    case Planted::Oversize:
+        return "larger than " + std::to_string(bound) + " bytes";
+    }
+    return "";
+}
+
+const char* plantedName(Planted kind)
+{
+    static const char* const names[] = {"FIFO", "/dev/zero link", "directory", "over-size file"};
+    return names[static_cast<int>(kind)];
+}
+
+StderrCapture::StderrCapture() : saved_(dup(2))
+{
+    char name[] = "/var/tmp/stderr.XXXXXX";
+    const int fd = mkstemp(name);
+    path_ = name;
+    std::fflush(stderr);
+    dup2(fd, 2);
+    close(fd);
+}
+
+StderrCapture::~StderrCapture()
+{
+    std::fflush(stderr);
+    dup2(saved_, 2);
+    close(saved_);
+    const std::string seen = text();
+    std::remove(path_.c_str());
+    std::fputs(seen.c_str(), stderr);  // still shown with the test's output
+}
+
+std::string StderrCapture::text() const
+{
+    std::fflush(stderr);
+    std::ifstream in(path_);
+    std::stringstream s;
+    s << in.rdbuf();
+    return s.str();
 }
 
 void removeLog()

@@ -4,6 +4,7 @@
 #pragma once
 
 #include <chrono>
+#include <cstddef>
 #include <functional>
 #include <string>
 #include <vector>
@@ -27,6 +28,30 @@ constexpr const char* kLogsOn = "DebugLog=1\nErrorLog=1\n";
 void writeSettings(const std::string& optSettings, const std::string& cwdSettings);
 void writeFile(const std::string& path, const std::string& text);
 void removeLog();
+
+// What a careless or hostile administrator may leave where the provider
+// expects a regular file.
+enum class Planted { Fifo, DevZeroLink, Directory, Oversize };
+extern const Planted kPlantedKinds[4];
+// Replaces whatever stands at `path` by such an entry; Oversize is a sparse
+// regular file of `oversizeBytes`.
+void plant(Planted kind, const std::string& path, std::size_t oversizeBytes);
+// The reason the provider gives for refusing it ("a FIFO, not a regular file").
+std::string plantedReason(Planted kind, std::size_t bound);
+const char* plantedName(Planted kind);
+
+// Standard error of the process, collected into a file while the object lives.
+class StderrCapture {
+public:
+    StderrCapture();
+    ~StderrCapture();
+    // What was written so far.
+    std::string text() const;
+
+private:
+    int saved_;
+    std::string path_;
+};
 
 // The provider's log, line by line (time stamp included).
 std::vector<std::string> logLines();

@@ -444,6 +444,29 @@ TEST_F(UpdateMethods, NICImagesOfOneByteTo16MiBAreWrittenAndOthersRefused)
     EXPECT_EQ(installFromURI(host(), true, imageOf(100), nicDevice, {}).value(), 2u);
 }
 
+TEST_F(UpdateMethods, AnImageThatIsNoRegularFileOrOverItsBoundIsRefusedAtOnceWithTwo)
+{
+    const std::string path = "/var/tmp/planted.bin";
+    constexpr std::size_t kImageBound = 64u << 20;
+    for (Planted kind : kPlantedKinds) {
+        plant(kind, path, kImageBound + 1);
+        const std::string line = "Refusing flash image (" + path + "): " + plantedReason(kind, kImageBound) + ".";
+        for (bool nic : {false, true}) {
+            SCOPED_TRACE(std::string(plantedName(kind)) + (nic ? " NIC" : " FC"));
+            const int before = countLog(line);
+            const auto start = std::chrono::steady_clock::now();
+            Call c = installFromURI(host(), nic, "file://" + path, nic ? nicDevice : fcDevice, {5});
+            EXPECT_LT(std::chrono::steady_clock::now() - start, 1s);
+            EXPECT_TRUE(c.result.ok());
+            EXPECT_EQ(c.value(), 2u);
+            EXPECT_EQ(countLog(line), before + 1) << line;
+        }
+        std::remove(path.c_str());
+        rmdir(path.c_str());
+    }
+    EXPECT_EQ(zorap_sim_call_count(ZORAP_FN_UpdateFlash) + zorap_sim_call_count(ZORAP_FN_doOptionROMUpdate), 0u);
+}
+
 // ---- Jobs ------------------------------------------------------------------------------
 
 class UpdateJobs : public ProviderSuite<UpdateJobs> {

@@ -31,17 +31,16 @@
 #include <condition_variable>
 #include <cstdio>
 #include <cstring>
-#include <fstream>
 #include <list>
 #include <map>
 #include <mutex>
 #include <new>
 #include <set>
-#include <sstream>
 #include <thread>
 #include <unordered_map>
 #include <unordered_set>
 
+#include "bounded_file.h"
 #include "encode.h"
 #include "livestate.h"
 #include "model.h"
@@ -85,8 +84,11 @@ constexpr const char* kFunctionNames[ZORAP_FN_COUNT] = {
 // that still walks one (the alarm thread of a caller may, without a lock).
 constexpr size_t kRetiredTrees = 2;
 
-// A description file larger than this is refused unread.
-constexpr off_t kMaxDescriptionBytes = 16 * 1024 * 1024;
+// A description file larger than this is refused (the largest host the
+// benchmark generates, 1,024 adapters, takes about 6 MB).
+constexpr size_t kMaxDescriptionBytes = 16 * 1024 * 1024;
+// A flash image larger than this is refused (images are a few MB).
+constexpr size_t kMaxFlashImageBytes = 64 * 1024 * 1024;
 
 // How long shutdown waits for a running alarm callback.
 constexpr int kCallbackGraceMs = 2000;
@@ -119,6 +121,39 @@ FileStamp stampOf(const std::string& path) {
     s.size = st.st_size;
     s.mtimeNs = static_cast<long long>(st.st_mtim.tv_sec) * 1000000000LL + st.st_mtim.tv_nsec;
     return s;
+}
+
+// The last complaint about a description file, with the state of the file it
+// was about: the file is read again by the look that noticed the change and
+// by the backup build after it, and one line is enough for one state of the
+// file. Static storage, never destroyed; emptied at unload.
+struct LastComplaint {
+    std::mutex mu;
+    std::string text;
+};
+
+LastComplaint& lastComplaint() {
+    alignas(LastComplaint) static unsigned char storage[sizeof(LastComplaint)];
+    static LastComplaint* instance = new (storage) LastComplaint();
+    return *instance;
+}
+
+void complainOnce(const std::string& message, const FileStamp& stamp) {
+    const std::string key = message + '\n' + std::to_string(stamp.dev) + ':' + std::to_string(stamp.ino) + ':' +
+                            std::to_string(stamp.size) + ':' + std::to_string(stamp.mtimeNs);
+    {
+        LastComplaint& last = lastComplaint();
+        std::lock_guard<std::mutex> l(last.mu);
+        if (last.text == key) return;
+        last.text = key;
+    }
+    complain(message);
+}
+
+void forgetComplaints() {
+    LastComplaint& last = lastComplaint();
+    std::lock_guard<std::mutex> l(last.mu);
+    std::string().swap(last.text);
 }
 
 struct Source {
@@ -170,20 +205,16 @@ Loaded readSource(const Source& src) {
         out.path = src.kind == Source::File ? src.path : defaultPath();
         out.stamp = stampOf(out.path);
         what = "adapter description " + out.path;
-        if (out.stamp.exists && out.stamp.size > kMaxDescriptionBytes) {
-            complain(what + ": larger than 16 MiB; no adapters");
+        // Opened without blocking and taken only as a regular file within the
+        // bound: a FIFO, a device, a directory or a huge file gives no adapters.
+        bounded_file::Result read = bounded_file::readRegular(out.path.c_str(), kMaxDescriptionBytes);
+        if (read.outcome != bounded_file::Outcome::Taken) {
+            complainOnce(what + ": " + read.reason + "; no adapters", out.stamp);
             out.host.osName = defaultOsName();
             return out;
         }
-        std::ifstream in(out.path, std::ios::binary);
-        if (!in) {
-            complain(what + ": cannot be read (" + std::strerror(errno) + "); no adapters");
-            out.host.osName = defaultOsName();
-            return out;
-        }
-        std::ostringstream ss;
-        ss << in.rdbuf();
-        text = ss.str();
+        text = std::move(read.text);
+        forgetComplaints();  // a later refusal is news again
     }
     try {
         out.host = parseDescription(text);
@@ -622,10 +653,14 @@ public:
         const char* name = reinterpret_cast<const char*>(image);
         const size_t n = strnlen(name, kMaxImageName);
         std::string text(name, n);
-        struct stat st {};
-        const long long bytes = n < kMaxImageName && ::stat(text.c_str(), &st) == 0 && S_ISREG(st.st_mode)
-                                    ? static_cast<long long>(st.st_size)
-                                    : -1;
+        long long bytes = -1;
+        if (n < kMaxImageName) {
+            const bounded_file::Result file = bounded_file::checkRegular(text.c_str(), kMaxFlashImageBytes);
+            if (file.outcome == bounded_file::Outcome::Taken)
+                bytes = static_cast<long long>(file.size);
+            else if (file.outcome == bounded_file::Outcome::Refused)
+                complain("flash image " + text + ": " + file.reason);
+        }
         std::lock_guard<std::mutex> l(flashMu);
         flashImageSeen = true;
         lastFlashImage = std::move(text);
@@ -789,6 +824,7 @@ ZORAP_EXPORT ZORAP_STATUS ZORAP_Uninitialize(void) {
         L.initialized = false;
         L.modelLoaded = false;
         L.configChanged = false;
+        zorap_sim::sysfs::forgetRefusals();  // a new start reports its refusals again
         L.trace("uninitialized");
         return ZORAP_OK;
     });
@@ -1380,6 +1416,12 @@ __attribute__((destructor)) static void zorap_sim_unload() {
         // Blocks still handed out are the caller's leak; the set that knew
         // them goes, so that a leak checker sees them.
         zorap_sim::releaseAll(L.allocations);
+        std::lock_guard<std::mutex> f(L.flashMu);
+        L.flashImageSeen = false;
+        zorap_sim::releaseAll(L.lastFlashImage);
+        L.lastFlashBytes = -1;
+        zorap_sim::sysfs::forgetRefusals();
+        zorap_sim::forgetComplaints();
     } catch (...) {
     }
 }

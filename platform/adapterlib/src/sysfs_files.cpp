@@ -20,6 +20,11 @@
 #include <climits>
 #include <cstdlib>
 #include <cstring>
+#include <mutex>
+#include <new>
+#include <set>
+
+#include "bounded_file.h"
 
 namespace zorap_sim::sysfs {
 namespace {
@@ -41,26 +46,44 @@ private:
     int fd_;
 };
 
-// Opens a regular file for reading; -1 for anything else. O_NONBLOCK keeps a
-// FIFO planted in a tree from blocking the open.
-int openRegular(const std::string& path) {
-    int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY);
-    if (fd < 0) return -1;
-    struct stat st {};
-    if (::fstat(fd, &st) != 0 || !S_ISREG(st.st_mode)) {
-        ::close(fd);
-        return -1;
+// Entries of the tree already reported as refused: each is reported once,
+// not at every look (the alarm thread looks once a second). Static storage
+// that is never destroyed, emptied at unload (forgetRefusals).
+struct Refusals {
+    std::mutex mu;
+    std::set<std::string> reported;
+};
+constexpr size_t kMaxReported = 1024;
+
+Refusals& refusals() {
+    alignas(Refusals) static unsigned char storage[sizeof(Refusals)];
+    static Refusals* instance = new (storage) Refusals();
+    return *instance;
+}
+
+// One line on standard error for an entry that is no regular file or is over
+// its bound; a missing or unreadable attribute is common and stays silent.
+void noteRefusal(const std::string& path, const bounded_file::Result& result) {
+    if (result.outcome != bounded_file::Outcome::Refused) return;
+    Refusals& r = refusals();
+    {
+        std::lock_guard<std::mutex> l(r.mu);
+        if (r.reported.size() >= kMaxReported || !r.reported.insert(path).second) return;
     }
+    std::fprintf(stderr, "libzorap_cna_provider: sysfs file %s: %s; not read\n", path.c_str(),
+                 result.reason.c_str());
+}
+
+// Opens a regular file for reading without blocking (a FIFO planted in a tree
+// can't block the open or a read); -1 for anything else.
+int openRegular(const std::string& path, size_t max) {
+    bounded_file::Result result;
+    const int fd = bounded_file::openRegular(path.c_str(), O_RDONLY, max, result);
+    if (fd < 0) noteRefusal(path, result);
     return fd;
 }
 
-// Reads up to `want` bytes; the count, or -1 on an error (EINTR repeated).
-ssize_t readSome(int fd, void* buffer, size_t want) {
-    for (;;) {
-        ssize_t n = ::read(fd, buffer, want);
-        if (n >= 0 || errno != EINTR) return n;
-    }
-}
+ssize_t readSome(int fd, void* buffer, size_t want) { return bounded_file::readSome(fd, buffer, want); }
 
 enum class VpdWalk { Incomplete, Complete, Invalid };
 
@@ -215,17 +238,16 @@ std::string baseName(const std::string& path) {
 }
 
 std::optional<std::string> readFile(const std::string& path, size_t max) {
-    Fd fd(openRegular(path));
-    if (fd.get() < 0) return std::nullopt;
-    std::string out;
-    char buffer[4096];
-    for (;;) {
-        ssize_t n = readSome(fd.get(), buffer, sizeof buffer);
-        if (n < 0) return std::nullopt;
-        if (n == 0) return out;
-        if (out.size() + static_cast<size_t>(n) > max) return std::nullopt;
-        out.append(buffer, static_cast<size_t>(n));
-    }
+    bounded_file::Result result = bounded_file::readRegular(path.c_str(), max);
+    if (result.outcome == bounded_file::Outcome::Taken) return std::move(result.text);
+    noteRefusal(path, result);
+    return std::nullopt;
+}
+
+void forgetRefusals() {
+    Refusals& r = refusals();
+    std::lock_guard<std::mutex> l(r.mu);
+    std::set<std::string>().swap(r.reported);
 }
 
 std::string printable(const std::string& text, size_t max) {
@@ -285,7 +307,8 @@ std::optional<std::string> resolveUnder(const std::string& root, const std::stri
 }
 
 std::optional<std::vector<uint8_t>> readVpd(const std::string& path) {
-    Fd fd(openRegular(path));
+    // A sysfs vpd file claims the whole 32 KiB (its size is no bound here).
+    Fd fd(openRegular(path, SIZE_MAX));
     if (fd.get() < 0) return std::nullopt;
     // Read in small pieces and stop at the end tag: a device's VPD is read
     // through its configuration space, slowly, and the file often claims

@@ -36,9 +36,14 @@ constexpr size_t kModulePagesSize = 512;
 std::string under(const std::string& root, const std::string& relative);
 std::string baseName(const std::string& path);
 
-// A regular file of at most `max` bytes, read whole; nothing for a file that
-// is missing, unreadable, not a regular file (a FIFO would block) or larger.
+// A regular file of at most `max` bytes, read whole and opened without
+// blocking; nothing for a file that is missing, unreadable, not a regular file
+// (a FIFO would block, a device may never end) or larger. An entry that is no
+// regular file or is larger is reported once on standard error (once per path
+// between two ZORAP_Uninitialize calls).
 std::optional<std::string> readFile(const std::string& path, size_t max);
+// Forgets which entries were reported (ZORAP_Uninitialize, the unload).
+void forgetRefusals();
 // The first line of a text attribute, cut at a NUL, blanks at both ends
 // removed, bytes outside printable ASCII replaced by '?'; nothing when the
 // file can't be read or the line is empty.

@@ -394,12 +394,13 @@ TEST_F(SysfsTest, LiveCallsReadTheTreeAfreshAndARebuildShowsTheNewConfiguration)
 struct OddFile {
     const char* what;
     std::string file;
-    std::string content;  // with fifo: a FIFO in its place instead
-    bool fifo;
+    std::string content;  // for Content only
+    enum Kind { Content, Fifo, DevZeroLink, Directory } kind;
     std::function<void(_tagZORAPSDMDevice*)> check;  // the first FC device
 };
 
 TEST_F(SysfsTest, MissingEmptyHugeOrOddFilesGiveDefaultsAndNeverHang) {
+    using K = OddFile::Kind;
     const std::string fn0 = "sys/devices/pci0000:00/0000:00:02.0/0000:05:00.0/";
     auto vpdAbsent = [](_tagZORAPSDMDevice* d) {
         uint8_t vpd[ZORAP_VPD_BUFFER_SIZE];
@@ -408,33 +409,39 @@ TEST_F(SysfsTest, MissingEmptyHugeOrOddFilesGiveDefaultsAndNeverHang) {
         EXPECT_STREQ("VXA2503K0117", d->deviceSerial);  // the FC host's serial
     };
     const OddFile odd[] = {
-        {"empty vendor", fn0 + "vendor", "", false, [](auto* d) { EXPECT_EQ(0, d->pciVendorId); }},
-        {"huge model", "sys/class/fc_host/host3/model", std::string(1 << 20, 'M'), false,
+        {"empty vendor", fn0 + "vendor", "", K::Content, [](auto* d) { EXPECT_EQ(0, d->pciVendorId); }},
+        {"huge model", "sys/class/fc_host/host3/model", std::string(1 << 20, 'M'), K::Content,
          [](auto* d) { EXPECT_STREQ("VXF1632-2", d->modelName); }},  // the VPD's PN
-        {"bad node name", "sys/class/fc_host/host3/node_name", "0xnot-a-wwn\n", false,
+        {"bad node name", "sys/class/fc_host/host3/node_name", "0xnot-a-wwn\n", K::Content,
          [](auto* d) { EXPECT_EQ(std::string(8, '\0'), text(d->nodeWWN, 8)); }},
-        {"unknown port state", "sys/class/fc_host/host3/port_state", "Sleeping\n", false,
+        {"unknown port state", "sys/class/fc_host/host3/port_state", "Sleeping\n", K::Content,
          [](auto* d) { EXPECT_EQ(0, d->portStateCode); }},
-        {"FIFO port type", "sys/class/fc_host/host3/port_type", "", true,
+        {"FIFO port type", "sys/class/fc_host/host3/port_type", "", K::Fifo,
          [](auto* d) { EXPECT_EQ(0, d->portTypeCode); }},
-        {"speed without code", "sys/class/fc_host/host3/speed", "128 Gbit\n", false,
+        {"/dev/zero link as port state", "sys/class/fc_host/host3/port_state", "", K::DevZeroLink,
+         [](auto* d) { EXPECT_EQ(0, d->portStateCode); }},
+        {"directory as speed", "sys/class/fc_host/host3/speed", "", K::Directory,
          [](auto* d) { EXPECT_EQ(0u, d->portSpeedCode); }},
-        {"overflowing counter", "sys/class/fc_host/host3/statistics/lip_count", "0x1234567890abcdef0\n", false,
+        {"FIFO as VPD", fn0 + "vpd", "", K::Fifo, vpdAbsent},
+        {"/dev/zero link as VPD", fn0 + "vpd", "", K::DevZeroLink, vpdAbsent},
+        {"speed without code", "sys/class/fc_host/host3/speed", "128 Gbit\n", K::Content,
+         [](auto* d) { EXPECT_EQ(0u, d->portSpeedCode); }},
+        {"overflowing counter", "sys/class/fc_host/host3/statistics/lip_count", "0x1234567890abcdef0\n", K::Content,
          [](auto* d) { EXPECT_EQ(0u, d->statLipCount); }},
-        {"negative MTU", "sys/class/net/vxnic0/mtu", "-5\n", false,
+        {"negative MTU", "sys/class/net/vxnic0/mtu", "-5\n", K::Content,
          [](auto*) { EXPECT_EQ(1500u, nicNamed("vxnic0")->nicPortInfo.maxTransmissionUnit); }},
-        {"octal-looking speed", "sys/class/net/vxnic0/speed", "010\n", false,
+        {"octal-looking speed", "sys/class/net/vxnic0/speed", "010\n", K::Content,
          [](auto*) { EXPECT_EQ(10u, nicNamed("vxnic0")->nicPortInfo.linkProperties.linkSpeed); }},
         {"VPD without end tag", fn0 + "vpd", std::string("\x82\x03\x00" "ABC\x90\x05\x00" "SN\x02" "XY", 13),
-         false, vpdAbsent},
-        {"VPD of erased flash", fn0 + "vpd", std::string(64, '\xff'), false, vpdAbsent},
-        {"MAC of another length", "sys/class/net/vxnic1/address", "80:00:02:08:fe:80:00:00:00:00:00:00\n", false,
+         K::Content, vpdAbsent},
+        {"VPD of erased flash", fn0 + "vpd", std::string(64, '\xff'), K::Content, vpdAbsent},
+        {"MAC of another length", "sys/class/net/vxnic1/address", "80:00:02:08:fe:80:00:00:00:00:00:00\n", K::Content,
          [](auto*) {
              EXPECT_EQ(nullptr, nicNamed("vxnic1"));
              EXPECT_NE(nullptr, nicNamed("vxnic0"));
          }},
         {"NUL and control bytes in a text", "sys/class/fc_host/host3/serial_number", std::string("AB\x01" "C\0D\n", 6),
-         false, [&](auto*) {
+         K::Content, [&](auto*) {
              ZORAP_Uninitialize();
              fs::remove(fs::canonical(at(fn0 + "vpd")));  // else the VPD's serial is used
              ASSERT_EQ(ZORAP_OK, ZORAP_Initialize(0, 0));
@@ -446,14 +453,34 @@ TEST_F(SysfsTest, MissingEmptyHugeOrOddFilesGiveDefaultsAndNeverHang) {
         startOnCopy();
         fs::path real = fs::canonical(at(o.file));
         fs::remove(real);
-        if (o.fifo)
-            ASSERT_EQ(0, mkfifo(real.c_str(), 0600));
-        else
-            writeAll(real, o.content);
-        ASSERT_EQ(ZORAP_OK, ZORAP_UpdateBackupAdapterList());
-        ASSERT_EQ(ZORAP_OK, ZORAP_SwapBackupToMainAdapterList());
-        ASSERT_EQ(2u, adapters().size());
-        o.check(device(0, 0));
+        // The alarm thread may look first (once a second): standard error
+        // is taken from before the entry is planted.
+        ::testing::internal::CaptureStderr();
+        switch (o.kind) {
+            case K::Fifo: ASSERT_EQ(0, mkfifo(real.c_str(), 0600)); break;
+            case K::DevZeroLink: fs::create_symlink("/dev/zero", real); break;
+            case K::Directory: fs::create_directory(real); break;
+            case K::Content: writeAll(real, o.content); break;
+        }
+        // The backup build reads the tree as a poll does, at once; the build,
+        // the live calls of the check or the alarm thread's look name an
+        // entry that is no regular file on standard error.
+        const auto start = std::chrono::steady_clock::now();
+        const ZORAP_STATUS built = ZORAP_UpdateBackupAdapterList();
+        EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(1));
+        const ZORAP_STATUS swapped = ZORAP_SwapBackupToMainAdapterList();
+        const size_t count = adapters().size();
+        if (built == ZORAP_OK && swapped == ZORAP_OK && count == 2u) o.check(device(0, 0));
+        const std::string err = ::testing::internal::GetCapturedStderr();
+        ASSERT_EQ(ZORAP_OK, built);
+        ASSERT_EQ(ZORAP_OK, swapped);
+        ASSERT_EQ(2u, count);
+        if (o.kind != K::Content) {
+            // Named by the path the library read (through the tree's links).
+            EXPECT_NE(std::string::npos, err.find("libzorap_cna_provider: sysfs file " + copy_.string())) << err;
+            EXPECT_NE(std::string::npos, err.find(o.file + ": ")) << err;
+            EXPECT_NE(std::string::npos, err.find("not a regular file; not read")) << err;
+        }
         TearDown();
         copy_.clear();
     }

@@ -5,7 +5,13 @@
 
 #include <gtest/gtest.h>
 
+#include <sys/socket.h>
+#include <sys/stat.h>
+#include <sys/un.h>
+#include <unistd.h>
+
 #include <string>
+#include <vector>
 
 using namespace support_test;
 
@@ -223,6 +229,106 @@ TEST_F(SettingsTest, NicReloadReadsOverCurrentValuesAndNamesTheFile) {
     ::testing::internal::GetCapturedStderr();
     EXPECT_TRUE(properties->errorLog);
     delete properties;
+}
+
+// An interval the loop can't use as a period keeps what strtol and the int
+// field make of it, and the reading says so once, in the error log when it
+// is on, else on standard error.
+TEST_F(SettingsTest, NicPollIntervalsOutsideAPeriodAreKeptAndSaidOncePerRead) {
+    struct Row {
+        char const* value;
+        int interval;
+        char const* line;  // "" for a usable interval
+    };
+    Row const rows[] = {
+        {"30", 30, ""},
+        {"-5", -5, "LinkStatusPollIntervalSeconds=-5 is negative, read as -5: a poll every second."},
+        {"0", 0, "LinkStatusPollIntervalSeconds=0 is zero, read as 0: a poll about every 2 seconds."},
+        {"2147483648", -2147483647 - 1,
+         "LinkStatusPollIntervalSeconds=2147483648 is beyond the range of an int, read as -2147483648: a poll every "
+         "second."},
+        {"4294967301", 5,
+         "LinkStatusPollIntervalSeconds=4294967301 is beyond the range of an int, read as 5: a poll about every 7 "
+         "seconds."},
+        {"soon", 0, "LinkStatusPollIntervalSeconds=soon is no number, read as 0: a poll about every 2 seconds."},
+    };
+    for (Row const& row : rows) {
+        SCOPED_TRACE(row.value);
+        writeFile(kCwdProperties, std::string("LinkStatusPollIntervalSeconds=") + row.value + "\n");
+        for (bool errorLog : {false, true}) {
+            g_EnableLogError = errorLog;
+            std::remove(kLogPath);
+            ::testing::internal::CaptureStderr();
+            Vexlan_NIC_Properties properties;
+            std::string const err = ::testing::internal::GetCapturedStderr();
+            EXPECT_EQ(properties.linkStatusPollIntervalSeconds, row.interval);
+            std::string const expected = *row.line ? std::string("Config: ") + row.line : "";
+            std::vector<std::string> const log = logMessages();
+            if (errorLog) {
+                EXPECT_EQ(log.size(), *row.line ? 1u : 0u);
+                if (!log.empty()) {
+                    EXPECT_EQ(log[0], expected);
+                }
+            } else {
+                EXPECT_TRUE(log.empty());
+                std::string const name = "Vexlan_NIC_Properties::reload, properties file name: vexlancna.properties\n";
+                EXPECT_EQ(err, name + (*row.line ? "Vexlan_CNA_Provider: " + expected + "\n" : ""));
+            }
+        }
+    }
+    g_EnableLogError = false;
+}
+
+// A settings file that is no regular file or is over its bound is refused
+// with one line and the defaults stand, in both readers.
+TEST_F(SettingsTest, ASettingsFileThatIsNoRegularFileLeavesTheDefaults) {
+    std::string const huge = std::string(1024 * 1024, '#') + "\nErrorLog=1\nLinkStatusPollIntervalSeconds=5\n";
+    struct Row {
+        char const* what;
+        void (*make)(std::string const& path, std::string const& big);
+        char const* reason;
+    };
+    Row const rows[] = {
+        {"FIFO", [](std::string const& p, std::string const&) { mkfifo(p.c_str(), 0600); },
+         "a FIFO, not a regular file"},
+        {"/dev/null link", [](std::string const& p, std::string const&) { (void)!symlink("/dev/null", p.c_str()); },
+         "a character device, not a regular file"},
+        {"directory", [](std::string const& p, std::string const&) { mkdir(p.c_str(), 0700); },
+         "a directory, not a regular file"},
+        {"over 1 MiB", [](std::string const& p, std::string const& big) { writeFile(p, big); },
+         "larger than 1048576 bytes"},
+        {"socket",  // open() fails (ENXIO): the entry's kind is still named
+         [](std::string const& p, std::string const&) {
+             sockaddr_un address{};
+             address.sun_family = AF_UNIX;
+             std::snprintf(address.sun_path, sizeof address.sun_path, "%s", p.c_str());
+             int const fd = socket(AF_UNIX, SOCK_STREAM, 0);
+             (void)!bind(fd, reinterpret_cast<sockaddr const*>(&address), sizeof address);
+             close(fd);
+         },
+         "a socket, not a regular file"},
+    };
+    for (Row const& row : rows) {
+        SCOPED_TRACE(row.what);
+        for (std::string const& path : {kOptProperties, kCwdProperties}) {
+            row.make(path, huge);
+            g_EnableLogError = false;
+            ::testing::internal::CaptureStderr();
+            if (path == kOptProperties) {
+                LoadProviderProperties();
+                EXPECT_FALSE(g_EnableLogError);
+            } else {
+                Vexlan_NIC_Properties properties;
+                EXPECT_EQ(properties.linkStatusPollIntervalSeconds, 180);
+                EXPECT_FALSE(properties.errorLog);
+            }
+            std::string const err = ::testing::internal::GetCapturedStderr();
+            std::string const line = "Vexlan_CNA_Provider: Refusing settings file (" + path + "): " + row.reason + ".\n";
+            EXPECT_NE(err.find(line), std::string::npos) << err;
+            std::remove(path.c_str());
+            rmdir(path.c_str());
+        }
+    }
 }
 
 TEST_F(SettingsTest, InstanceIsCreatedOnceAndNeverReread) {
