@@ -18,8 +18,8 @@
 #include <vector>
 
 #include "associations/AssocRows.h"
-#include "provider/ClassTests.h"
-#include "provider/RequestLists.h"
+#include "support/ClassTests.h"
+#include "support/RequestLists.h"
 #include "provider/Vexlan_CNA_Provider_CMPI.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 

@@ -7,8 +7,8 @@
 #include <cstdint>
 #include <cstring>
 
-#include "provider/ClassTests.h"
-#include "provider/RequestLists.h"
+#include "support/ClassTests.h"
+#include "support/RequestLists.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 namespace {

@@ -12,8 +12,8 @@
 
 #include "indications/Vexlan_Adapter_JobIndications.h"
 #include "inventory/AdapterFunc.h"
-#include "provider/ClassTests.h"
-#include "provider/RequestLists.h"
+#include "support/ClassTests.h"
+#include "support/RequestLists.h"
 #include "provider/Vexlan_CNA_Provider_Tables.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "update/FlashUpdate.h"

@@ -10,6 +10,7 @@
 
 #include "CmpiImpl.h"
 #include "zorap_cna.h"
+#include "support/RequestLists.h"
 
 struct ThreadArgs;
 
@@ -38,11 +39,6 @@ CmpiStatus withoutSendFlag(const CmpiContext& ctx, CmpiResult& rslt, const CmpiO
     return Get(ctx, rslt, cop, properties);
 }
 
-// The remove and build operations of one list.
-struct ListOps {
-    void (*remove)();
-    void (*build)();
-};
 
 // The three groups of routes, walked in this order; a match ends its group,
 // not the request.

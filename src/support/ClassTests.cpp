@@ -1,4 +1,4 @@
-#include "provider/ClassTests.h"
+#include "support/ClassTests.h"
 
 #include <cctype>
 #include <mutex>

@@ -5,10 +5,14 @@
 // uses the list built for it. Outside a scope (the polling thread, methods)
 // every remove and build runs. The lists are told apart by their build
 // operation. Everything here is guarded by provider_lock.
-#ifndef VEXLAN_PROVIDER_REQUESTLISTS_H
-#define VEXLAN_PROVIDER_REQUESTLISTS_H
+#ifndef VEXLAN_SUPPORT_REQUESTLISTS_H
+#define VEXLAN_SUPPORT_REQUESTLISTS_H
 
-#include "provider/Vexlan_CNA_Provider_Tables.h"
+// The remove and build operations of one list.
+struct ListOps {
+    void (*remove)();
+    void (*build)();
+};
 
 class RequestScope {
 public:

@@ -1,4 +1,4 @@
-#include "provider/RequestLists.h"
+#include "support/RequestLists.h"
 
 #include <cstdint>
 #include <vector>

@@ -7,8 +7,8 @@
 // Answers are kept by namespace, class of the path and tested class, all
 // without regard to case. A broker call that fails throws as
 // CmpiObjectPath::classPathIsA does, and nothing is kept for it.
-#ifndef VEXLAN_PROVIDER_CLASSTESTS_H
-#define VEXLAN_PROVIDER_CLASSTESTS_H
+#ifndef VEXLAN_SUPPORT_CLASSTESTS_H
+#define VEXLAN_SUPPORT_CLASSTESTS_H
 
 #include <memory>
 
