@@ -73,7 +73,7 @@ deb: build
 	@scripts/install-deb-tools.sh
 	scripts/make-deb.sh $(BUILD) $(BUILD)
 
-# The RPM, from the plain build tree with rpmbuild and packaging/vexlan-cna-provider.spec:
+# The RPM, from the plain build tree with rpmbuild and packaging/vexlan-cna-provider.rpmbuild:
 # $(BUILD)/vexlan-cna-provider-<version>-1.<arch>.rpm
 rpm: build
 	@scripts/install-rpm-tools.sh

@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
 # Builds the RPM of the provider from a configured and built build tree with
-# rpmbuild and the spec file packaging/vexlan-cna-provider.spec: everything
+# rpmbuild and the build file packaging/vexlan-cna-provider.rpmbuild: everything
 # `make install` lays down, under /usr, the adapter library found beside the
 # provider through its run path $ORIGIN.
 #
@@ -22,7 +22,7 @@ VERSION=$version "$src/scripts/stage-package.sh" "$build" "$work/root" origin
 
 if ! rpmbuild -bb --quiet --define "_topdir $work/top" --define "_rpmdir $work/rpms" \
        --define "pkgversion $version" --define "stagedir $work/root" \
-       "$src/packaging/vexlan-cna-provider.spec" > "$work/rpmbuild.log" 2>&1; then
+       "$src/packaging/vexlan-cna-provider.rpmbuild" > "$work/rpmbuild.log" 2>&1; then
   cat "$work/rpmbuild.log" >&2; exit 1
 fi
 rpm=$(find "$work/rpms" -name "vexlan-cna-provider-$version-1.*.rpm" | head -1)
