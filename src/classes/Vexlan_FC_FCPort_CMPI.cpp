@@ -27,6 +27,14 @@ const char kClassName[] = "Vexlan_FCHBA_FCPort";
             Vexlan_FC_Utils_CMPI::DebugPrint(__VA_ARGS__); \
     } while (0)
 
+// Zeroes the text of a field, which leaves it as a clear of the whole field
+// would: nothing reads behind a field's first zero.
+template <std::size_t N>
+void clearText(char (&field)[N])
+{
+    std::memset(field, 0, strnlen(field, N));
+}
+
 // Appends ";<text>" to a text of `size` bytes, cutting at the end.
 void appendField(char* target, std::size_t size, const char* text)
 {
@@ -92,8 +100,8 @@ void takePortState(_tagZORAPSDMDevice* device, FCPortEntry& entry)
 bool createFCPort(_tagZORAPSDMDevice* device, FCPortEntry& entry, char* serial, std::size_t serialSize)
 {
     for (char* line : kClearedVpdLines)
-        std::memset(line, 0, kVpdLineSize);
-    std::memset(entry.vpdData, 0, sizeof(entry.vpdData));
+        ClearVpdLine(line);
+    clearText(entry.vpdData);
 
     const int chipCode = GetRSXType(device);
     const int vpdResult = GetHBAVPDData(device);
@@ -105,8 +113,8 @@ bool createFCPort(_tagZORAPSDMDevice* device, FCPortEntry& entry, char* serial, 
     }
 
     for (char* line : kOptionROMLines)
-        std::memset(line, 0, kVpdLineSize);
-    std::memset(entry.optionROMVersions, 0, sizeof(entry.optionROMVersions));
+        ClearVpdLine(line);
+    clearText(entry.optionROMVersions);
     if (chipCode > 5) {
         GetHBAOptionROMVersions(device);
         debug("Vexlan_FC_FCPort: createFCPort: Option ROM versions retrieved.");

@@ -5,6 +5,7 @@
 #include <cstdio>
 #include <cstring>
 
+#include "classes/TextsBelowCount.h"
 #include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "inventory/AdapterFunc_VPD.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
@@ -14,17 +15,38 @@ ClassList<LogicalPortGroupEntry> g_LogicalPortGroupList;
 
 namespace {
 
-// Fills slot `entry` from one FC function unless a slot below count has its
-// node WWN already. `serial` is the build's serial buffer, which keeps its
-// text from one device to the next.
-bool createLogicalPortGroup(_tagZORAPSDMDevice* device, LogicalPortGroupEntry& entry, char* serial,
-                            std::size_t serialSize)
-{
-    char hostName[kHostNameBufferSize] = {};
-    int hostNameKind = 0;
-    GetHostName(hostName, &hostNameKind, sizeof(hostName));
+using NodeWWNsBelowCount = TextsBelowCount<LogicalPortGroupEntry, sizeof(LogicalPortGroupEntry::nodeWWN)>;
 
-    std::memset(g_serialNumber, 0, kVpdLineSize);
+// What one build shares among its FC functions: the serial buffer, which
+// keeps its text from one device to the next, the node WWNs of the slots
+// below count, and the host name, asked once per build instead of once per
+// function (the resolver reads the hosts file at every question).
+struct GroupBuild {
+    char serial[256] = {};
+    NodeWWNsBelowCount nodeWWNs{g_LogicalPortGroupList, &LogicalPortGroupEntry::nodeWWN};
+    bool haveHostName = false;
+    char hostName[kHostNameBufferSize] = {};
+
+    const char* host()
+    {
+        if (!haveHostName) {
+            int hostNameKind = 0;
+            GetHostName(hostName, &hostNameKind, sizeof(hostName));
+            haveHostName = true;
+        }
+        return hostName;
+    }
+};
+
+// Fills slot `entry` from one FC function unless a slot below count has its
+// node WWN already.
+bool createLogicalPortGroup(_tagZORAPSDMDevice* device, LogicalPortGroupEntry& entry, GroupBuild& build)
+{
+    const char* hostName = build.host();
+    char* serial = build.serial;
+    const std::size_t serialSize = sizeof(build.serial);
+
+    ClearVpdLine(g_serialNumber);
     const int vpdResult = GetHBAVPDData(device);
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint(
@@ -37,9 +59,8 @@ bool createLogicalPortGroup(_tagZORAPSDMDevice* device, LogicalPortGroupEntry& e
     FormatWWN(device->nodeWWN, nodeWWN, sizeof(nodeWWN));
     FormatWWN(device->portWWN, portWWN, sizeof(portWWN));
 
-    for (int i = 0; i < g_LogicalPortGroupList.count; ++i)
-        if (std::strcmp(nodeWWN, g_LogicalPortGroupList.entries[i].nodeWWN) == 0)
-            return false;
+    if (build.nodeWWNs.find(nodeWWN) >= 0)
+        return false;
 
     FormatFCText(entry.nodeWWN, sizeof(entry.nodeWWN), "%s", nodeWWN);
     FormatFCText(entry.instanceId, sizeof(entry.instanceId), "%s_%s_%s_%s", hostName, serial, nodeWWN, portWWN);
@@ -67,11 +88,11 @@ const ClassModule<LogicalPortGroupEntry> kLogicalPortGroup =
 
 void buildLogicalPortGroupList()
 {
-    char serial[256] = {};
+    GroupBuild build;
     kLogicalPortGroup.build(
         IsFCProtocol,
         [&](_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* protocol, LogicalPortGroupEntry& entry, int) {
-            return createLogicalPortGroup(&protocol->fcDevice, entry, serial, sizeof(serial));
+            return createLogicalPortGroup(&protocol->fcDevice, entry, build);
         });
 }
 

@@ -6,6 +6,7 @@
 #include <cstring>
 #include <strings.h>
 
+#include "classes/TextsBelowCount.h"
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
 #include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "inventory/AdapterFunc_VPD.h"
@@ -18,13 +19,15 @@ namespace {
 const char kSystemClassName[] = "Vexlan_Adapter_ComputerSystem";
 const char kClassName[] = "Vexlan_FCHBA_PortController";
 
+using SerialsBelowCount = TextsBelowCount<PortControllerEntry, sizeof(PortControllerEntry::deviceId)>;
+
 // Fills the next slot from one FC function unless its adapter's serial is in
 // the list already. `serial` is the build's serial buffer, which keeps its
 // text from one device to the next.
 bool createPortController(_tagZORAPSDMDevice* device, PortControllerEntry& entry, char* serial,
-                          std::size_t serialSize)
+                          std::size_t serialSize, SerialsBelowCount& known)
 {
-    std::memset(g_serialNumber, 0, kVpdLineSize);
+    ClearVpdLine(g_serialNumber);
     const int vpdResult = GetHBAVPDData(device);
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint(vpdResult == 0
@@ -32,14 +35,13 @@ bool createPortController(_tagZORAPSDMDevice* device, PortControllerEntry& entry
                                              : "Vexlan_FC_PortController: createPortController: Unable to retrieve VPD data!");
     TakeFCSerial(device, vpdResult, serial, serialSize);
 
-    for (int i = 0; i < g_PortControllerList.count; ++i) {
-        if (std::strcmp(serial, g_PortControllerList.entries[i].deviceId) == 0) {
-            if (g_EnableDebugPrint)
-                Vexlan_FC_Utils_CMPI::DebugPrint("Exiting  createPortController: Current device has the same the serial "
-                                                 "number as a device in the list at index=%d. Skip!\n",
-                                                 i);
-            return false;
-        }
+    const int same = known.find(serial);
+    if (same >= 0) {
+        if (g_EnableDebugPrint)
+            Vexlan_FC_Utils_CMPI::DebugPrint("Exiting  createPortController: Current device has the same the serial "
+                                             "number as a device in the list at index=%d. Skip!\n",
+                                             same);
+        return false;
     }
 
     FormatFCText(entry.deviceId, sizeof(entry.deviceId), "%s", serial);
@@ -78,10 +80,11 @@ const ClassModule<PortControllerEntry> kPortController =
 void buildPortControllerList()
 {
     char serial[256] = {};
+    SerialsBelowCount known(g_PortControllerList, &PortControllerEntry::deviceId);
     kPortController.build(
         IsFCProtocol,
         [&](_zorap_adapter_t*, _zorap_phy_port_t*, _zorap_protocol_t* protocol, PortControllerEntry& entry, int) {
-            return createPortController(&protocol->fcDevice, entry, serial, sizeof(serial));
+            return createPortController(&protocol->fcDevice, entry, serial, sizeof(serial), known);
         });
 }
 

@@ -299,11 +299,15 @@ void PrintVPD(unsigned char* vpd) {
     PrintVPD(vpd, ZORAP_VPD_BUFFER_SIZE);
 }
 
+void ClearVpdLine(char* line) {
+    std::memset(line, 0, strnlen(line, kVpdLineSize));
+}
+
 int GetHBAVPDData(_tagZORAPSDMDevice* device) {
     if (device == nullptr) return -1;
 
     std::uint32_t length = ZORAP_VPD_BUFFER_SIZE;
-    std::memset(g_I2CUUID, 0, sizeof g_I2CUUID);
+    ClearVpdLine(g_I2CUUID);
 
     char* uuid = nullptr;
     std::uint32_t uuidLength = 0;
