@@ -11,6 +11,7 @@
 
 #include <cstdio>
 #include <cstring>
+#include <vector>
 
 #include "associations/AssocEnds.h"
 #include "associations/AssocRows.h"
@@ -593,30 +594,69 @@ std::string adapterSerialText(const _zorap_adapter_t* adapter)
     return std::string(adapter->serialNumber, strnlen(adapter->serialNumber, sizeof(adapter->serialNumber)));
 }
 
-// The adapter, physical port and FC protocol of the library's tree that have
-// the device's port and node WWN. 1 on success, else 0.
-int getZORAPStructs(_tagZORAPSDMDevice* device, _zorap_adapter_t** adapter, _zorap_phy_port_t** port,
-                    _zorap_protocol_t** protocol)
-{
-    _zorap_adapter_list_t* list = ZORAP_GetAdapterList();
-    if (list == nullptr || list->firstAdapter == nullptr || device == nullptr)
-        return 0;
-    for (_zorap_adapter_t* a = list->firstAdapter; a != nullptr; a = a->next) {
-        for (_zorap_phy_port_t* p = a->phyPortList != nullptr ? a->phyPortList->firstPhyPort : nullptr; p != nullptr;
-             p = p->next) {
-            for (_zorap_protocol_t* pr = p->protocolList != nullptr ? p->protocolList->firstProtocol : nullptr;
-                 pr != nullptr; pr = pr->next) {
-                if (pr->protocolType >= 2 || !sameWWNs(device, pr))
-                    continue;
-                *adapter = a;
-                *port = p;
-                *protocol = pr;
-                return 1;
+// getZORAPStructs of the FC port slots for the pairs of one join: the adapter,
+// physical port and FC protocol of the library's tree that have the port and
+// node WWN of the slot's device (found 1), or none (found 0). A join asks for
+// the same slots again for every slot of the other end, and a walk of the tree
+// per question made the join from one port grow with the square of the host,
+// so each slot's records are found by one walk. The adapter list is still
+// asked of the library at every question; the records found are kept while it
+// gives the same list.
+class FcPortRecords {
+public:
+    struct Records {
+        int found = 0;
+        _zorap_adapter_t* adapter = nullptr;
+        _zorap_phy_port_t* port = nullptr;
+        _zorap_protocol_t* protocol = nullptr;
+    };
+
+    const Records& getZORAPStructs(int slot)
+    {
+        _zorap_adapter_list_t* list = ZORAP_GetAdapterList();
+        if (list != list_ || static_cast<std::size_t>(g_FCPortList.count) != known_.size()) {
+            list_ = list;
+            known_.assign(static_cast<std::size_t>(g_FCPortList.count > 0 ? g_FCPortList.count : 0), Unknown());
+        }
+        Known& k = known_[static_cast<std::size_t>(slot)];
+        if (!k.asked) {
+            k.asked = true;
+            k.records.found = walkTree(list, g_FCPortList.entries[slot].device, k.records);
+        }
+        return k.records;
+    }
+
+private:
+    struct Known {
+        bool asked;
+        Records records;
+    };
+    static Known Unknown() { return Known{false, Records{}}; }
+
+    static int walkTree(_zorap_adapter_list_t* list, const _tagZORAPSDMDevice* device, Records& r)
+    {
+        if (list == nullptr || list->firstAdapter == nullptr || device == nullptr)
+            return 0;
+        for (_zorap_adapter_t* a = list->firstAdapter; a != nullptr; a = a->next) {
+            for (_zorap_phy_port_t* p = a->phyPortList != nullptr ? a->phyPortList->firstPhyPort : nullptr;
+                 p != nullptr; p = p->next) {
+                for (_zorap_protocol_t* pr = p->protocolList != nullptr ? p->protocolList->firstProtocol : nullptr;
+                     pr != nullptr; pr = pr->next) {
+                    if (pr->protocolType >= 2 || !sameWWNs(device, pr))
+                        continue;
+                    r.adapter = a;
+                    r.port = p;
+                    r.protocol = pr;
+                    return 1;
+                }
             }
         }
+        return 0;
     }
-    return 0;
-}
+
+    _zorap_adapter_list_t* list_ = nullptr;
+    std::vector<Known> known_;
+};
 
 // What tells the two library-backed rows apart: the end's list and how its
 // Tag is parsed and composed.
@@ -703,17 +743,19 @@ bool tagOfFcPort(AssocRequest& rq)
 {
     READ_KEY(rq, kDeviceID, deviceId);
     auto& list = Side::list();
+    // The FC port slots of that DeviceID, the same for every slot of the end.
+    std::vector<int> ports;
+    for (int i = 0; i < g_FCPortList.count; ++i)
+        if (same(deviceId, g_FCPortList.entries[i].deviceId))
+            ports.push_back(i);
+    FcPortRecords records;
     int found = -1;
     for (int o = 0; o < list.count && found < 0; ++o) {
-        for (int i = 0; i < g_FCPortList.count; ++i) {
-            if (!same(deviceId, g_FCPortList.entries[i].deviceId))
+        for (int i : ports) {
+            const FcPortRecords::Records& r = records.getZORAPStructs(i);
+            if (!r.found)
                 continue;
-            _zorap_adapter_t* adapter = nullptr;
-            _zorap_phy_port_t* port = nullptr;
-            _zorap_protocol_t* protocol = nullptr;
-            if (!getZORAPStructs(g_FCPortList.entries[i].device, &adapter, &port, &protocol))
-                continue;
-            if (same(Side::compose(o, adapter, port).c_str(), list.entries[o].tag)) {
+            if (same(Side::compose(o, r.adapter, r.port).c_str(), list.entries[o].tag)) {
                 found = o;
                 break;
             }
@@ -728,16 +770,15 @@ template <class Side>
 void tagFcPortPairs(const PairFn& pair)
 {
     auto& list = Side::list();
+    FcPortRecords records;
     for (int o = 0; o < list.count; ++o) {
         for (int i = 0; i < g_FCPortList.count; ++i) {
-            _zorap_adapter_t* adapter = nullptr;
-            _zorap_phy_port_t* port = nullptr;
-            _zorap_protocol_t* protocol = nullptr;
-            if (!getZORAPStructs(g_FCPortList.entries[i].device, &adapter, &port, &protocol)) {
+            const FcPortRecords::Records& r = records.getZORAPStructs(i);
+            if (!r.found) {
                 FC_ASSOC_DEBUG("Failed to find ZORAP structs");
                 continue;
             }
-            if (same(Side::compose(o, adapter, port).c_str(), list.entries[o].tag))
+            if (same(Side::compose(o, r.adapter, r.port).c_str(), list.entries[o].tag))
                 pair(slot(o), slot(i));
         }
     }
