@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdio>
+#include <set>
 #include <string>
 #include <utility>
 #include <vector>
@@ -517,5 +518,36 @@ TEST(PhysicalHosts, SixtyFourAdaptersOfFourFCFunctionsEach)
     OpResult last = host.getInstance(systemPath(kController, "DeviceID", "31000000003F0300"));
     ASSERT_TRUE(last.ok()) << last.message;
     EXPECT_EQ(last.instances.size(), 1u);
+
+    // Each FC port stands on one physical port of its adapter (Tag
+    // "<serial>_<port number>"), found through the library's records from
+    // either end and by enumeration, at the end of the host as at its start.
+    auto tagOf = [](const ObjectPath& p) { return p.key("Tag") != nullptr ? p.key("Tag")->s : std::string(); };
+    cimhost::AssocParams viaPhysicalPort;
+    viaPhysicalPort.assocClass = "Vexlan_FCHBA_PhysicalPortFCPort";
+    const OpResult fcPorts = host.enumerateInstanceNames(classPath("Vexlan_FCHBA_FCPort"));
+    ASSERT_EQ(fcPorts.paths.size(), 256u);
+    for (int k : {0, 3, 129, 254, 255}) {
+        const OpResult found = host.associatorNames(fcPorts.paths[k], viaPhysicalPort);
+        ASSERT_TRUE(found.ok()) << found.message;
+        ASSERT_EQ(found.paths.size(), 1u) << k;
+        char tag[32];
+        std::snprintf(tag, sizeof tag, "VXW%04d_%d", k / 4, k % 4 / 2);
+        EXPECT_EQ(tagOf(found.paths[0]), tag) << k;
+    }
+    const OpResult physicalPorts = host.enumerateInstanceNames(classPath(kPort));
+    ASSERT_EQ(physicalPorts.paths.size(), 128u);
+    EXPECT_EQ(tagOf(physicalPorts.paths.back()), "VXW0063_1");
+    const OpResult lastTwo = host.associatorNames(physicalPorts.paths.back(), viaPhysicalPort);
+    ASSERT_TRUE(lastTwo.ok()) << lastTwo.message;
+    ASSERT_EQ(lastTwo.paths.size(), 2u);
+    EXPECT_TRUE(lastTwo.paths[0] == fcPorts.paths[254]);
+    EXPECT_TRUE(lastTwo.paths[1] == fcPorts.paths[255]);
+    const OpResult pairs = host.enumerateInstanceNames(classPath("Vexlan_FCHBA_PhysicalPortFCPort"));
+    ASSERT_EQ(pairs.paths.size(), 256u);
+    std::set<std::string> pairedPorts;
+    for (const ObjectPath& pair : pairs.paths)
+        pairedPorts.insert(tagOf(*pair.keys[0].second.ref));
+    EXPECT_EQ(pairedPorts.size(), 128u);
     ASSERT_TRUE(host.unload(true).ok());
 }
