@@ -35,12 +35,14 @@ void clearText(char (&field)[N])
     std::memset(field, 0, strnlen(field, N));
 }
 
-// Appends ";<text>" to a text of `size` bytes, cutting at the end.
-void appendField(char* target, std::size_t size, const char* text)
+// Appends ";<text>" to a text of `size` bytes whose first `used` bytes are
+// taken, cutting at the end; returns the new length.
+std::size_t appendField(char* target, std::size_t size, std::size_t used, const char* text)
 {
-    std::size_t used = strnlen(target, size);
-    if (used + 1 < size)
-        JoinFCText(target + used, size - used, {";", text});
+    if (used + 1 >= size)
+        return used;
+    const std::size_t total = JoinFCText(target + used, size - used, {";", text});
+    return used + (total < size - used - 1 ? total : size - used - 1);
 }
 
 // The VPD lines that follow product, part number and serial in VPDData, in
@@ -59,12 +61,15 @@ char* const kOptionROMLines[] = {g_optionROMBIOS, g_optionROMEFI, g_optionROMFCo
 // VPDData of one device from the freshly decoded buffers.
 void composeVpdData(FCPortEntry& entry, int chipCode)
 {
-    JoinFCText(entry.vpdData, sizeof(entry.vpdData), {g_productId, ";", g_partNumber, ";", g_serialNumber});
+    const std::size_t size = sizeof(entry.vpdData);
+    const std::size_t first =
+        JoinFCText(entry.vpdData, size, {g_productId, ";", g_partNumber, ";", g_serialNumber});
+    std::size_t used = first < size - 1 ? first : size - 1;
     for (const char* line : kOptionalVpdLines)
         if (line[0] != '\0')
-            appendField(entry.vpdData, sizeof(entry.vpdData), line);
+            used = appendField(entry.vpdData, size, used, line);
     if (IsEnodeMacChipCode(chipCode) && g_flashImageVersion[0] != '\0')
-        appendField(entry.vpdData, sizeof(entry.vpdData), g_flashImageVersion);
+        appendField(entry.vpdData, size, used, g_flashImageVersion);
 }
 
 // OperationalStatus of the port state code, with the DeviceStatus bits that a

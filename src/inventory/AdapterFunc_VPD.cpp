@@ -2,6 +2,7 @@
 // keywords and their lines, and the option ROM version lines.
 #include "inventory/AdapterFunc_VPD.h"
 
+#include <charconv>
 #include <cstdio>
 #include <cstring>
 #include <string>
@@ -10,7 +11,6 @@
 
 #include "inventory/AdapterFunc_Chip.h"
 #include "support/Vexlan_NIC_Utils.h"
-#include "support/ossimpl.h"
 
 char g_productId[kVpdLineSize];
 char g_RTag[kVpdLineSize];
@@ -106,10 +106,18 @@ void noteWritten(char* line) {
     g_writtenLines->push_back(line);
 }
 
+// A label of the table at the start of a line; labels are far shorter than a
+// line.
+std::size_t putLabel(char* line, char const* label) {
+    std::size_t const used = std::strlen(label);
+    std::memcpy(line, label, used);
+    return used;
+}
+
 // "<label><value>" into a line: the value ends at its length or at a zero
 // byte, and the whole is cut to the line's room.
 void writeLine(char* line, char const* label, char const* value, int length) {
-    std::size_t used = safeStrCpy(line, label, kVpdLineSize);
+    std::size_t used = putLabel(line, label);
     std::size_t count = strnlen(value, static_cast<std::size_t>(length));
     if (count > kVpdLineSize - 1 - used) count = kVpdLineSize - 1 - used;
     std::memcpy(line + used, value, count);
@@ -146,14 +154,27 @@ void decodeKeyword(KeywordRow const& row, unsigned char const* value, int length
         int minor = 0;
         int sub = 0;
         std::sscanf(copy, "%2d%2d%2d", &major, &minor, &sub);
-        char version[40];
-        std::snprintf(version, sizeof version, "%d.%d.%d", major, minor, sub);
-        std::snprintf(line, kVpdLineSize, "%s%s", row.label, version);
+        // "%d.%d.%d" behind the label
+        char* end = line + putLabel(line, row.label);
+        char* const limit = line + kVpdLineSize - 1;
+        int const parts[] = {major, minor, sub};
+        for (int i = 0; i < 3; ++i) {
+            if (i > 0) *end++ = '.';
+            end = std::to_chars(end, limit, parts[i]).ptr;
+        }
+        *end = '\0';
         break;
     }
-    case ValueForm::Byte:
-        std::snprintf(line, kVpdLineSize, "%s%02X", row.label, length > 0 ? value[0] : 0u);
+    case ValueForm::Byte: {
+        // "%02X" of the first value byte behind the label
+        static char const kHex[] = "0123456789ABCDEF";
+        unsigned const byte = length > 0 ? value[0] : 0u;
+        std::size_t const used = putLabel(line, row.label);
+        line[used] = kHex[byte >> 4];
+        line[used + 1] = kHex[byte & 0xFu];
+        line[used + 2] = '\0';
         break;
+    }
     }
 }
 
@@ -199,7 +220,7 @@ void decodeAndRemember(unsigned char const* vpd, std::size_t size) {
 // snprintf(line, kVpdLineSize, "%s%s", label, text) writes it: every
 // function of every FC build writes the option ROM lines.
 void labelledLine(char* line, char const* label, char const* text) {
-    std::size_t used = safeStrCpy(line, label, kVpdLineSize);
+    std::size_t used = putLabel(line, label);
     std::size_t count = std::strlen(text);
     if (count > kVpdLineSize - 1 - used) count = kVpdLineSize - 1 - used;
     std::memcpy(line + used, text, count);
@@ -319,14 +340,14 @@ int GetHBAVPDData(_tagZORAPSDMDevice* device) {
     // Older chips have no readable VPD.
     if (GetRSXType(device) < 8) return -1;
 
+    // A zeroed buffer of the library's VPD size on the stack: one per FC
+    // function and build, where a heap block cost more than the read.
     std::size_t const bufferSize = length;
-    auto* buffer = static_cast<unsigned char*>(CoreZMalloc(bufferSize));
-    if (buffer == nullptr) return -1;
+    unsigned char buffer[ZORAP_VPD_BUFFER_SIZE] = {};
 
     ZORAP_STATUS status = ZORAP_GetVpd(device->deviceHandle, 0, buffer, &length);
     if (status == ZORAP_OK && !replayLastStream(buffer, bufferSize)) decodeAndRemember(buffer, bufferSize);
 
-    CoreFree(buffer);
     return static_cast<int>(status);
 }
 
