@@ -3,9 +3,11 @@
 #include "inventory/AdapterFunc_VPD.h"
 
 #include <charconv>
+#include <cstdint>
 #include <cstdio>
 #include <cstring>
 #include <string>
+#include <unordered_map>
 #include <utility>
 #include <vector>
 
@@ -87,14 +89,24 @@ KeywordRow const kKeywords[] = {
     {"YU", g_UUID, "UUID:", ValueForm::Text},
 };
 
-// The stream decoded last and the text each line held after it, so that the
-// same bytes read again (every function of one adapter reads its adapter's
-// VPD) give the same lines without a second decode.
+// A stream decoded lately and the text each line held after its decode.
 struct DecodedStream {
     std::vector<unsigned char> bytes;
     std::vector<std::pair<char*, std::string>> lines;  // in the order first written
 };
-DecodedStream g_lastStream;
+
+// The streams decoded lately, by a hash of their bytes, so that the same bytes
+// read again give the same lines without a second decode: every function of
+// an adapter reads its adapter's VPD, and every build of an FC list reads them
+// all again (an association request from one FC port runs five such builds).
+// What a decode writes depends on the bytes alone, and the library is asked
+// for them at every read as before, so no line is older than its read. At
+// most kKeptStreams are kept (one adapter each, about 2 kB); the stream after
+// that starts the store afresh. The store is guarded as the lines are: the
+// builds run one at a time.
+constexpr std::size_t kKeptStreams = 4096;
+std::unordered_multimap<std::uint64_t, DecodedStream> g_decoded;
+DecodedStream const* g_lastStream = nullptr;   // the one read last, tried first
 
 // While a decode is being remembered: the lines it wrote so far.
 std::vector<char*>* g_writtenLines = nullptr;
@@ -183,19 +195,46 @@ std::size_t identifierLength(unsigned char const* tag) {
     return static_cast<std::size_t>(tag[1]) | (static_cast<std::size_t>(tag[2]) << 8);
 }
 
-// The lines of a stream equal to the one decoded last, written again as that
-// decode left them; false when the stream differs.
-bool replayLastStream(unsigned char const* vpd, std::size_t size) {
-    if (g_lastStream.bytes.size() != size || std::memcmp(g_lastStream.bytes.data(), vpd, size) != 0) return false;
-    for (auto const& line : g_lastStream.lines) std::memcpy(line.first, line.second.c_str(), line.second.size() + 1);
+// FNV-1a over the stream's 64-bit words (and its last bytes).
+std::uint64_t hashOf(unsigned char const* vpd, std::size_t size) {
+    std::uint64_t hash = 14695981039346656037ull;
+    std::size_t i = 0;
+    for (; i + 8 <= size; i += 8) {
+        std::uint64_t word;
+        std::memcpy(&word, vpd + i, 8);
+        hash = (hash ^ word) * 1099511628211ull;
+    }
+    for (; i < size; ++i) hash = (hash ^ vpd[i]) * 1099511628211ull;
+    return hash;
+}
+
+bool sameStream(DecodedStream const& known, unsigned char const* vpd, std::size_t size) {
+    return known.bytes.size() == size && std::memcmp(known.bytes.data(), vpd, size) == 0;
+}
+
+// The lines of a stream decoded lately, written again as its decode left
+// them; false when the stream is not known. `hash` is the stream's hash when
+// it had to be computed.
+bool replayKnownStream(unsigned char const* vpd, std::size_t size, std::uint64_t& hash) {
+    DecodedStream const* known = nullptr;
+    if (g_lastStream != nullptr && sameStream(*g_lastStream, vpd, size)) {
+        known = g_lastStream;
+    } else {
+        hash = hashOf(vpd, size);
+        auto const range = g_decoded.equal_range(hash);
+        for (auto it = range.first; it != range.second && known == nullptr; ++it)
+            if (sameStream(it->second, vpd, size)) known = &it->second;
+    }
+    if (known == nullptr) return false;
+    g_lastStream = known;
+    for (auto const& line : known->lines) std::memcpy(line.first, line.second.c_str(), line.second.size() + 1);
     return true;
 }
 
 // Decodes the stream and keeps it with the text of the lines it wrote. Without
 // memory to keep it, the stream is decoded all the same and nothing is kept.
-void decodeAndRemember(unsigned char const* vpd, std::size_t size) {
-    g_lastStream.bytes.clear();
-    g_lastStream.lines.clear();
+void decodeAndRemember(unsigned char const* vpd, std::size_t size, std::uint64_t hash) {
+    g_lastStream = nullptr;
     std::vector<char*> written;
     bool recording = true;
     try {
@@ -208,11 +247,13 @@ void decodeAndRemember(unsigned char const* vpd, std::size_t size) {
     g_writtenLines = nullptr;
     if (!recording) return;
     try {
-        g_lastStream.bytes.assign(vpd, vpd + size);
-        for (char* line : written) g_lastStream.lines.emplace_back(line, std::string(line, strnlen(line, kVpdLineSize - 1)));
+        if (g_decoded.size() >= kKeptStreams) g_decoded.clear();
+        DecodedStream decoded;
+        decoded.bytes.assign(vpd, vpd + size);
+        for (char* line : written) decoded.lines.emplace_back(line, std::string(line, strnlen(line, kVpdLineSize - 1)));
+        g_lastStream = &g_decoded.emplace(hash, std::move(decoded))->second;
     } catch (...) {
-        g_lastStream.bytes.clear();
-        g_lastStream.lines.clear();
+        g_lastStream = nullptr;
     }
 }
 
@@ -346,7 +387,9 @@ int GetHBAVPDData(_tagZORAPSDMDevice* device) {
     unsigned char buffer[ZORAP_VPD_BUFFER_SIZE] = {};
 
     ZORAP_STATUS status = ZORAP_GetVpd(device->deviceHandle, 0, buffer, &length);
-    if (status == ZORAP_OK && !replayLastStream(buffer, bufferSize)) decodeAndRemember(buffer, bufferSize);
+    std::uint64_t hash = 0;
+    if (status == ZORAP_OK && !replayKnownStream(buffer, bufferSize, hash))
+        decodeAndRemember(buffer, bufferSize, hash);
 
     return static_cast<int>(status);
 }
