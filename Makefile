@@ -61,12 +61,16 @@ install: build
 
 # The benchmark: builds the driver, runs every scenario under callgrind on
 # generated hosts (isolated /opt and /var/tmp) and writes docs/performance.md
-# with its plot. Not part of `make test`. BENCH_SIZES=1,16 for a quick look.
+# with its plot. Not part of `make test`. BENCH_SIZES=1,16 for a quick look;
+# BENCH_WALK_SIZES are the sizes of the runs that count only the fixed cost of
+# a request and the walks from one element (their table covers 64 to 4,096 FC
+# functions).
 BENCH_SIZES ?= 1,16,256,1024
+BENCH_WALK_SIZES ?= 16,64,256,1024
 bench: build
 	@scripts/install-bench-tools.sh
 	cmake --build $(BUILD) -j $(JOBS) --target vexlan_bench
-	ISOLATE_KEEP_CWD=1 tests/isolate.sh python3 bench/run_bench.py --build $(abspath $(BUILD)) --sizes $(BENCH_SIZES) --out $(abspath docs/performance.md)
+	ISOLATE_KEEP_CWD=1 tests/isolate.sh python3 bench/run_bench.py --build $(abspath $(BUILD)) --sizes $(BENCH_SIZES) --walk-sizes $(BENCH_WALK_SIZES) --out $(abspath docs/performance.md)
 
 # The Debian package, from the plain build tree: $(BUILD)/vexlan-cna-provider_<version>_<arch>.deb
 deb: build

@@ -3,7 +3,7 @@
 runs the driver (vexlan_bench) on each under callgrind, splits the counted
 instructions by who spent them, and writes docs/performance.md with a plot.
 
-    run_bench.py --build DIR [--sizes 1,16,256,1024] [--out docs/performance.md]
+    run_bench.py --build DIR [--sizes 1,16,256,1024] [--walk-sizes 16,64,256,1024] [--out docs/performance.md]
                  [--no-callgrind] [--check] [--as-before] [--walks-only]
 
 Instruction counts are callgrind's (deterministic); wall times are medians of
@@ -13,7 +13,8 @@ fails or a table comes out empty (the test of the benchmark). --as-before also
 stores the tables as the "before" section that later runs keep. --walks-only
 counts only the fixed cost of a request (GetInstance of the computer system)
 and the associations from the system, one FC port and one storage extent, and
-prints their table instead of writing the document.
+prints their table instead of writing the document; the document's table of
+those comes from such runs at the --walk-sizes.
 """
 import argparse
 import copy
@@ -326,7 +327,7 @@ def per_instance_total(row):
     return (s["own"] + s["broker"] + s["delivery"] + s["adapter"]) / max(row["results"], 1)
 
 
-def scenario_tables(title, runs, counted):
+def scenario_tables(title, runs, counted, walk_runs=None):
     sizes = sorted(runs)
     big = by_label(runs[sizes[-1]])
     classes = list_classes(runs)
@@ -378,7 +379,7 @@ def scenario_tables(title, runs, counted):
                                  kilo(s["delivery"]), kilo(s["adapter"]), s.get("broker_calls", "-")])
         doc.append(table(["request", "from", "results", "total", "provider own", "broker build",
                           "host delivery", "adapter library", "broker calls"], rows))
-        doc.append("\n" + walk_table(runs))
+        doc.append("\n" + walk_table(walk_runs or runs))
         assoc = big.get("ai system")
         if assoc and "split" in assoc:
             enum_total = 0
@@ -409,19 +410,26 @@ WALKS = [("gi first Vexlan_Adapter_ComputerSystem", "GetInstance of the computer
 
 def walk_table(runs):
     """The fixed cost of a request and the walks from one element at every
-    size: instructions (total and the provider's own) and broker calls."""
+    size: instructions (total and the provider's own), broker calls, and the
+    growth of the total from the next smaller size against the growth of the
+    host (1.00: as fast as the host)."""
     sizes = sorted(runs)
     rows = []
     for label, name in WALKS:
+        before = None
         for s in sizes:
             r = by_label(runs[s]).get(label)
             if r and "split" in r:
                 sp = r["split"]
+                growth = "-"
+                if before is not None and before[1] > 0:
+                    growth = "%.2f" % ((instructions(sp) / before[1]) / (s / before[0]))
                 rows.append([name, "%d (%d FC functions)" % (s, 4 * s), r["results"], kilo(instructions(sp)),
-                             kilo(sp["own"]), kilo(sp["adapter"]), sp.get("broker_calls", "-")])
+                             kilo(sp["own"]), kilo(sp["adapter"]), sp.get("broker_calls", "-"), growth])
+                before = (s, instructions(sp))
     return ("### Fixed cost of a request and walks from one element (instructions and broker calls per request)\n"
             + table(["request", "adapters", "results", "total", "provider own", "adapter library",
-                     "broker calls"], rows))
+                     "broker calls", "growth / host growth"], rows))
 
 
 def wall_tables(runs):
@@ -521,6 +529,9 @@ def main():
     ap.add_argument("--walks-only", action="store_true",
                     help="count only the fixed cost and the walks; print their table")
     ap.add_argument("--provider", default=None, help="the provider library to load instead of the build's")
+    ap.add_argument("--walk-sizes", default="16,64,256,1024",
+                    help="sizes (adapters) of the runs that count only the walks, for their table; "
+                         "empty: the walks of the full runs")
     args = ap.parse_args()
     build = os.path.abspath(args.build)
     sizes = [int(s) for s in args.sizes.split(",") if s]
@@ -545,6 +556,15 @@ def main():
             fc_runs[s] = run_driver(build, os.path.join(work, "fc-%d-cg" % s), desc, True, 1)
         print("run_bench: %d adapters natively" % s, flush=True)
         fc_wall[s] = run_driver(build, os.path.join(work, "fc-%d" % s), desc, False, args.repeat)
+    # The walks' table comes from runs of their own, the same requests in the
+    # same order at every size (in the full runs the fixed cost of a request
+    # also depends on what ran before it).
+    walk_runs = {}
+    if counted:
+        for s in [int(x) for x in args.walk_sizes.split(",") if x]:
+            print("run_bench: %d adapters under callgrind, walks only" % s, flush=True)
+            walk_runs[s] = run_driver(build, os.path.join(work, "fc-%d-walks" % s), describe("fc", s), True, 1,
+                                      walks_only=True)
     for s in mixed:
         desc = describe("mixed", s)
         print("run_bench: mixed host of %d adapters%s" % (s, " under callgrind" if counted else ""), flush=True)
@@ -563,7 +583,7 @@ def main():
 
     body = []
     if counted:
-        body.append(scenario_tables("FC host: adapters of 4 FC functions", fc_runs, True))
+        body.append(scenario_tables("FC host: adapters of 4 FC functions", fc_runs, True, walk_runs))
         if mixed_runs:
             body.append("\n" + scenario_tables("Mixed host: CNAs (FCoE and NIC functions) and FC HBAs",
                                                mixed_runs, True))
@@ -577,8 +597,8 @@ def main():
     header = ("# Performance\n\n"
               "Written by `make bench` (bench/run_bench.py driving bench/vexlan_bench); do not edit by hand.\n\n"
               "- Machine: %s\n- Commit: %s\n- Date: %s\n- Sizes: %s adapters of 4 FC functions "
-              "(the first adapter of the default description as the template); mixed host: %s adapters, "
-              "half of them CNAs\n\n"
+              "(the first adapter of the default description as the template); walks from one element: %s; "
+              "mixed host: %s adapters, half of them CNAs\n\n"
               "Instruction counts come from callgrind and cover everything under the provider's own functions "
               "during one request: *broker build* is what its calls into the host cost other than handing "
               "results over, *host delivery* the host's returnData, returnInstance, returnObjectPath and "
@@ -586,7 +606,10 @@ def main():
               "(its code and the C and C++ library calls it makes itself). FCPort, FCPortStatistics, StorageExtent "
               "and SCSIProtocolEndpointTarget requests include the rebuild of their list.\n\n"
               % (machine(), commit(args.commit), datetime.datetime.utcnow().strftime("%Y-%m-%d %H:%M UTC"),
-                 ", ".join(map(str, sizes)), ", ".join(map(str, mixed))))
+                 ", ".join(map(str, sizes)),
+                 ", ".join(map(str, sorted(walk_runs))) + " adapters, in runs of their own" if walk_runs
+                 else "in the full runs",
+                 ", ".join(map(str, mixed))))
     if plotted:
         header += "![cost per enumerated instance against host size](%s)\n\n" % png_name
     doc = header + "# Now\n\n" + current + "\n# Before\n\n" + BEFORE_BEGIN + "\n" + before + "\n" + BEFORE_END + "\n"
