@@ -47,9 +47,9 @@ extern char g_optionROMFirmware[kVpdLineSize];// "OptionROM Firmware Version:...
 void ClearVpdLine(char* line);
 
 // Reads the I2C UUID into g_I2CUUID (cleared first) and, for chips of code 8
-// or above, the VPD stream, which it decodes into the buffers. Returns the
-// ZORAP_GetVpd result (0 on success), or -1 for a null device, an older chip
-// or no memory.
+// or above, the VPD stream, which it decodes into the buffers (a stream read
+// before writes the lines of its decode back). Returns the ZORAP_GetVpd result
+// (0 on success), or -1 for a null device or an older chip.
 int GetHBAVPDData(_tagZORAPSDMDevice* device);
 
 // Walks a VPD stream of `size` bytes tag by tag up to the end tag 0x78 and
