@@ -1,0 +1,112 @@
+// Every instance class as a client's ein and ei show it, against the text kept
+// in tests/fixtures/instances-<host>, for two hosts: the adapter library's
+// default description and the sysfs tree of tests/fixtures/sysfs-host. The
+// paths with their keys in order, then each instance with its properties in
+// order and their values (the strict host checks each value's CIM type
+// against the class). What depends on the machine (the host's name and its
+// form, the OS name) stands there as @HOST@, @HOSTFORMAT@ and @OS@.
+//
+// VEXLAN_RECORD_INSTANCES=<dir> writes the texts into <dir>/instances-<host>
+// instead of comparing; a changed file is read and checked before it is kept.
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <fstream>
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include "cimhost/text.h"
+#include "provider_env.h"
+#include "zorap_cna.h"
+#include "zorap_sim_control.h"
+
+using namespace provtest;
+using cimhost::OpResult;
+
+namespace {
+
+// The instance classes of the class table, in its order.
+std::vector<std::string> instanceClasses()
+{
+    std::ifstream in(VEXLAN_CLASS_TABLE);
+    std::vector<std::string> classes;
+    std::string line;
+    while (std::getline(in, line)) {
+        if (line.empty() || line[0] == '#')
+            continue;
+        std::vector<std::string> cols;
+        std::stringstream s(line);
+        std::string col;
+        while (std::getline(s, col, '\t'))
+            cols.push_back(col);
+        if (cols.size() > 3 && cols[3].rfind("instance", 0) == 0 && cols[3].find("association") == std::string::npos)
+            classes.push_back(cols[0]);
+    }
+    return classes;
+}
+
+void replaceAll(std::string& text, const std::string& from, const std::string& to)
+{
+    if (from.empty())
+        return;
+    for (size_t at = text.find(from); at != std::string::npos; at = text.find(from, at + to.size()))
+        text.replace(at, from.size(), to);
+}
+
+std::string readFile(const std::string& path)
+{
+    std::ifstream in(path);
+    std::ostringstream text;
+    text << in.rdbuf();
+    return in ? text.str() : "<no file " + path + ">";
+}
+
+// ein then ei of the class, as text, with the machine's values replaced.
+std::string render(cimhost::Host& host, const std::string& cls)
+{
+    const OpResult names = host.enumerateInstanceNames(classPath(cls));
+    const OpResult full = enumerate(host, cls);
+    EXPECT_TRUE(names.ok() && names.strictErrors.empty()) << cls << ": " << names.message;
+    std::string text;
+    for (const cimhost::ObjectPath& p : names.paths)
+        text += cimhost::formatPath(p) + "\n";
+    for (const cimhost::Instance& inst : full.instances)
+        text += cimhost::formatInstanceMof(inst);
+    const ExpectedHost machine = expectedHost();
+    char os[ZORAP_OS_NAME_BUFFER_SIZE] = {};
+    uint32_t size = sizeof(os);
+    if (ZORAP_GetOSName(os, &size) == 0)
+        replaceAll(text, std::string("\"") + os + "\"", "\"@OS@\"");
+    replaceAll(text, "NameFormat = \"" + machine.nameFormat + "\";", "NameFormat = \"@HOSTFORMAT@\";");
+    replaceAll(text, machine.name, "@HOST@");
+    return text;
+}
+
+TEST(RecordedInstances, EveryClassShowsItsRecordedPathsAndInstancesOnBothHosts)
+{
+    const std::vector<std::string> classes = instanceClasses();
+    ASSERT_EQ(classes.size(), 33u);
+    const std::string sysfs = std::string("{\"source\": \"sysfs\", \"root\": \"") + VEXLAN_FIXTURES + "/sysfs-host\"}";
+    const struct {
+        const char* name;
+        const char* description;  // null: the default one
+    } hosts[] = {{"default", nullptr}, {"sysfs", sysfs.c_str()}};
+    const char* record = std::getenv("VEXLAN_RECORD_INSTANCES");
+    for (const auto& h : hosts) {
+        const std::string dir = std::string(record != nullptr ? record : VEXLAN_FIXTURES) + "/instances-" + h.name;
+        cimhost::Host host;
+        startProvider(host, kLogsOn, h.description, "Vexlan_Adapter_ComputerSystem");
+        for (const std::string& cls : classes) {
+            const std::string text = render(host, cls);
+            if (record != nullptr)
+                std::ofstream(dir + "/" + cls + ".mof") << text;
+            else
+                EXPECT_EQ(text, readFile(dir + "/" + cls + ".mof")) << h.name << ": " << cls;
+        }
+        ASSERT_TRUE(host.unload(true).ok());
+        zorap_sim_reset();
+    }
+}
+
+}  // namespace
