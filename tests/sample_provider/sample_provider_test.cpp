@@ -1,8 +1,8 @@
 // The sample provider loaded by the embedded host in strict mode, as each
 // of the two server flavours calls it: every operation kind, the CMPI
 // types that cross the interface, a thrown status, the property filter,
-// the provider's lifecycle and what its library exports.
-#include "cimhost/cli.h"
+// the provider's lifecycle and what its library exports. The cimhost command
+// over this provider, verb by verb, is host/tests/cimhost_cli_test.sh.
 #include "cimhost/host.h"
 #include "sample_host.h"
 #include "cmpidt.h"
@@ -10,12 +10,8 @@
 #include <gtest/gtest.h>
 
 #include <dlfcn.h>
-#include <unistd.h>
 
 #include <algorithm>
-#include <cstdio>
-#include <fstream>
-#include <sstream>
 #include <string>
 #include <vector>
 
@@ -315,85 +311,6 @@ TEST(SampleProviderLibrary, ExportsOnlyTheFactories)
     EXPECT_EQ(dlsym(lib, "_ZN10CmpiStatusC1E6_CMPIrc"), nullptr);
     EXPECT_EQ(dlsym(lib, "_ZN10CmpiBaseMI16driveBaseCleanupEP15_CMPIInstanceMIPK12_CMPIContexth"), nullptr);
     dlclose(lib);
-}
-
-// Every verb of the cimhost command against the sample provider, as a
-// user types them: exit code and a telling piece of the output.
-struct CliRun {
-    int code;
-    std::string out;
-    std::string err;
-};
-
-CliRun cli(std::vector<std::string> words)
-{
-    std::vector<std::string> args = {"cimhost", "-p", SAMPLE_PROVIDER_LIB, "-m", SAMPLE_MOF,
-                                     "-N", kNs, "-s"};
-    args.insert(args.end(), words.begin(), words.end());
-    std::ostringstream out;
-    std::ostringstream err;
-    int code = cimhost::runCli(args, out, err);
-    return CliRun{code, out.str(), err.str()};
-}
-
-TEST(SampleProviderCli, EveryVerb)
-{
-    struct Row {
-        std::vector<std::string> words;
-        int code;
-        const char* expect;  // in stdout, or in stderr for a failure
-    } rows[] = {
-        {{"ei", "Sample_Widget"}, 0, "Port = 8080;"},
-        {{"ein", "Sample_Gadget"}, 0, "Sample_Gadget.Id=\"g3\""},
-        {{"gi", "-P", "Level", "Sample_Widget.Name=\"w1\""}, 0, "Level = 3;"},
-        {{"gi", "Sample_Widget.Name=\"nope\""}, 1, "CMPI_RC_ERR_NOT_FOUND: nope"},
-        {{"ci", "Sample_Widget.Name=\"w9\"", "Port=9"}, 0, "w9"},
-        {{"mi", "Sample_Widget.Name=\"w1\"", "Port=7"}, 0, ""},
-        {{"di", "Sample_Widget.Name=\"w2\""}, 0, ""},
-        {{"di", "Sample_Widget.Name=\"w9\""}, 1, "CMPI_RC_ERR_NOT_FOUND: w9"},
-        {{"ai", "Sample_Gadget.Id=\"g1\""}, 0, "Name = \"w1\";"},
-        {{"ain", "--role", "Owner", "Sample_Widget.Name=\"w1\""}, 0, "Sample_Gadget.Id=\"g2\""},
-        {{"ri", "Sample_Gadget.Id=\"g3\""}, 0, "instance of Sample_WidgetGadget"},
-        {{"rin", "Sample_Widget.Name=\"w1\""}, 0, "Sample_WidgetGadget."},
-        {{"rin", "-f", "sfcb", "Sample_Service.Name=\"svc\""}, 1, "CMPI_RC_ERR_NOT_SUPPORTED: Sample_Service"},
-        {{"cm", "Sample_Service.Name=\"svc\"", "Scale", "Value=4", "Factors={2,3}", "Label=x",
-          "Target=root/sample:Sample_Widget.Name=\"w1\""}, 0, "Result = 20;"},
-        {{"cm", "Sample_Service.Name=\"svc\"", "Fail"}, 1, "CMPI_RC_ERR_INVALID_PARAMETER: Fail was asked for"},
-        {{"listen", "Sample_Alert", "1"}, 0, "instance of Sample_Alert"},
-    };
-    for (const Row& row : rows) {
-        CliRun r = cli(row.words);
-        std::string line;
-        for (const std::string& w : row.words)
-            line += w + " ";
-        EXPECT_EQ(r.code, row.code) << line << "\n" << r.out << r.err;
-        const std::string& where = row.code == 0 ? r.out : r.err;
-        EXPECT_NE(where.find(row.expect), std::string::npos) << line << "\n" << r.out << r.err;
-    }
-}
-
-TEST(SampleProviderCli, BatchKeepsOneProviderAcrossLinesAndReload)
-{
-    char name[] = "/tmp/sample_batch_XXXXXX";
-    int fd = mkstemp(name);
-    ASSERT_GE(fd, 0);
-    close(fd);
-    {
-        std::ofstream f(name);
-        f << "# one provider for all lines\n"
-          << "di Sample_Widget.Name=\"w2\"\n"
-          << "ein Sample_Widget\n"
-          << "reload\n"
-          << "ein Sample_Widget\n";
-    }
-    CliRun r = cli({"batch", name});
-    std::remove(name);
-    EXPECT_EQ(r.code, 0) << r.err;
-    // Deleted in the first life: one widget listed; after the reload both.
-    const std::string w2 = "Sample_Widget.Name=\"w2\"";
-    size_t first = r.out.find(w2);
-    ASSERT_NE(first, std::string::npos) << r.out;
-    EXPECT_EQ(r.out.find(w2, first + 1), std::string::npos) << r.out;
 }
 
 } // namespace
