@@ -74,7 +74,7 @@ protected:
 };
 
 // What each class shows on this host is compared whole in
-// tests/provider/default_host_test.cpp; here what getInstance finds.
+// tests/provider/recorded_hosts_test.cpp; here what getInstance finds.
 TEST_F(FCDefaultHost, GetInstanceIgnoresCaseStepsOverAnUnfilledSlotAndAMissNamesTheKey)
 {
     const std::string id = "VXA1631K0042_3000027E5A160042_3101027E5A160042";

@@ -59,7 +59,7 @@ protected:
 };
 
 // What each class shows on this host is compared whole in
-// tests/provider/default_host_test.cpp; here what getInstance finds.
+// tests/provider/recorded_hosts_test.cpp; here what getInstance finds.
 TEST_F(NicDefaultHost, GetInstanceFindsKeysWithoutRegardToCase)
 {
     const std::string hostName = expectedHost().name;

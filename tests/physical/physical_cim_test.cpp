@@ -70,7 +70,7 @@ protected:
 };
 
 // What each class shows on this host is compared whole in
-// tests/provider/default_host_test.cpp; here which lists a request rebuilds,
+// tests/provider/recorded_hosts_test.cpp; here which lists a request rebuilds,
 // the deduplication that the log tells, and the property filter.
 TEST_F(PhysicalDefaultHost, ExtentsAndTargetsAreRebuiltForEachRequestTheOthersAreNot)
 {

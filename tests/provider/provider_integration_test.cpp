@@ -217,7 +217,7 @@ protected:
 };
 Host* ComputerSystem::host_ = nullptr;
 
-// The host's properties and their order are compared in default_host_test.cpp.
+// The host's properties and their order are compared in recorded_hosts_test.cpp.
 TEST_F(ComputerSystem, GetInstanceMatchesTheNameWithoutRegardToCaseAndHonoursTheFilter)
 {
     std::string name = expectedHost().name;

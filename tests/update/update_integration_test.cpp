@@ -185,7 +185,7 @@ protected:
 };
 
 // What the identities show on the default host is compared whole in
-// tests/provider/default_host_test.cpp; here what getInstance finds.
+// tests/provider/recorded_hosts_test.cpp; here what getInstance finds.
 TEST_F(SoftwareInventory, GetInstanceReadsTheKeyOfEachSide)
 {
     ObjectPath image = classPath("Vexlan_FCHBA_SoftwareIdentity");
