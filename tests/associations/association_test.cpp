@@ -8,11 +8,9 @@
 #include <strings.h>
 
 #include <algorithm>
-#include <fstream>
 #include <functional>
 #include <map>
 #include <set>
-#include <sstream>
 #include <string>
 #include <vector>
 
@@ -30,26 +28,6 @@ using cimhost::Value;
 using cimhost::formatValue;
 
 namespace {
-
-// The association classes that the provider registers, from the class table.
-std::vector<std::string> associationClasses()
-{
-    std::ifstream in(VEXLAN_CLASS_TABLE);
-    std::vector<std::string> classes;
-    std::string line;
-    while (std::getline(in, line)) {
-        if (line.empty() || line[0] == '#')
-            continue;
-        std::vector<std::string> cols;
-        std::stringstream s(line);
-        std::string col;
-        while (std::getline(s, col, '\t'))
-            cols.push_back(col);
-        if (cols.size() > 3 && cols[3].find("association") != std::string::npos)
-            classes.push_back(cols[0]);
-    }
-    return classes;
-}
 
 // An object by class and keys; namespace and host don't count.
 std::string identity(const ObjectPath& p)
@@ -125,7 +103,7 @@ protected:
 // build left empty) are the only ones a search can't reach.
 TEST_F(Associations, EveryEnumeratedPairIsFoundFromBothEnds)
 {
-    const std::vector<std::string> classes = associationClasses();
+    const std::vector<std::string> classes = providerClasses(host()).associations;
     ASSERT_EQ(classes.size(), 55u);
     // From the computer system the join compares each port's MAC with the
     // system's Name, so only the way back finds these pairs.

@@ -165,6 +165,18 @@ cimhost::ObjectPath classPath(const std::string& className)
     return p;
 }
 
+Classes providerClasses(cimhost::Host& host)
+{
+    Classes out;
+    for (const std::string& cls : host.classes().classNames()) {
+        const cimhost::ClassDecl* decl = host.classes().find(cls);
+        if (cls.rfind("Vexlan", 0) != 0 || decl == nullptr || decl->indication)
+            continue;
+        (decl->association ? out.associations : out.instances).push_back(cls);
+    }
+    return out;
+}
+
 cimhost::ObjectPath hostPath(const cimhost::Value& name)
 {
     cimhost::ObjectPath p = classPath("Vexlan_Adapter_ComputerSystem");

@@ -65,6 +65,14 @@ bool waitForLog(const std::string& text, std::chrono::seconds limit, int occurre
 void prepareHost(cimhost::Host& host, cimhost::Flavour flavour = cimhost::Flavour::Pegasus);
 
 cimhost::ObjectPath classPath(const std::string& className);
+
+// The Vexlan classes of the loaded class definitions that the provider
+// serves (indications aside): instance classes and associations.
+struct Classes {
+    std::vector<std::string> instances;
+    std::vector<std::string> associations;
+};
+Classes providerClasses(cimhost::Host& host);
 // The path of the host's computer system with the given Name key value.
 cimhost::ObjectPath hostPath(const cimhost::Value& name);
 

@@ -26,26 +26,6 @@ using cimhost::OpResult;
 
 namespace {
 
-// The instance classes of the class table, in its order.
-std::vector<std::string> instanceClasses()
-{
-    std::ifstream in(VEXLAN_CLASS_TABLE);
-    std::vector<std::string> classes;
-    std::string line;
-    while (std::getline(in, line)) {
-        if (line.empty() || line[0] == '#')
-            continue;
-        std::vector<std::string> cols;
-        std::stringstream s(line);
-        std::string col;
-        while (std::getline(s, col, '\t'))
-            cols.push_back(col);
-        if (cols.size() > 3 && cols[3].rfind("instance", 0) == 0 && cols[3].find("association") == std::string::npos)
-            classes.push_back(cols[0]);
-    }
-    return classes;
-}
-
 void replaceAll(std::string& text, const std::string& from, const std::string& to)
 {
     if (from.empty())
@@ -85,8 +65,6 @@ std::string render(cimhost::Host& host, const std::string& cls)
 
 TEST(RecordedInstances, EveryClassShowsItsRecordedPathsAndInstancesOnBothHosts)
 {
-    const std::vector<std::string> classes = instanceClasses();
-    ASSERT_EQ(classes.size(), 33u);
     const std::string sysfs = std::string("{\"source\": \"sysfs\", \"root\": \"") + VEXLAN_FIXTURES + "/sysfs-host\"}";
     const struct {
         const char* name;
@@ -97,6 +75,8 @@ TEST(RecordedInstances, EveryClassShowsItsRecordedPathsAndInstancesOnBothHosts)
         const std::string dir = std::string(record != nullptr ? record : VEXLAN_FIXTURES) + "/instances-" + h.name;
         cimhost::Host host;
         startProvider(host, kLogsOn, h.description, "Vexlan_Adapter_ComputerSystem");
+        const std::vector<std::string> classes = providerClasses(host).instances;
+        ASSERT_EQ(classes.size(), 33u);
         for (const std::string& cls : classes) {
             const std::string text = render(host, cls);
             if (record != nullptr)

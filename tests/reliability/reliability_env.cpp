@@ -107,18 +107,6 @@ bool pollsSettled()
     return true;
 }
 
-Classes providerClasses(Host& host)
-{
-    Classes out;
-    for (const std::string& cls : host.classes().classNames()) {
-        const cimhost::ClassDecl* decl = host.classes().find(cls);
-        if (cls.rfind("Vexlan", 0) != 0 || decl == nullptr || decl->indication)
-            continue;
-        (decl->association ? out.associations : out.instances).push_back(cls);
-    }
-    return out;
-}
-
 Counts countAll(Host& host, const Classes& classes)
 {
     Counts counts;
