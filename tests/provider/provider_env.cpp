@@ -15,6 +15,14 @@ namespace provtest {
 
 const char* const kLogPath = "/opt/Vexlan_Corporation/CNAProviders/log/Vexlan_CNA_Provider.log";
 
+std::string fileText(const std::string& path)
+{
+    std::ifstream in(path, std::ios::binary);
+    std::ostringstream text;
+    text << in.rdbuf();
+    return text.str();
+}
+
 void writeFile(const std::string& path, const std::string& text)
 {
     std::ofstream out(path, std::ios::trunc);

@@ -27,6 +27,8 @@ constexpr const char* kLogsOn = "DebugLog=1\nErrorLog=1\n";
 // working directory (poll interval). An empty text leaves a file out.
 void writeSettings(const std::string& optSettings, const std::string& cwdSettings);
 void writeFile(const std::string& path, const std::string& text);
+// A file's text ("" when it can't be read).
+std::string fileText(const std::string& path);
 void removeLog();
 
 // What a careless or hostile administrator may leave where the provider

@@ -1,6 +1,7 @@
 // Every instance class as a client's ein and ei show it, against the text kept
-// in tests/fixtures/instances-<host>, for two hosts: the adapter library's
-// default description and the sysfs tree of tests/fixtures/sysfs-host. The
+// in tests/fixtures/instances-<host>, for four hosts: the adapter library's
+// default description, the sysfs tree of tests/fixtures/sysfs-host, and the
+// NIC and update test adapters of tests/fixtures/descriptions. The
 // paths with their keys in order, then each instance with its properties in
 // order and their values (the strict host checks each value's CIM type
 // against the class). What depends on the machine (the host's name and its
@@ -34,14 +35,6 @@ void replaceAll(std::string& text, const std::string& from, const std::string& t
         text.replace(at, from.size(), to);
 }
 
-std::string readFile(const std::string& path)
-{
-    std::ifstream in(path);
-    std::ostringstream text;
-    text << in.rdbuf();
-    return in ? text.str() : "<no file " + path + ">";
-}
-
 // ein then ei of the class, as text, with the machine's values replaced.
 std::string render(cimhost::Host& host, const std::string& cls)
 {
@@ -63,13 +56,17 @@ std::string render(cimhost::Host& host, const std::string& cls)
     return text;
 }
 
-TEST(RecordedInstances, EveryClassShowsItsRecordedPathsAndInstancesOnBothHosts)
+TEST(RecordedInstances, EveryClassShowsItsRecordedPathsAndInstancesOnEachHost)
 {
-    const std::string sysfs = std::string("{\"source\": \"sysfs\", \"root\": \"") + VEXLAN_FIXTURES + "/sysfs-host\"}";
+    const std::string fixtures = VEXLAN_FIXTURES;
+    const std::string sysfs = "{\"source\": \"sysfs\", \"root\": \"" + fixtures + "/sysfs-host\"}";
+    const std::string nic = fileText(fixtures + "/descriptions/nic-adapters.json");
+    const std::string update = fileText(fixtures + "/descriptions/update-adapters.json");
     const struct {
         const char* name;
         const char* description;  // null: the default one
-    } hosts[] = {{"default", nullptr}, {"sysfs", sysfs.c_str()}};
+    } hosts[] = {{"default", nullptr}, {"sysfs", sysfs.c_str()}, {"nic-adapters", nic.c_str()},
+                 {"update-adapters", update.c_str()}};
     const char* record = std::getenv("VEXLAN_RECORD_INSTANCES");
     for (const auto& h : hosts) {
         const std::string dir = std::string(record != nullptr ? record : VEXLAN_FIXTURES) + "/instances-" + h.name;
@@ -82,7 +79,7 @@ TEST(RecordedInstances, EveryClassShowsItsRecordedPathsAndInstancesOnBothHosts)
             if (record != nullptr)
                 std::ofstream(dir + "/" + cls + ".mof") << text;
             else
-                EXPECT_EQ(text, readFile(dir + "/" + cls + ".mof")) << h.name << ": " << cls;
+                EXPECT_EQ(text, fileText(dir + "/" + cls + ".mof")) << h.name << ": " << cls;
         }
         ASSERT_TRUE(host.unload(true).ok());
         zorap_sim_reset();

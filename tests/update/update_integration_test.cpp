@@ -37,14 +37,6 @@ const char kJobFile[] = "/var/tmp/vxln_cna_provider.config";
 const char kFcSerial[] = "VXA1631K0042";    // dual-port 16G HBA of the default host
 const char kNicSerial[] = "VXC2447M0193";   // the CNA with NIC functions
 
-std::string readFile(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::stringstream s;
-    s << in.rdbuf();
-    return s.str();
-}
-
 // A file of `size` bytes under /var/tmp.
 std::string imageOf(std::size_t size, const std::string& name = "image.bin")
 {
@@ -148,36 +140,9 @@ const Instance* withId(const std::vector<Instance>& all, const std::string& id)
     return nullptr;
 }
 
-int countSuffix(const std::vector<Instance>& all, const std::string& serial, const std::string& suffix)
-{
-    int n = 0;
-    for (const Instance& i : all) {
-        const std::string id = text(i, "InstanceID");
-        if (id.find("_" + serial + "_") != std::string::npos && id.size() >= suffix.size() &&
-            id.compare(id.size() - suffix.size(), suffix.size(), suffix) == 0)
-            ++n;
-    }
-    return n;
-}
-
 }  // namespace
 
 // ---- Software identities -------------------------------------------------------------
-
-// Two adapters of the tests' own: an old chip with a firmware version the
-// option ROM marks valid, and a newer one whose flash image was released in
-// December.
-const char kOwnAdapters[] = R"({"flash": {"durationMs": 10}, "adapters": [
-  {"model": "VXF250", "serialNumber": "VXOLD0001", "deviceSerial": "VXOLD0001", "chip": "RSX-250",
-   "driverVersion": " 9.1.0 ", "firmwareVersion": "3.2.1", "optionRom": {"bios": "1.0", "firmware": "3.02.01"},
-   "ports": [{"protocols": [{"type": "fc", "portIndex": 0, "nodeWWN": "30:00:02:7e:5a:00:00:01",
-                             "portWWN": "31:00:02:7e:5a:00:00:01", "state": "online"}]}]},
-  {"model": "VXF1610", "serialNumber": "VXDEC0002", "chip": "RSX-1610", "driverVersion": "10.0",
-   "firmwareVersion": "8.0.0", "mbiVersion": "5.01.03", "mbiDate": "2024-12-20",
-   "optionRom": {"bios": "2.0", "firmware": "8.00.00"},
-   "vpd": {"productId": "Vexlan 16Gb HBA", "SN": "VXDEC0002", "V9": "050103"},
-   "ports": [{"protocols": [{"type": "fc", "portIndex": 0, "nodeWWN": "30:00:02:7e:5a:00:00:02",
-                             "portWWN": "31:00:02:7e:5a:00:00:02", "state": "online"}]}]}]})";
 
 class SoftwareInventory : public ProviderSuite<SoftwareInventory> {
 protected:
@@ -218,34 +183,6 @@ TEST_F(SoftwareInventory, GetInstanceReadsTheKeyOfEachSide)
         p.setKey("InstanceID", Value::fromString(key));
         EXPECT_EQ(host().getInstance(p).rc, CMPI_RC_ERR_NOT_FOUND) << key;
     }
-}
-
-class OwnAdapterInventory : public ProviderSuite<OwnAdapterInventory> {
-protected:
-    static void SetUpTestSuite() { startSuite(kLogsOn, kOwnAdapters, "Vexlan_Adapter_ComputerSystem"); }
-};
-
-TEST_F(OwnAdapterInventory, OldChipsShowNoFlashFirmwareAndDecemberRollsIntoJanuary)
-{
-    const OpResult r = enumerate(host(), "Vexlan_FCHBA_SoftwareIdentity");
-    const std::string hostName = expectedHost().name;
-    const Instance* firmware = withId(r.instances, hostName + "_VXOLD0001_3000027E5A000001__FlashFirmware");
-    ASSERT_NE(firmware, nullptr);
-    EXPECT_EQ(text(*firmware, "VersionString"), "N/A");
-    const Instance* driver = withId(r.instances, hostName + "_VXOLD0001_3000027E5A000001__Driver");
-    ASSERT_NE(driver, nullptr);
-    EXPECT_EQ(text(*driver, "VersionString"), "9.1.0");  // trimmed
-    EXPECT_EQ(countSuffix(r.instances, "VXOLD0001", "__FlashImage"), 0);
-
-    const Instance* newer = withId(r.instances, hostName + "_VXDEC0002_3000027E5A000002__FlashFirmware");
-    ASSERT_NE(newer, nullptr);
-    EXPECT_EQ(text(*newer, "VersionString"), "8.00.00");
-    const Instance* image = withId(r.instances, hostName + "_VXDEC0002__FlashImage");
-    ASSERT_NE(image, nullptr);
-    EXPECT_EQ(text(*image, "VersionString"), "5.1.3");
-    EXPECT_EQ(formatValue(*image->property("ReleaseDate")).substr(1, 8), "20250120");
-    // Eight slots per function, the rest left out of the enumeration.
-    EXPECT_EQ(r.instances.size(), 5u + 6u);
 }
 
 TEST_F(SoftwareInventory, ServiceGetInstanceNeedsTheHostsNameAndTheJobsClassAnswersNothing)
@@ -431,7 +368,7 @@ TEST_F(UpdateJobs, AnFCJobRunsThenCompletesOrFailsAndIsSaved)
     EXPECT_EQ(waitJobState(host(), c, 7), 7u);
     EXPECT_GT(jobOf(host(), c).instances[0].property("TimeOfLastStateChange")->dt.usec, started);
     const std::string id = c.out("Job")->ref->key("InstanceID")->s;
-    const std::string file = readFile(kJobFile);
+    const std::string file = fileText(kJobFile);
     EXPECT_NE(file.find(id + "#STATUS=2\n" + id + "#RESULT=0\n" + id + "#END=1\n"), std::string::npos) << file;
 
     // A failing write ends the job in the exception state with the code.
@@ -440,7 +377,7 @@ TEST_F(UpdateJobs, AnFCJobRunsThenCompletesOrFailsAndIsSaved)
     ASSERT_EQ(bad.value(), 4096u);
     EXPECT_EQ(waitJobState(host(), bad, 10), 10u);
     const std::string badId = bad.out("Job")->ref->key("InstanceID")->s;
-    EXPECT_NE(readFile(kJobFile).find(badId + "#RESULT=11\n"), std::string::npos);
+    EXPECT_NE(fileText(kJobFile).find(badId + "#RESULT=11\n"), std::string::npos);
     EXPECT_EQ(enumerate(host(), "Vexlan_Adapter_ConcreteJob").instances.size(), 2u);
 }
 
@@ -512,7 +449,7 @@ TEST_F(UpdateLifecycle, AnUnloadDuringAJobWaitsForItsEndAndAReloadShowsIt)
             ASSERT_TRUE(host.unload(true).ok());
             EXPECT_EQ(zorap_sim_flash_writes_running(), 0u);
             EXPECT_EQ(threadCount(), threadsBefore) << nic;
-            EXPECT_NE(readFile(kJobFile).find(id + "#STATUS=2\n"), std::string::npos) << nic;
+            EXPECT_NE(fileText(kJobFile).find(id + "#STATUS=2\n"), std::string::npos) << nic;
             ASSERT_TRUE(host.load(PROVIDER_LIBRARY, kProviderName).ok());
             EXPECT_EQ(jobState(host, c), 7u) << "the reloaded provider shows the job, " << nic;
         }
