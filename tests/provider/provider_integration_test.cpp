@@ -163,23 +163,6 @@ TEST_F(Lifecycle, AnUnloadWithoutCleanupLeavesNoThreadRunning)
     EXPECT_EQ(countLog("Vexlan_CNA_Provider destructor complete"), 2);
 }
 
-TEST_F(Lifecycle, ReloadInOneProcessStartsCleanly)
-{
-    Host host;
-    prepareHost(host);
-    ASSERT_EQ(enumerateHost(host).instances.size(), 1u);
-    ASSERT_TRUE(host.unload(true).ok());
-    ASSERT_TRUE(host.load(PROVIDER_LIBRARY, kProviderName).ok());
-    OpResult r = enumerateHost(host);
-    ASSERT_TRUE(r.ok()) << r.message;
-    EXPECT_EQ(r.instances.size(), 1u);
-    EXPECT_EQ(countLog("***** Vexlan_CNA_Provider initialize was called *****"), 2);
-    EXPECT_EQ(calls(ZORAP_FN_Initialize), 2u);
-    ASSERT_TRUE(host.unload(true).ok());
-    EXPECT_EQ(calls(ZORAP_FN_Uninitialize), 2u);
-    EXPECT_EQ(countLog("Vexlan_CNA_Provider destructor complete"), 2);
-}
-
 TEST_F(Lifecycle, WithoutSettingsBothLogsStayOffAndThePollWaits180Seconds)
 {
     writeSettings("", "");
