@@ -23,6 +23,23 @@ std::string fileText(const std::string& path)
     return text.str();
 }
 
+void expectAsKept(const std::string& text, const std::string& path, const char* recordDir)
+{
+    if (recordDir != nullptr) {
+        std::ofstream(std::string(recordDir) + path.substr(path.rfind('/'))) << text;
+        return;
+    }
+    EXPECT_EQ(text, fileText(path)) << path;
+}
+
+void replaceAll(std::string& text, const std::string& from, const std::string& to)
+{
+    if (from.empty())
+        return;
+    for (size_t at = text.find(from); at != std::string::npos; at = text.find(from, at + to.size()))
+        text.replace(at, from.size(), to);
+}
+
 void writeFile(const std::string& path, const std::string& text)
 {
     std::ofstream out(path, std::ios::trunc);

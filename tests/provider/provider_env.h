@@ -29,6 +29,11 @@ void writeSettings(const std::string& optSettings, const std::string& cwdSetting
 void writeFile(const std::string& path, const std::string& text);
 // A file's text ("" when it can't be read).
 std::string fileText(const std::string& path);
+// Compares `text` with the file kept at `path`; with `recordDir` set (from an
+// environment variable) writes it to recordDir/<the file's name> instead.
+void expectAsKept(const std::string& text, const std::string& path, const char* recordDir);
+// Replaces every occurrence of `from` in `text`.
+void replaceAll(std::string& text, const std::string& from, const std::string& to);
 void removeLog();
 
 // What a careless or hostile administrator may leave where the provider

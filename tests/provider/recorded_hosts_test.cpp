@@ -12,7 +12,6 @@
 #include <gtest/gtest.h>
 
 #include <cstdlib>
-#include <fstream>
 #include <sstream>
 #include <string>
 #include <vector>
@@ -26,14 +25,6 @@ using namespace provtest;
 using cimhost::OpResult;
 
 namespace {
-
-void replaceAll(std::string& text, const std::string& from, const std::string& to)
-{
-    if (from.empty())
-        return;
-    for (size_t at = text.find(from); at != std::string::npos; at = text.find(from, at + to.size()))
-        text.replace(at, from.size(), to);
-}
 
 // ein then ei of the class, as text, with the machine's values replaced.
 std::string render(cimhost::Host& host, const std::string& cls)
@@ -69,18 +60,15 @@ TEST(RecordedInstances, EveryClassShowsItsRecordedPathsAndInstancesOnEachHost)
                  {"update-adapters", update.c_str()}};
     const char* record = std::getenv("VEXLAN_RECORD_INSTANCES");
     for (const auto& h : hosts) {
-        const std::string dir = std::string(record != nullptr ? record : VEXLAN_FIXTURES) + "/instances-" + h.name;
+        const std::string dir = "/instances-" + std::string(h.name);
+        const std::string recordDir = record != nullptr ? record + dir : std::string();
         cimhost::Host host;
         startProvider(host, kLogsOn, h.description, "Vexlan_Adapter_ComputerSystem");
         const std::vector<std::string> classes = providerClasses(host).instances;
         ASSERT_EQ(classes.size(), 33u);
-        for (const std::string& cls : classes) {
-            const std::string text = render(host, cls);
-            if (record != nullptr)
-                std::ofstream(dir + "/" + cls + ".mof") << text;
-            else
-                EXPECT_EQ(text, fileText(dir + "/" + cls + ".mof")) << h.name << ": " << cls;
-        }
+        for (const std::string& cls : classes)
+            expectAsKept(render(host, cls), fixtures + dir + "/" + cls + ".mof",
+                         record != nullptr ? recordDir.c_str() : nullptr);
         ASSERT_TRUE(host.unload(true).ok());
         zorap_sim_reset();
     }
