@@ -69,9 +69,6 @@ std::string servicePathText(const Side& side)
 // InstallFromURI with {5, 32768}; the job's InstanceID, empty when no job started.
 std::string startJob(Host& host, const Side& side)
 {
-    ObjectPath service;
-    std::string error;
-    EXPECT_TRUE(cimhost::parsePath(servicePathText(side), service, error)) << error;
     ObjectPath target = classPath(side.controller);
     target.setKey("DeviceID", Value::fromString(side.deviceId));
     const std::vector<NamedValue> in = {
@@ -79,7 +76,7 @@ std::string startJob(Host& host, const Side& side)
         {"Target", Value::fromRef(target)},
         {"InstallOptions", Value::arrayOf(Type::UInt16, {Value::fromUnsigned(Type::UInt16, 5),
                                                          Value::fromUnsigned(Type::UInt16, 32768)})}};
-    const OpResult r = host.invokeMethod(service, "InstallFromURI", in);
+    const OpResult r = host.invokeMethod(servicePath(side.nic), "InstallFromURI", in);
     EXPECT_TRUE(r.ok()) << cimhost::statusLine(r);
     if (r.data.empty() || r.data[0].u != 4096)
         return std::string();
@@ -99,14 +96,9 @@ OpResult jobInstance(Host& host, const std::string& id)
 
 std::uint64_t waitJobState(Host& host, const std::string& id, std::uint64_t wanted)
 {
-    std::uint64_t state = 0;
-    for (int i = 0; i < 200 && state != wanted; ++i) {
-        const OpResult r = jobInstance(host, id);
-        state = r.ok() && r.instances.size() == 1 ? r.instances[0].property("JobState")->u : 0;
-        if (state != wanted)
-            std::this_thread::sleep_for(milliseconds(25));
-    }
-    return state;
+    ObjectPath p = classPath("Vexlan_Adapter_ConcreteJob");
+    p.setKey("InstanceID", Value::fromString(id));
+    return provtest::waitJobState(host, p, wanted);
 }
 
 int subscribe(Host& host, const char* cls)

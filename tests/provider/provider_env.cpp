@@ -210,6 +210,36 @@ cimhost::ObjectPath hostPath(const cimhost::Value& name)
     return p;
 }
 
+cimhost::ObjectPath servicePath(bool nic)
+{
+    const char* cls = nic ? "Vexlan_NIC_SoftwareInstallationService" : "Vexlan_FCHBA_SoftwareInstallationService";
+    cimhost::ObjectPath p = classPath(cls);
+    p.setKey("SystemCreationClassName", cimhost::Value::fromString("Vexlan_Adapter_ComputerSystem"));
+    p.setKey("SystemName", cimhost::Value::fromString(expectedHost().name));
+    p.setKey("CreationClassName", cimhost::Value::fromString(cls));
+    p.setKey("Name", cimhost::Value::fromString("CNA_SW_INSTALLER"));
+    return p;
+}
+
+std::uint64_t jobState(cimhost::Host& host, const cimhost::ObjectPath& job)
+{
+    if (job.className.empty())
+        return 0;
+    const cimhost::OpResult r = host.getInstance(job);
+    const cimhost::Value* state = r.ok() && r.instances.size() == 1 ? r.instances[0].property("JobState") : nullptr;
+    return state != nullptr ? state->u : 0;
+}
+
+std::uint64_t waitJobState(cimhost::Host& host, const cimhost::ObjectPath& job, std::uint64_t wanted)
+{
+    std::uint64_t state = jobState(host, job);
+    for (int i = 0; i < 200 && state != wanted; ++i) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(25));
+        state = jobState(host, job);
+    }
+    return state;
+}
+
 ExpectedHost expectedHost()
 {
     char name[256] = {};

@@ -5,6 +5,7 @@
 
 #include <chrono>
 #include <cstddef>
+#include <cstdint>
 #include <functional>
 #include <string>
 #include <vector>
@@ -82,6 +83,13 @@ struct Classes {
 Classes providerClasses(cimhost::Host& host);
 // The path of the host's computer system with the given Name key value.
 cimhost::ObjectPath hostPath(const cimhost::Value& name);
+
+// The installation service of the FC HBAs or of the NIC functions.
+cimhost::ObjectPath servicePath(bool nic);
+// The JobState of the update job at `job`, 0 when it can't be read; and the
+// wait until it is `wanted` (5 s at most), which gives the last state read.
+std::uint64_t jobState(cimhost::Host& host, const cimhost::ObjectPath& job);
+std::uint64_t waitJobState(cimhost::Host& host, const cimhost::ObjectPath& job, std::uint64_t wanted);
 
 // What the provider should report for the host: the first address of the
 // host's name when the resolver knows it (NameFormat "IP"), else the plain

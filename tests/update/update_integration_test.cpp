@@ -48,17 +48,6 @@ std::string imageOf(std::size_t size, const std::string& name = "image.bin")
     return path;
 }
 
-ObjectPath servicePath(bool nic)
-{
-    const char* cls = nic ? "Vexlan_NIC_SoftwareInstallationService" : "Vexlan_FCHBA_SoftwareInstallationService";
-    ObjectPath p = classPath(cls);
-    p.setKey("SystemCreationClassName", Value::fromString("Vexlan_Adapter_ComputerSystem"));
-    p.setKey("SystemName", Value::fromString(expectedHost().name));
-    p.setKey("CreationClassName", Value::fromString(cls));
-    p.setKey("Name", Value::fromString("CNA_SW_INSTALLER"));
-    return p;
-}
-
 Value controllerRef(bool nic, const std::string& deviceId, const char* cls = nullptr)
 {
     ObjectPath p = classPath(cls != nullptr ? cls : nic ? "Vexlan_NIC_PortController" : "Vexlan_FCHBA_PortController");
@@ -98,32 +87,26 @@ Call installFromURI(Host& host, bool nic, const std::string& uri, const std::str
 const std::string fcDevice = kFcSerial;
 const std::string nicDevice = std::string(kNicSerial) + "_NIC";
 
-// The job that a method's "Job" names, read back.
-OpResult jobOf(Host& host, const Call& call)
+// The job that a method's "Job" names: its path, read back, its state.
+ObjectPath jobPath(const Call& call)
 {
     const Value* job = call.out("Job");
-    if (job == nullptr || !job->ref)
-        return OpResult{};
-    return host.getInstance(*job->ref);
+    return job != nullptr && job->ref ? *job->ref : ObjectPath{};
+}
+
+OpResult jobOf(Host& host, const Call& call)
+{
+    return host.getInstance(jobPath(call));
 }
 
 std::uint64_t jobState(Host& host, const Call& call)
 {
-    OpResult r = jobOf(host, call);
-    if (!r.ok() || r.instances.size() != 1)
-        return 0;
-    return r.instances[0].property("JobState")->u;
+    return provtest::jobState(host, jobPath(call));
 }
 
 std::uint64_t waitJobState(Host& host, const Call& call, std::uint64_t wanted)
 {
-    std::uint64_t state = 0;
-    for (int i = 0; i < 100 && state != wanted; ++i) {
-        state = jobState(host, call);
-        if (state != wanted)
-            std::this_thread::sleep_for(50ms);
-    }
-    return state;
+    return provtest::waitJobState(host, jobPath(call), wanted);
 }
 
 std::string text(const Instance& inst, const std::string& name)
