@@ -710,39 +710,21 @@ static void start(const CMPIBroker *b) {
 #endif
 }
 
-CMPIInstanceMI *Tiny_Create_InstanceMI(const CMPIBroker *b, const CMPIContext *ctx, CMPIStatus *rc) {
-    static CMPIInstanceMI mi = {NULL, &instFT};
-    (void)ctx;
-    start(b);
-    if (rc) *rc = ok();
-    return &mi;
-}
-
+/* Each factory hands out its one MI structure. */
+#define TINY_FACTORY(Kind, table)                                                              \
+    CMPI##Kind##MI *Tiny_Create_##Kind##MI(const CMPIBroker *b, const CMPIContext *ctx, CMPIStatus *rc) { \
+        static CMPI##Kind##MI mi = {NULL, &table};                                             \
+        (void)ctx;                                                                             \
+        start(b);                                                                              \
+        if (rc) *rc = ok();                                                                    \
+        return &mi;                                                                            \
+    }
+TINY_FACTORY(Instance, instFT)
 #ifndef TINY_NO_ASSOC
-CMPIAssociationMI *Tiny_Create_AssociationMI(const CMPIBroker *b, const CMPIContext *ctx, CMPIStatus *rc) {
-    static CMPIAssociationMI mi = {NULL, &assocFT};
-    (void)ctx;
-    start(b);
-    if (rc) *rc = ok();
-    return &mi;
-}
+TINY_FACTORY(Association, assocFT)
 #endif
-
-CMPIMethodMI *Tiny_Create_MethodMI(const CMPIBroker *b, const CMPIContext *ctx, CMPIStatus *rc) {
-    static CMPIMethodMI mi = {NULL, &methFT};
-    (void)ctx;
-    start(b);
-    if (rc) *rc = ok();
-    return &mi;
-}
-
-CMPIIndicationMI *Tiny_Create_IndicationMI(const CMPIBroker *b, const CMPIContext *ctx, CMPIStatus *rc) {
-    static CMPIIndicationMI mi = {NULL, &indFT};
-    (void)ctx;
-    start(b);
-    if (rc) *rc = ok();
-    return &mi;
-}
+TINY_FACTORY(Method, methFT)
+TINY_FACTORY(Indication, indFT)
 
 #ifdef TINY_GENERIC
 CMPIInstanceMI *_Generic_Create_InstanceMI(const CMPIBroker *b, const CMPIContext *ctx, const char *name,

@@ -8,11 +8,9 @@
 #include <strings.h>
 
 #include <algorithm>
-#include <fstream>
 #include <functional>
 #include <map>
 #include <set>
-#include <sstream>
 #include <string>
 #include <vector>
 
@@ -30,26 +28,6 @@ using cimhost::Value;
 using cimhost::formatValue;
 
 namespace {
-
-// The association classes that the provider registers, from the class table.
-std::vector<std::string> associationClasses()
-{
-    std::ifstream in(VEXLAN_CLASS_TABLE);
-    std::vector<std::string> classes;
-    std::string line;
-    while (std::getline(in, line)) {
-        if (line.empty() || line[0] == '#')
-            continue;
-        std::vector<std::string> cols;
-        std::stringstream s(line);
-        std::string col;
-        while (std::getline(s, col, '\t'))
-            cols.push_back(col);
-        if (cols.size() > 3 && cols[3].find("association") != std::string::npos)
-            classes.push_back(cols[0]);
-    }
-    return classes;
-}
 
 // An object by class and keys; namespace and host don't count.
 std::string identity(const ObjectPath& p)
@@ -125,7 +103,7 @@ protected:
 // build left empty) are the only ones a search can't reach.
 TEST_F(Associations, EveryEnumeratedPairIsFoundFromBothEnds)
 {
-    const std::vector<std::string> classes = associationClasses();
+    const std::vector<std::string> classes = providerClasses(host()).associations;
     ASSERT_EQ(classes.size(), 55u);
     // From the computer system the join compares each port's MAC with the
     // system's Name, so only the way back finds these pairs.
@@ -140,8 +118,7 @@ TEST_F(Associations, EveryEnumeratedPairIsFoundFromBothEnds)
     for (const std::string& cls : classes) {
         OpResult pairs = host().enumerateInstanceNames(classPath(cls));
         expectClean(pairs, cls);
-        if (!hostDependent.count(cls))
-            EXPECT_FALSE(pairs.paths.empty()) << cls << " has no pairs on the default host";
+        EXPECT_TRUE(hostDependent.count(cls) || !pairs.paths.empty()) << cls << " has no pairs on the default host";
         OpResult full = host().enumerateInstances(classPath(cls));
         expectClean(full, cls);
         EXPECT_EQ(full.instances.size(), pairs.paths.size()) << cls;
@@ -162,8 +139,8 @@ TEST_F(Associations, EveryEnumeratedPairIsFoundFromBothEnds)
             const OpResult from2 = host().associatorNames(end2, assoc(cls));
             expectClean(from1, cls + " from " + end1.className);
             expectClean(from2, cls + " from " + end2.className);
-            if (!onlyFromSecondEnd.count(cls))
-                EXPECT_TRUE(identities(from1.paths).count(identity(end2))) << cls << ": " << identity(end1);
+            EXPECT_TRUE(onlyFromSecondEnd.count(cls) || identities(from1.paths).count(identity(end2)))
+                << cls << ": " << identity(end1);
             EXPECT_TRUE(identities(from2.paths).count(identity(end1))) << cls << ": " << identity(end2);
             const OpResult refs = host().referenceNames(onlyFromSecondEnd.count(cls) ? end2 : end1, result(cls));
             expectClean(refs, cls);
@@ -239,8 +216,9 @@ TEST_F(Associations, ParentClassWalksAnswerAlikeInBothServers)
         EXPECT_FALSE(sfcb.paths.empty()) << what;
         EXPECT_EQ(identities(sfcb.paths), identities(pegasus.paths)) << what;
         EXPECT_EQ(sfcb.paths.size(), pegasus.paths.size()) << what;
-        if (!w.classes.empty())
+        if (!w.classes.empty()) {
             EXPECT_EQ(classesOf(sfcb.paths), w.classes) << what;
+        }
     }
     // The ports a client wants from the system: the FC ports are all there.
     AssocParams ports = assoc("CIM_SystemDevice");

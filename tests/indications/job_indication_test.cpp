@@ -7,6 +7,8 @@
 
 #include <atomic>
 #include <chrono>
+#include <cstdlib>
+#include <memory>
 #include <fstream>
 #include <mutex>
 #include <sstream>
@@ -69,9 +71,6 @@ std::string servicePathText(const Side& side)
 // InstallFromURI with {5, 32768}; the job's InstanceID, empty when no job started.
 std::string startJob(Host& host, const Side& side)
 {
-    ObjectPath service;
-    std::string error;
-    EXPECT_TRUE(cimhost::parsePath(servicePathText(side), service, error)) << error;
     ObjectPath target = classPath(side.controller);
     target.setKey("DeviceID", Value::fromString(side.deviceId));
     const std::vector<NamedValue> in = {
@@ -79,7 +78,7 @@ std::string startJob(Host& host, const Side& side)
         {"Target", Value::fromRef(target)},
         {"InstallOptions", Value::arrayOf(Type::UInt16, {Value::fromUnsigned(Type::UInt16, 5),
                                                          Value::fromUnsigned(Type::UInt16, 32768)})}};
-    const OpResult r = host.invokeMethod(service, "InstallFromURI", in);
+    const OpResult r = host.invokeMethod(servicePath(side.nic), "InstallFromURI", in);
     EXPECT_TRUE(r.ok()) << cimhost::statusLine(r);
     if (r.data.empty() || r.data[0].u != 4096)
         return std::string();
@@ -99,14 +98,9 @@ OpResult jobInstance(Host& host, const std::string& id)
 
 std::uint64_t waitJobState(Host& host, const std::string& id, std::uint64_t wanted)
 {
-    std::uint64_t state = 0;
-    for (int i = 0; i < 200 && state != wanted; ++i) {
-        const OpResult r = jobInstance(host, id);
-        state = r.ok() && r.instances.size() == 1 ? r.instances[0].property("JobState")->u : 0;
-        if (state != wanted)
-            std::this_thread::sleep_for(milliseconds(25));
-    }
-    return state;
+    ObjectPath p = classPath("Vexlan_Adapter_ConcreteJob");
+    p.setKey("InstanceID", Value::fromString(id));
+    return provtest::waitJobState(host, p, wanted);
 }
 
 int subscribe(Host& host, const char* cls)
@@ -134,25 +128,32 @@ const Instance& embedded(const Instance& ind, const char* name)
     return *v->inst;
 }
 
-// The job as an embedded instance: its key, state and progress (-1: unset).
-void expectJob(const Instance& job, const std::string& id, std::uint64_t state, int percent)
+// The indication as MOF text, its embedded jobs with it, kept in
+// tests/fixtures/indications/<name>.mof: identifiers, times, the job's key
+// and name (which holds its start time) and the host's name, which change
+// from run to run, stand as @...@ (the test checks them apart). VEXLAN_RECORD_INDICATIONS=<dir> writes the texts.
+void stabilize(Instance& inst)
 {
-    EXPECT_EQ(job.className(), "Vexlan_Adapter_ConcreteJob");
-    EXPECT_EQ(propertyText(job, "InstanceID"), id);
-    EXPECT_EQ(scalar(job, "JobState", Type::UInt16).u, state);
-    const Value* p = job.property("PercentComplete");
-    if (percent < 0) {
-        EXPECT_TRUE(p == nullptr || p->null) << "PercentComplete of a job that can't know it";
-    } else {
-        EXPECT_TRUE(p != nullptr && !p->null) << "PercentComplete unset";
-        if (p != nullptr && !p->null) {
-            EXPECT_EQ(p->u, static_cast<std::uint64_t>(percent));
+    for (auto& p : inst.properties) {
+        if (p.first == "IndicationIdentifier" || p.first == "IndicationTime" || p.first == "CorrelatedIndications" ||
+            p.first == "TimeOfLastStateChange" || p.first == "Name") {
+            p.second = Value::fromString("@" + p.first + "@");
+        } else if (p.second.type == Type::Instance && p.second.inst) {
+            p.second.inst = std::make_shared<Instance>(*p.second.inst);
+            stabilize(*p.second.inst);
         }
     }
-    const std::vector<std::string> order = {"InstanceID", "Name", "JobState", "TimeOfLastStateChange",
-                                            "TimeBeforeRemoval"};
-    const std::vector<std::string> names = propertyNames(job);
-    EXPECT_EQ(std::vector<std::string>(names.begin(), names.begin() + std::min(names.size(), order.size())), order);
+}
+
+void expectJobIndicationAsKept(const Indication& ind, const std::string& jobId, const std::string& name)
+{
+    Instance copy = ind.instance;
+    stabilize(copy);
+    std::string text = cimhost::formatInstanceMof(copy);
+    replaceAll(text, jobId, "@JOB@");
+    replaceAll(text, expectedHost().name, "@HOST@");
+    expectAsKept(text, std::string(VEXLAN_FIXTURES) + "/indications/" + name + ".mof",
+                 std::getenv("VEXLAN_RECORD_INDICATIONS"));
 }
 
 std::string modelPath(const std::string& id)
@@ -179,10 +180,8 @@ protected:
 
 struct JobCase {
     const Side* side;
-    std::uint32_t result;      // the library's answer to the write
-    std::uint64_t endState;    // 7 or 10
-    int endPercent;            // 100, or -1 for unset
-    std::uint64_t endSeverity;
+    std::uint32_t result;  // the library's answer to the write
+    const char* name;      // of the kept texts: <name>-created, <name>-modified
 };
 
 TEST_P(JobIndications, EachJobSendsItsCreationThenOneModificationOfItsState)
@@ -190,10 +189,10 @@ TEST_P(JobIndications, EachJobSendsItsCreationThenOneModificationOfItsState)
     subscribe(host_, kCreation);
     subscribe(host_, kModification);
     const JobCase cases[] = {
-        {&kFC, 0, 7, 100, 2},
-        {&kNIC, 0, 7, 100, 2},
-        {&kFC, ZORAP_ERR_FLASH_FAILED, 10, -1, 3},
-        {&kNIC, ZORAP_ERR_FLASH_FAILED, 10, -1, 3},
+        {&kFC, 0, "job-fc-completed"},
+        {&kNIC, 0, "job-nic-completed"},
+        {&kFC, ZORAP_ERR_FLASH_FAILED, "job-fc-failed"},
+        {&kNIC, ZORAP_ERR_FLASH_FAILED, "job-nic-failed"},
     };
     for (const JobCase& c : cases) {
         SCOPED_TRACE(std::string(c.side->service) + " result " + std::to_string(c.result));
@@ -207,24 +206,17 @@ TEST_P(JobIndications, EachJobSendsItsCreationThenOneModificationOfItsState)
         EXPECT_LT(Clock::now() - started, milliseconds(500)) << "the creation comes as the job starts";
         const Instance& ci = created.instance;
         EXPECT_TRUE(created.error.empty()) << created.error;
-        EXPECT_EQ(ci.className(), kCreation);
         EXPECT_EQ(ci.path.nameSpace, kNamespace);
         EXPECT_EQ(created.nameSpace, GetParam() == Flavour::Pegasus ? kNamespace : "root/PG_InterOp");
-        EXPECT_EQ(propertyNames(ci),
-                  (std::vector<std::string>{"IndicationIdentifier", "IndicationTime", "PerceivedSeverity",
-                                            "SourceInstance", "SourceInstanceModelPath", "SourceInstanceHost"}));
+        expectJobIndicationAsKept(created, id, std::string(c.name) + "-created");
         const std::string creationId = propertyText(ci, "IndicationIdentifier");
         EXPECT_EQ(creationId.rfind("Vexlan:", 0), 0u) << creationId;
         EXPECT_FALSE(scalar(ci, "IndicationTime", Type::DateTime).dt.interval);
-        EXPECT_EQ(scalar(ci, "PerceivedSeverity", Type::UInt16).u, 2u);
-        expectJob(embedded(ci, "SourceInstance"), id, 4, 0);
         EXPECT_EQ(propertyText(ci, "SourceInstanceModelPath"), modelPath(id));
-        EXPECT_EQ(propertyText(ci, "SourceInstanceHost"), expectedHost().name);
 
         // While it writes, GetInstance shows what the creation showed.
         const OpResult running = jobInstance(host_, id);
         ASSERT_EQ(running.instances.size(), 1u);
-        expectJob(running.instances[0], id, 4, 0);
         EXPECT_EQ(cimhost::formatInstanceMof(running.instances[0]),
                   cimhost::formatInstanceMof(embedded(ci, "SourceInstance")));
 
@@ -233,20 +225,13 @@ TEST_P(JobIndications, EachJobSendsItsCreationThenOneModificationOfItsState)
         EXPECT_GE(Clock::now() - started, milliseconds(550)) << "the modification comes when the write ends";
         const Instance& mi = modified.instance;
         EXPECT_TRUE(modified.error.empty()) << modified.error;
-        EXPECT_EQ(mi.className(), kModification);
-        EXPECT_EQ(propertyNames(mi),
-                  (std::vector<std::string>{"IndicationIdentifier", "IndicationTime", "CorrelatedIndications",
-                                            "PerceivedSeverity", "SourceInstance", "PreviousInstance",
-                                            "SourceInstanceModelPath", "SourceInstanceHost"}));
+        expectJobIndicationAsKept(modified, id, std::string(c.name) + "-modified");
         EXPECT_NE(propertyText(mi, "IndicationIdentifier"), creationId);
         ASSERT_NE(mi.property("CorrelatedIndications"), nullptr);
         ASSERT_EQ(mi.property("CorrelatedIndications")->elems.size(), 1u);
         EXPECT_EQ(mi.property("CorrelatedIndications")->elems[0].s, creationId);
-        EXPECT_EQ(scalar(mi, "PerceivedSeverity", Type::UInt16).u, c.endSeverity);
         const Instance& now = embedded(mi, "SourceInstance");
         const Instance& before = embedded(mi, "PreviousInstance");
-        expectJob(now, id, c.endState, c.endPercent);
-        expectJob(before, id, 4, 0);
         EXPECT_EQ(cimhost::formatInstanceMof(before), cimhost::formatInstanceMof(embedded(ci, "SourceInstance")));
         EXPECT_GT(now.property("TimeOfLastStateChange")->dt.usec, before.property("TimeOfLastStateChange")->dt.usec);
         EXPECT_GE(scalar(mi, "IndicationTime", Type::DateTime).dt.usec,

@@ -13,7 +13,8 @@ function(vexlan_provider_test_program target)
                                           Threads::Threads)
   target_compile_definitions(${target} PRIVATE
     PROVIDER_LIBRARY="$<TARGET_FILE:Vexlan_CNA_Provider>"
-    VEXLAN_MOF_DIR="${VEXLAN_SHARE_DIR}/mof")
+    VEXLAN_MOF_DIR="${VEXLAN_SHARE_DIR}/mof"
+    VEXLAN_FIXTURES="${PROJECT_SOURCE_DIR}/tests/fixtures")
   add_dependencies(${target} Vexlan_CNA_Provider vexlan_mof)
 endfunction()
 

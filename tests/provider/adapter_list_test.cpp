@@ -174,32 +174,3 @@ TEST_F(AdapterList, AdaptersAreFoundBySerialOrNicControllerIdWithoutRegardToCase
     Clear_CNA_List();
     EXPECT_EQ(FindCNAFromSerialNumber("VXC0000005"), nullptr);
 }
-
-TEST(DefaultAdapterList, HoldsTheConvergedAdapterOfTheDefaultHost)
-{
-    provtest::writeSettings("", "");
-    ASSERT_EQ(zorap_sim_load_default(), 0);
-    ASSERT_EQ(ZORAP_Initialize(0, 0), 0u);
-    Initialize_CNA_List();
-    ASSERT_NE(m_CNAList, nullptr);
-    EXPECT_EQ(m_CNAList->next, nullptr) << "one adapter with NIC functions";
-    EXPECT_STREQ(m_CNAList->serialNumber, "VXC2447M0193");
-    ASSERT_EQ(portCount(m_CNAList), 2);
-    const char* interfaces[] = {"enp5s0f0", "enp5s0f1"};
-    const unsigned char ipv4[][4] = {{192, 168, 40, 21}, {10, 20, 30, 21}};
-    int i = 0;
-    for (const _CNAPortStruc* p = m_CNAList->portList; p != nullptr; p = p->next, ++i) {
-        EXPECT_STREQ(p->interfaceName, interfaces[i]);
-        EXPECT_EQ(std::memcmp(p->ipProperties.ipv4Address.address, ipv4[i], 4), 0) << interfaces[i];
-        EXPECT_EQ(p->ipProperties.ipv6AddressCount, 2u) << interfaces[i];
-        EXPECT_NE(p->ipProperties.ipv6Addresses, nullptr) << interfaces[i];
-        EXPECT_EQ(p->fcoeLinkageCount, 1u) << interfaces[i];
-        ASSERT_NE(p->fcoeLinkage, nullptr) << interfaces[i];
-        EXPECT_EQ(p->fcoeLinkage[0].portWWN[1], i) << interfaces[i];
-        EXPECT_TRUE(p->hasTransceiver) << interfaces[i];
-        EXPECT_STREQ(p->sfpFields.Manufacturer, "VEXLAN") << interfaces[i];
-    }
-    EXPECT_EQ(zorap_sim_outstanding_allocations(), 0u);
-    Clear_CNA_List();
-    ZORAP_Uninitialize();
-}

@@ -15,6 +15,31 @@ namespace provtest {
 
 const char* const kLogPath = "/opt/Vexlan_Corporation/CNAProviders/log/Vexlan_CNA_Provider.log";
 
+std::string fileText(const std::string& path)
+{
+    std::ifstream in(path, std::ios::binary);
+    std::ostringstream text;
+    text << in.rdbuf();
+    return text.str();
+}
+
+void expectAsKept(const std::string& text, const std::string& path, const char* recordDir)
+{
+    if (recordDir != nullptr) {
+        std::ofstream(std::string(recordDir) + path.substr(path.rfind('/'))) << text;
+        return;
+    }
+    EXPECT_EQ(text, fileText(path)) << path;
+}
+
+void replaceAll(std::string& text, const std::string& from, const std::string& to)
+{
+    if (from.empty())
+        return;
+    for (size_t at = text.find(from); at != std::string::npos; at = text.find(from, at + to.size()))
+        text.replace(at, from.size(), to);
+}
+
 void writeFile(const std::string& path, const std::string& text)
 {
     std::ofstream out(path, std::ios::trunc);
@@ -165,12 +190,54 @@ cimhost::ObjectPath classPath(const std::string& className)
     return p;
 }
 
+Classes providerClasses(cimhost::Host& host)
+{
+    Classes out;
+    for (const std::string& cls : host.classes().classNames()) {
+        const cimhost::ClassDecl* decl = host.classes().find(cls);
+        if (cls.rfind("Vexlan", 0) != 0 || decl == nullptr || decl->indication)
+            continue;
+        (decl->association ? out.associations : out.instances).push_back(cls);
+    }
+    return out;
+}
+
 cimhost::ObjectPath hostPath(const cimhost::Value& name)
 {
     cimhost::ObjectPath p = classPath("Vexlan_Adapter_ComputerSystem");
     p.setKey("CreationClassName", cimhost::Value::fromString("Vexlan_Adapter_ComputerSystem"));
     p.setKey("Name", name);
     return p;
+}
+
+cimhost::ObjectPath servicePath(bool nic)
+{
+    const char* cls = nic ? "Vexlan_NIC_SoftwareInstallationService" : "Vexlan_FCHBA_SoftwareInstallationService";
+    cimhost::ObjectPath p = classPath(cls);
+    p.setKey("SystemCreationClassName", cimhost::Value::fromString("Vexlan_Adapter_ComputerSystem"));
+    p.setKey("SystemName", cimhost::Value::fromString(expectedHost().name));
+    p.setKey("CreationClassName", cimhost::Value::fromString(cls));
+    p.setKey("Name", cimhost::Value::fromString("CNA_SW_INSTALLER"));
+    return p;
+}
+
+std::uint64_t jobState(cimhost::Host& host, const cimhost::ObjectPath& job)
+{
+    if (job.className.empty())
+        return 0;
+    const cimhost::OpResult r = host.getInstance(job);
+    const cimhost::Value* state = r.ok() && r.instances.size() == 1 ? r.instances[0].property("JobState") : nullptr;
+    return state != nullptr ? state->u : 0;
+}
+
+std::uint64_t waitJobState(cimhost::Host& host, const cimhost::ObjectPath& job, std::uint64_t wanted)
+{
+    std::uint64_t state = jobState(host, job);
+    for (int i = 0; i < 200 && state != wanted; ++i) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(25));
+        state = jobState(host, job);
+    }
+    return state;
 }
 
 ExpectedHost expectedHost()

@@ -5,6 +5,7 @@
 
 #include <chrono>
 #include <cstddef>
+#include <cstdint>
 #include <functional>
 #include <string>
 #include <vector>
@@ -27,6 +28,13 @@ constexpr const char* kLogsOn = "DebugLog=1\nErrorLog=1\n";
 // working directory (poll interval). An empty text leaves a file out.
 void writeSettings(const std::string& optSettings, const std::string& cwdSettings);
 void writeFile(const std::string& path, const std::string& text);
+// A file's text ("" when it can't be read).
+std::string fileText(const std::string& path);
+// Compares `text` with the file kept at `path`; with `recordDir` set (from an
+// environment variable) writes it to recordDir/<the file's name> instead.
+void expectAsKept(const std::string& text, const std::string& path, const char* recordDir);
+// Replaces every occurrence of `from` in `text`.
+void replaceAll(std::string& text, const std::string& from, const std::string& to);
 void removeLog();
 
 // What a careless or hostile administrator may leave where the provider
@@ -65,8 +73,23 @@ bool waitForLog(const std::string& text, std::chrono::seconds limit, int occurre
 void prepareHost(cimhost::Host& host, cimhost::Flavour flavour = cimhost::Flavour::Pegasus);
 
 cimhost::ObjectPath classPath(const std::string& className);
+
+// The Vexlan classes of the loaded class definitions that the provider
+// serves (indications aside): instance classes and associations.
+struct Classes {
+    std::vector<std::string> instances;
+    std::vector<std::string> associations;
+};
+Classes providerClasses(cimhost::Host& host);
 // The path of the host's computer system with the given Name key value.
 cimhost::ObjectPath hostPath(const cimhost::Value& name);
+
+// The installation service of the FC HBAs or of the NIC functions.
+cimhost::ObjectPath servicePath(bool nic);
+// The JobState of the update job at `job`, 0 when it can't be read; and the
+// wait until it is `wanted` (5 s at most), which gives the last state read.
+std::uint64_t jobState(cimhost::Host& host, const cimhost::ObjectPath& job);
+std::uint64_t waitJobState(cimhost::Host& host, const cimhost::ObjectPath& job, std::uint64_t wanted);
 
 // What the provider should report for the host: the first address of the
 // host's name when the resolver knows it (NameFormat "IP"), else the plain

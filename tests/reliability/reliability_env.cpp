@@ -107,18 +107,6 @@ bool pollsSettled()
     return true;
 }
 
-Classes providerClasses(Host& host)
-{
-    Classes out;
-    for (const std::string& cls : host.classes().classNames()) {
-        const cimhost::ClassDecl* decl = host.classes().find(cls);
-        if (cls.rfind("Vexlan", 0) != 0 || decl == nullptr || decl->indication)
-            continue;
-        (decl->association ? out.associations : out.instances).push_back(cls);
-    }
-    return out;
-}
-
 Counts countAll(Host& host, const Classes& classes)
 {
     Counts counts;
@@ -182,21 +170,6 @@ int requestEveryKind(Host& host, const std::string& cls, bool association, std::
     return requests + 4;
 }
 
-namespace {
-
-ObjectPath servicePath(bool nic)
-{
-    const char* cls = nic ? "Vexlan_NIC_SoftwareInstallationService" : "Vexlan_FCHBA_SoftwareInstallationService";
-    ObjectPath p = provtest::classPath(cls);
-    p.setKey("SystemCreationClassName", Value::fromString("Vexlan_Adapter_ComputerSystem"));
-    p.setKey("SystemName", Value::fromString(provtest::expectedHost().name));
-    p.setKey("CreationClassName", Value::fromString(cls));
-    p.setKey("Name", Value::fromString("CNA_SW_INSTALLER"));
-    return p;
-}
-
-}  // namespace
-
 Job startFlashJob(Host& host, bool nic, std::uint32_t durationMs, std::uint32_t result)
 {
     const std::string image = "/var/tmp/reliability-image.bin";
@@ -212,7 +185,7 @@ Job startFlashJob(Host& host, bool nic, std::uint32_t durationMs, std::uint32_t 
                                            {"Target", Value::fromRef(target)},
                                            {"InstallOptions", Value::arrayOf(cimhost::Type::UInt16, options)}};
     zorap_sim_set_next_flash(result, durationMs);
-    const OpResult r = host.invokeMethod(servicePath(nic), "InstallFromURI", in);
+    const OpResult r = host.invokeMethod(provtest::servicePath(nic), "InstallFromURI", in);
     Job job;
     job.value = r.data.empty() ? 0xDEAD : r.data[0].u;
     for (const cimhost::NamedValue& a : r.outArgs)
@@ -223,13 +196,7 @@ Job startFlashJob(Host& host, bool nic, std::uint32_t durationMs, std::uint32_t 
 
 std::uint64_t jobState(Host& host, const Job& job)
 {
-    if (job.path.className.empty())
-        return 0;
-    const OpResult r = host.getInstance(job.path);
-    if (!r.ok() || r.instances.size() != 1)
-        return 0;
-    const Value* state = r.instances[0].property("JobState");
-    return state != nullptr ? state->u : 0;
+    return provtest::jobState(host, job.path);
 }
 
 std::uint64_t waitJobEnd(Host& host, const Job& job)

@@ -43,12 +43,8 @@ void replaceFile(const std::string& path, const std::string& text);
 // the first (and its rebuild) is over. False when that takes over 60 s.
 bool pollsSettled();
 
-// Classes of the model that the provider serves, instances and associations.
-struct Classes {
-    std::vector<std::string> instances;
-    std::vector<std::string> associations;
-};
-Classes providerClasses(cimhost::Host& host);
+using provtest::Classes;
+using provtest::providerClasses;
 
 // Instance names of every class, by class; the job classes, which follow the
 // flash jobs and not the adapters, are left out.

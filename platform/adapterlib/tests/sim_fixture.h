@@ -1,10 +1,15 @@
-// Shared fixture of the adapter library tests: a small host description and
-// helpers to reach its records.
+// Shared fixture of the adapter library tests: a small host description,
+// helpers to reach its records, and the tree as text to compare with the
+// texts kept in tests/fixtures/trees.
 #pragma once
 
 #include <gtest/gtest.h>
 
+#include <cstdio>
+#include <cstdlib>
 #include <cstring>
+#include <fstream>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -125,5 +130,105 @@ inline std::vector<_zorap_protocol_t*> protocols(_zorap_adapter_t* a) {
 inline _tagZORAPSDMDevice* device(size_t a, size_t k) { return &protocols(adapters().at(a)).at(k)->fcDevice; }
 
 inline std::string text(const uint8_t* p, size_t n) { return std::string(reinterpret_cast<const char*>(p), n); }
+
+// Every field of the records the library hands out in its adapter list, one
+// record a line: adapters, physical ports, and each protocol's FC device with
+// its targets and LUNs or its NIC records. Texts are cut at their first zero.
+inline std::string treeText() {
+    std::string out;
+    auto hex = [](const uint8_t* p, size_t n) {
+        std::string s;
+        char b[4];
+        for (size_t i = 0; i < n; ++i) {
+            std::snprintf(b, sizeof b, "%02x", p[i]);
+            s += b;
+        }
+        return s;
+    };
+    auto num = [](unsigned long long v) { return std::to_string(v); };
+    auto str = [](const char* s, size_t n) { return "\"" + std::string(s, strnlen(s, n)) + "\""; };
+#define ZT_STR(rec, f) (" " #f "=" + str((rec).f, sizeof (rec).f))
+#define ZT_NUM(rec, f) (" " #f "=" + num((rec).f))
+#define ZT_HEX(rec, f) (" " #f "=" + hex(reinterpret_cast<const uint8_t*>(&(rec).f), sizeof (rec).f))
+    _zorap_adapter_list_t* list = ZORAP_GetAdapterList();
+    out += "adapters" + (list ? ZT_NUM(*list, count) : std::string(" none")) + "\n";
+    for (_zorap_adapter_t* a : adapters()) {
+        out += "adapter" + ZT_STR(*a, serialNumber) + ZT_STR(*a, modelName) + ZT_STR(*a, productName) +
+               ZT_STR(*a, productVersion) + ZT_NUM(*a, adapterKind) + ZT_NUM(*a, adapterInstance) +
+               (a->phyPortList ? ZT_NUM(*a->phyPortList, count) : std::string(" no-port-list")) + "\n";
+        for (_zorap_phy_port_t* p = a->phyPortList ? a->phyPortList->firstPhyPort : nullptr; p; p = p->next) {
+            out += " port" + ZT_NUM(*p, portNumber) +
+                   (p->protocolList ? ZT_NUM(*p->protocolList, count) : std::string(" no-protocol-list")) + "\n";
+            for (_zorap_protocol_t* q = p->protocolList ? p->protocolList->firstProtocol : nullptr; q; q = q->next) {
+                out += "  protocol" + ZT_NUM(*q, protocolType) + ZT_NUM(*q, adapterInstance) + "\n";
+                if (q->protocolType == ZORAP_PROTOCOL_NIC) {
+                    const _zorap_nic_adapter_info_t& i = q->nicAdapterInfo;
+                    out += "   nic-adapter" + ZT_HEX(i, nodeWWN) + ZT_STR(i, modelName) + ZT_STR(i, serialNumber) +
+                           ZT_STR(i, versionString) + ZT_STR(i, partNumber) + ZT_STR(i, productName) +
+                           ZT_STR(i, driverVersion) + ZT_STR(i, firmwareVersion) + ZT_NUM(i, pciVendorId) +
+                           ZT_NUM(i, pciDeviceId) + ZT_NUM(i, subsystemVendorId) + ZT_NUM(i, subsystemDeviceId) +
+                           ZT_NUM(i, nicPortCount) + "\n";
+                    const _zorap_nic_port_info_t& n = q->nicPortInfo;
+                    const _zorap_link_properties_t& l = n.linkProperties;
+                    out += "   nic-port" + ZT_HEX(n, macAddress) + ZT_HEX(n, macAddressPad) + ZT_STR(n, interfaceName) +
+                           ZT_NUM(n, portNumber) + ZT_NUM(n, maxTransmissionUnit) + ZT_NUM(n, pciBus) +
+                           ZT_NUM(n, pciDevice) + ZT_NUM(n, pciFunction) + ZT_STR(n, driverName) +
+                           ZT_STR(n, driverVersion) + ZT_STR(n, firmwareVersion) + "\n";
+                    out += "   link" + ZT_NUM(l, recordVersion) + ZT_NUM(l, portIndex) + ZT_NUM(l, linkSpeed) +
+                           ZT_NUM(l, linkState) + ZT_NUM(l, fullDuplex) + ZT_NUM(l, autoNegotiation) +
+                           ZT_NUM(l, maxTransmissionUnit) + "\n   stats";
+                    const uint64_t* counters = &q->nicPortStats.rxBytes;
+                    for (int k = 0; k < 13; ++k) out += " " + num(counters[k]);
+                    out += "\n";
+                    for (uint32_t k = 0; k < q->nicPortExtra.vpdCount && k < ZORAP_NIC_VPD_ENTRIES; ++k)
+                        out += "   vpd" + ZT_STR(q->nicPortExtra.vpd[k], keyword) +
+                               ZT_STR(q->nicPortExtra.vpd[k], value) + "\n";
+                    continue;
+                }
+                const _tagZORAPSDMDevice& d = q->fcDevice;
+                out += "   fc" + ZT_NUM(d, deviceHandle) + ZT_NUM(d, portIndex) + ZT_NUM(d, pciVendorId) +
+                       ZT_NUM(d, pciDeviceId) + ZT_NUM(d, subsystemVendorId) + ZT_NUM(d, subsystemDeviceId) +
+                       ZT_HEX(d, nodeWWN) + ZT_HEX(d, portWWN) + ZT_STR(d, modelName) + ZT_STR(d, deviceSerial) +
+                       "\n   fc-versions" + ZT_STR(d, biosVersionText) + ZT_NUM(d, optionRomMask) +
+                       ZT_HEX(d, firmwareVersion) + ZT_HEX(d, efiVersion) + ZT_HEX(d, fcodeVersion) +
+                       ZT_STR(d, driverVersionText) + ZT_STR(d, firmwareVersionText) + ZT_STR(d, fcodeVersionText) +
+                       ZT_STR(d, efiVersionText) + "\n   fc-port" + ZT_NUM(d, portTypeCode) +
+                       ZT_NUM(d, portStateCode) + ZT_NUM(d, portSpeedCode) + ZT_NUM(d, transceiverSupport) +
+                       ZT_NUM(d, transceiverState) + ZT_NUM(d, portFcId) + ZT_NUM(d, supportedSpeedMask) +
+                       ZT_HEX(d, macAddress) + ZT_NUM(d, targetCount) + "\n   fc-stats" + ZT_NUM(d, statIoCount) +
+                       ZT_NUM(d, statMegabyteCount) + ZT_NUM(d, statLipCount) + ZT_NUM(d, statLinkFailures) +
+                       ZT_NUM(d, statLossOfSync) + ZT_NUM(d, statLossOfSignal) + ZT_NUM(d, statPrimitiveSeqErrors) +
+                       ZT_NUM(d, statInvalidTxWords) + ZT_NUM(d, statCrcErrors) + "\n";
+                for (_zorap_target_t* t = d.targetList; t; t = t->next) {
+                    out += "    target" + ZT_HEX(*t, portWWN) + ZT_HEX(*t, nodeWWN) + ZT_NUM(*t, portId) +
+                           ZT_NUM(*t, lunCount) + "\n";
+                    for (_zorap_lun_t* u = t->lunList; u; u = u->next)
+                        out += "     lun" + ZT_NUM(*u, lunNumber) + ZT_NUM(*u, lunIdLength) + ZT_HEX(*u, lunId) +
+                               ZT_STR(*u, vendorId) + ZT_STR(*u, productId) + ZT_STR(*u, revision) +
+                               ZT_NUM(*u, blockSize) + ZT_NUM(*u, capacityBlocks) + ZT_STR(*u, osDeviceName) + "\n";
+                }
+            }
+        }
+    }
+#undef ZT_STR
+#undef ZT_NUM
+#undef ZT_HEX
+    return out;
+}
+
+// Compares treeText() with tests/fixtures/trees/<name>.txt; with
+// ZORAP_RECORD_TREES=<dir> in the environment it writes <dir>/<name>.txt
+// instead (read the difference before keeping it).
+inline void expectTreeAsKept(const std::string& name) {
+    const std::string text = treeText();
+    if (const char* dir = std::getenv("ZORAP_RECORD_TREES")) {
+        std::ofstream(std::string(dir) + "/" + name + ".txt") << text;
+        return;
+    }
+    std::ifstream in(std::string(ZORAP_TREE_DIR) + "/" + name + ".txt");
+    std::ostringstream kept;
+    kept << in.rdbuf();
+    EXPECT_EQ(text, kept.str()) << name;
+}
 
 }  // namespace zorap_test

@@ -389,24 +389,11 @@
     X(_CMPIValuePtr, length, 8, 4) \
     X(_CMPIValuePtr, ptr, 0, 8)
 
-// X(name, value)
+// X(name, value). The enumerations of CMPIError (type, severity, probable
+// cause, source format) are left out: nothing here creates or reads an error
+// object, and each of their values stands spelt out in cmpidt.h.
 #define CMPI_ABI_CONSTANTS(X) \
-    X(Adapter_Card_Error, 2) \
-    X(Alarm_Received, 66) \
-    X(Antenna_Failure, 84) \
-    X(Application_Subsystem_Failure, 3) \
-    X(Authentication_Failure, 117) \
-    X(Backplane_Failure, 78) \
-    X(Bandwidth_Reduced, 4) \
-    X(Battery_Charging_Failure, 85) \
-    X(Battery_Discharging, 91) \
-    X(Battery_Failure, 92) \
-    X(Breach_of_Confidentiality, 118) \
-    X(Broadcast_Channel_Failure, 75) \
-    X(CIMObjectHandle, 2) \
     X(CMPICurrentVersion, 200) \
-    X(CMPIErrSrcOther, 1) \
-    X(CMPIErrSrcUnknown, 0) \
     X(CMPIVersion100, 100) \
     X(CMPIVersion200, 200) \
     X(CMPI_ARRAY, 8192) \
@@ -563,142 +550,7 @@
     X(CMPI_uint64, 176) \
     X(CMPI_uint64A, 8368) \
     X(CMPI_uint8, 128) \
-    X(CMPI_uint8A, 8320) \
-    X(CPU_Cycles_Limit_Exceeded, 11) \
-    X(Cable_Tamper, 119) \
-    X(Commercial_Power_Problem, 93) \
-    X(CommunicationsError, 2) \
-    X(Communications_Protocol_Error, 6) \
-    X(Communications_Subsystem_Failure, 7) \
-    X(ConfigurationCustomization_Error, 8) \
-    X(Congestion, 9) \
-    X(Connection_Establishment_Error, 5) \
-    X(Corrupt_Data, 10) \
-    X(DTE_DCE_Interface_Error, 14) \
-    X(Database_Inconsistency, 116) \
-    X(DatasetModem_Error, 12) \
-    X(Degraded_Signal, 13) \
-    X(Delayed_Information, 120) \
-    X(Denial_of_Service_Detected, 63) \
-    X(Disk_Failure, 86) \
-    X(Duplicate_Information, 121) \
-    X(Element_Missing, 73) \
-    X(Element_Reinitialized, 110) \
-    X(Element_Unavailable, 72) \
-    X(Enclosure_Door_Open, 15) \
-    X(Engine_Failure, 95) \
-    X(EnvironmentalError, 6) \
-    X(Equipment_Malfunction, 16) \
-    X(ErrorProbCauseOther, 1) \
-    X(ErrorProbCauseUnknown, 0) \
-    X(ErrorSevFatal, 5) \
-    X(ErrorSevHigh, 4) \
-    X(ErrorSevLow, 2) \
-    X(ErrorSevMedium, 3) \
-    X(ErrorSevUnknown, 0) \
-    X(Excessive_Error_Rate, 70) \
-    X(Excessive_Vibration, 17) \
-    X(Explosive_Gas, 102) \
-    X(Fan_Failure, 94) \
-    X(File_Format_Error, 18) \
-    X(Fire_Detected, 19) \
-    X(Flood_Detected, 20) \
-    X(Framing_Error, 21) \
-    X(Frequency_Hopping_Failure, 87) \
-    X(Fuse_Failure, 97) \
-    X(Generator_Failure, 98) \
-    X(HVAC_Problem, 22) \
-    X(HardwareError, 5) \
-    X(Hardware_Security_Breached, 62) \
-    X(High_Winds, 103) \
-    X(Humidity_Unacceptable, 23) \
-    X(IO_Device_Error, 24) \
-    X(Ice_Buildup, 104) \
-    X(Identifier_Duplication, 79) \
-    X(Information_Missing, 122) \
-    X(Information_Modification, 123) \
-    X(Information_Out_of_Sequence, 124) \
-    X(Input_Device_Error, 25) \
-    X(Invalid_Message_Received, 76) \
-    X(Key_Expired, 125) \
-    X(LAN_Error, 26) \
-    X(Leak_Detected_113, 113) \
-    X(Local_Node_Transmission_Error, 28) \
-    X(Logging_Problems, 112) \
-    X(Login_Attempts_Failed, 60) \
-    X(Loss_of_Frame, 29) \
-    X(Loss_of_Multi_Frame, 74) \
-    X(Loss_of_Pointer, 67) \
-    X(Loss_of_Redundancy, 88) \
-    X(Loss_of_Signal, 30) \
-    X(Low_Battery, 99) \
-    X(Low_Fuel, 100) \
-    X(Low_Water, 101) \
-    X(Material_Supply_Exhausted, 31) \
-    X(Memory_Mismatch, 106) \
-    X(Multiplexer_Problem, 32) \
-    X(Non_Repudiation_Failure, 126) \
-    X(Non_Toxic_Leak_Detected, 27) \
-    X(OtherErrorType, 1) \
-    X(Out_of_CPU_Cycles, 107) \
-    X(Out_of_Hours_Activity, 127) \
-    X(Out_of_Memory, 33) \
-    X(Out_of_Service, 128) \
-    X(Output_Device_Error, 34) \
-    X(Oversubscription_Error, 8) \
-    X(Payload_Mismatch, 68) \
-    X(Performance_Degraded, 35) \
-    X(Power_Problem, 36) \
-    X(Power_Supply_Failure, 89) \
-    X(Pressure_Unacceptable, 37) \
-    X(Previous_Alert_Cleared, 59) \
-    X(Procedural_Error, 129) \
-    X(Processor_Problem, 38) \
-    X(Protecting_Resource_Failure, 115) \
-    X(Protection_Mechanism_Failure, 114) \
-    X(Protection_Path_Failure, 80) \
-    X(Pump_Failure, 39) \
-    X(QualityOfServiceError, 3) \
-    X(Queue_Size_Exceeded, 40) \
-    X(Real_Time_Clock_Failure, 83) \
-    X(Receive_Failure, 41) \
-    X(Receiver_Failure, 42) \
-    X(Remote_Node_Transmission_Error, 43) \
-    X(Resource_at_or_Nearing_Capacity, 44) \
-    X(Response_Time_Excessive, 45) \
-    X(Retransmission_Rate_Excessive, 46) \
-    X(Routing_Failure, 77) \
-    X(SecurityError, 7) \
-    X(Security_Credential_Mismatch, 64) \
-    X(Sensor_Failure, 96) \
-    X(Signal_Quality_Problem, 90) \
-    X(Smoke, 105) \
-    X(SoftwareError, 4) \
-    X(Software_Download_Failure, 109) \
-    X(Software_Environment_Problem, 108) \
-    X(Software_Error, 47) \
-    X(Software_Program_Abnormally_Terminated, 48) \
-    X(Software_Program_Error, 49) \
-    X(Software_Virus_Detected, 61) \
-    X(Storage_Capacity_Problem, 50) \
-    X(Sync_Loss_or_Mismatch, 81) \
-    X(Temperature_Unacceptable, 51) \
-    X(Terminal_Problem, 82) \
-    X(Threshold_Crossed, 52) \
-    X(Timeout, 111) \
-    X(Timing_Problem, 53) \
-    X(Toxic_Leak_Detected, 54) \
-    X(Trace_Problem, 71) \
-    X(Transmission_Error, 69) \
-    X(Transmit_Failure, 55) \
-    X(Transmitter_Failure, 56) \
-    X(Unauthorized_Access, 65) \
-    X(UnavailableResourceError, 9) \
-    X(Underlying_Resource_Unavailable, 57) \
-    X(Unexpected_Information, 130) \
-    X(UnknownErrorType, 0) \
-    X(UnsupportedOperationError, 10) \
-    X(Version_Mismatch, 58)
+    X(CMPI_uint8A, 8320)
 
 // In C++ every struct or union tag is itself a type name.
 #define CMPI_CHECK_SIZE(tag, size) \
@@ -754,7 +606,7 @@ TEST(CmpiAbi, MemberOffsetsAndSizes)
 TEST(CmpiAbi, ConstantValues)
 {
     static const Row rows[] = {CMPI_ABI_CONSTANTS(CMPI_ROW_CONSTANT)};
-    EXPECT_EQ(sizeof(rows) / sizeof(rows[0]), 308u);
+    EXPECT_EQ(sizeof(rows) / sizeof(rows[0]), 158u);
     expectRows(rows, sizeof(rows) / sizeof(rows[0]));
 }
 
