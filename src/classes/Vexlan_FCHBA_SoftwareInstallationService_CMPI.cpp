@@ -13,10 +13,11 @@
 #include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "classes/Vexlan_FC_PortController_CMPI.h"
 #include "inventory/AdapterFunc.h"
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "state/ProviderState.h"
 #include "support/ProviderFiles.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "support/ossimpl.h"
+#include "update/FlashUpdate.h"
 #include "update/InstallHelpers.h"
 
 namespace {
@@ -296,9 +297,9 @@ CmpiStatus invokeMethod_SoftwareInstallationService(const CmpiContext&, CmpiResu
             value = updateSynchronously(device, fileName, deviceId.c_str());
         } else {
             CmpiObjectPath jobPath(nameSpace, "Vexlan_Adapter_ConcreteJob");
-            Vexlan_CNA_Provider* provider = g_Vexlan_CNA_Provider.load();
+            ProviderState* provider = g_RunningProviderState.load();
             if (provider != nullptr &&
-                provider->StartFCFlashUpdateThread(device, reinterpret_cast<const unsigned char*>(fileName), jobPath)) {
+                StartFCFlashUpdateThread(*provider, device, reinterpret_cast<const unsigned char*>(fileName), jobPath)) {
                 out.setArg("Job", CmpiData(jobPath));
                 value = 4096;
             } else {

@@ -16,10 +16,11 @@
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
 #include "classes/Vexlan_FCHBA_SoftwareInstallationService_CMPI.h"
 #include "inventory/AdapterFunc.h"
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "state/ProviderState.h"
 #include "support/ProviderFiles.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "support/Vexlan_NIC_Utils.h"
+#include "update/FlashUpdate.h"
 #include "update/InstallHelpers.h"
 
 namespace {
@@ -243,8 +244,8 @@ unsigned int installFromURI(const CmpiObjectPath& ref, const CmpiArgs& in, CmpiA
             raise(CMPI_RC_ERR_INVALID_PARAMETER);
         }
         CmpiObjectPath jobPath(nameSpace, "Vexlan_Adapter_ConcreteJob");
-        Vexlan_CNA_Provider* provider = g_Vexlan_CNA_Provider.load();
-        if (provider == nullptr || !provider->StartNICFlashUpdateThread(adapter, file, imageSize, jobPath)) {
+        ProviderState* provider = g_RunningProviderState.load();
+        if (provider == nullptr || !StartNICFlashUpdateThread(*provider, adapter, file, imageSize, jobPath)) {
             gbFlashUpdateInProgress = false;
             NIC_DEBUG("Vexlan_NIC_SoftwareInstallationService: Failed to create flash update job thread");
             return 2;

@@ -10,47 +10,18 @@
 #include <cstdlib>
 #include <ctime>
 
+#include "associations/AssocDispatch.h"
 #include "indications/Vexlan_Adapter_JobIndications.h"
+#include "indications/Vexlan_CNA_HBAProviderIndications_CMPI.h"
+#include "indications/Vexlan_NIC_ProviderIndications.h"
 #include "inventory/AdapterFunc.h"
 #include "support/ClassTests.h"
 #include "support/RequestLists.h"
 #include "provider/Vexlan_CNA_Provider_Tables.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "update/FlashUpdate.h"
+#include "update/JobPersistence.h"
 #include "support/Vexlan_NIC_Properties.h"
-
-pthread_mutex_t Vexlan_CNA_Provider::provider_lock;
-pthread_mutex_t Vexlan_CNA_Provider::provider_write_lock;
-pthread_mutex_t Vexlan_CNA_Provider::linux_enable_indications_mutex;
-pthread_mutex_t Vexlan_CNA_Provider::properties_file_lock;
-std::atomic<bool> Vexlan_CNA_Provider::m_bIndicationEnabled{false};
-std::atomic<int> Vexlan_CNA_Provider::m_numSubscriptions{0};
-
-std::atomic<Vexlan_CNA_Provider*> g_Vexlan_CNA_Provider{nullptr};
-const int g_SUPPORT_HDR = 1;
-const int g_SupportTRB2xx = 1;
-
-// ---- Locks --------------------------------------------------------------------
-
-void lockProviderMutex(pthread_mutex_t* mutex)
-{
-    // Repeated until it succeeds; a failing call (never seen on a sound mutex)
-    // is retried after a short pause rather than at full speed.
-    while (pthread_mutex_lock(mutex) != 0) {
-        struct timespec pause = {0, 1000000};
-        nanosleep(&pause, nullptr);
-    }
-}
-
-ProviderLockGuard::ProviderLockGuard(pthread_mutex_t* mutex) : mutex_(mutex)
-{
-    lockProviderMutex(mutex_);
-}
-
-ProviderLockGuard::~ProviderLockGuard()
-{
-    pthread_mutex_unlock(mutex_);
-}
 
 namespace {
 
@@ -170,11 +141,8 @@ Vexlan_CNA_Provider::Vexlan_CNA_Provider(const CmpiBroker& mbp, const CmpiContex
       CmpiAssociationMI(mbp, ctx),
       CmpiIndicationMI(mbp, ctx),
       CmpiMethodMI(mbp, ctx),
-      methodContext(nullptr),
-      initialized(false),
-      initializing(false),
-      pollingEnabled(false),
-      threadArgs()
+      ProviderState(),
+      pollingEnabled(false)
 {
     Vexlan_FC_Utils_CMPI::InitializeLogFile();
     if (g_EnableDebugPrint)
@@ -207,8 +175,8 @@ Vexlan_CNA_Provider::~Vexlan_CNA_Provider()
     pthread_mutex_destroy(&linux_enable_indications_mutex);
     pthread_mutex_destroy(&properties_file_lock);
     pthread_mutex_destroy(&provider_write_lock);
-    Vexlan_CNA_Provider* self = this;
-    g_Vexlan_CNA_Provider.compare_exchange_strong(self, nullptr);
+    ProviderState* self = this;
+    g_RunningProviderState.compare_exchange_strong(self, nullptr);
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("Vexlan_CNA_Provider destructor complete");
 }
@@ -409,7 +377,33 @@ CmpiStatus Vexlan_CNA_Provider::invokeMethod(const CmpiContext& ctx, CmpiResult&
 }
 
 // ---- Associations ---------------------------------------------------------------------
-// The four association operations are in associations/AssocDispatch.cpp.
+// The association dispatch of associations/AssocDispatch.h.
+
+CmpiStatus Vexlan_CNA_Provider::associators(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
+                                            const char* assocClass, const char* resultClass, const char* role,
+                                            const char* resultRole, const char** properties)
+{
+    return assocdispatch::associators(ctx, rslt, op, assocClass, resultClass, role, resultRole, properties);
+}
+
+CmpiStatus Vexlan_CNA_Provider::associatorNames(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
+                                                const char* assocClass, const char* resultClass, const char* role,
+                                                const char* resultRole)
+{
+    return assocdispatch::associatorNames(ctx, rslt, op, assocClass, resultClass, role, resultRole);
+}
+
+CmpiStatus Vexlan_CNA_Provider::references(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
+                                           const char* resultClass, const char* role, const char** properties)
+{
+    return assocdispatch::references(ctx, rslt, op, resultClass, role, properties);
+}
+
+CmpiStatus Vexlan_CNA_Provider::referenceNames(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
+                                               const char* resultClass, const char* role)
+{
+    return assocdispatch::referenceNames(ctx, rslt, op, resultClass, role);
+}
 
 // ---- Indications ------------------------------------------------------------------------
 // The subscription gate: one process-wide switch, on while at least one filter
@@ -483,4 +477,39 @@ CmpiStatus Vexlan_CNA_Provider::disableIndications()
     m_bIndicationEnabled = false;
     debugLine("disableIndications:Indications disabled\n");
     return CmpiStatus(CMPI_RC_OK);
+}
+
+// ---- Operations of the parts on this provider's state ------------------------------------
+
+void Vexlan_CNA_Provider::m_generateIndication(unsigned int deviceNum, int alarmType, int rsltParam,
+                                               unsigned char* strParam)
+{
+    ::m_generateIndication(threadArgs, deviceNum, alarmType, rsltParam, strParam);
+}
+
+void Vexlan_CNA_Provider::generatePortAlertIndication(int alarmType, _CNAStruc* adapter, _CNAPortStruc* port)
+{
+    ::generatePortAlertIndication(threadArgs, alarmType, adapter, port);
+}
+
+bool Vexlan_CNA_Provider::StartFCFlashUpdateThread(_tagZORAPSDMDevice* device, const unsigned char* fileName,
+                                                   CmpiObjectPath& jobPath)
+{
+    return ::StartFCFlashUpdateThread(*this, device, fileName, jobPath);
+}
+
+bool Vexlan_CNA_Provider::StartNICFlashUpdateThread(_CNAStruc* adapter, const unsigned char* fileName,
+                                                    unsigned long long imageSize, CmpiObjectPath& jobPath)
+{
+    return ::StartNICFlashUpdateThread(*this, adapter, fileName, imageSize, jobPath);
+}
+
+void Vexlan_CNA_Provider::SerializeConcreteJobInfo()
+{
+    SerializeConcreteJobToPrefFile();
+}
+
+void Vexlan_CNA_Provider::DeserializeConcreteJobInfo()
+{
+    DeserializeConcreteJobToPrefFile();
 }
