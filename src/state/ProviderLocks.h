@@ -15,6 +15,8 @@
 
 #include <pthread.h>
 
+#include <ctime>
+
 struct ProviderLocks {
     static pthread_mutex_t provider_lock;
     static pthread_mutex_t provider_write_lock;
@@ -22,19 +24,28 @@ struct ProviderLocks {
     static pthread_mutex_t properties_file_lock;
 };
 
-// Locks a pthread mutex for the life of the guard. The lock call is repeated
-// until it succeeds; the unlock happens on every way out of the scope.
+// Locks with a call repeated until it succeeds; a failing call (never seen on
+// a sound mutex) is retried after a short pause rather than at full speed.
+// For the places that unlock by hand.
+inline void lockProviderMutex(pthread_mutex_t* mutex)
+{
+    while (pthread_mutex_lock(mutex) != 0) {
+        struct timespec pause = {0, 1000000};
+        nanosleep(&pause, nullptr);
+    }
+}
+
+// Locks a pthread mutex for the life of the guard with lockProviderMutex; the
+// unlock happens on every way out of the scope.
 class ProviderLockGuard {
 public:
-    explicit ProviderLockGuard(pthread_mutex_t* mutex);
-    ~ProviderLockGuard();
+    explicit ProviderLockGuard(pthread_mutex_t* mutex) : mutex_(mutex) { lockProviderMutex(mutex_); }
+    ~ProviderLockGuard() { pthread_mutex_unlock(mutex_); }
     ProviderLockGuard(const ProviderLockGuard&) = delete;
     ProviderLockGuard& operator=(const ProviderLockGuard&) = delete;
 
 private:
     pthread_mutex_t* mutex_;
 };
-// Locks with the same repeated call, for the places that unlock by hand.
-void lockProviderMutex(pthread_mutex_t* mutex);
 
 #endif
