@@ -3,7 +3,7 @@
 // method operations of CMPI, the lifecycle (initialize, cleanup,
 // isUnloadable) and the adapter polling thread that owns the life of the
 // process-wide lists. The state it shares with the parts (locks, subscription
-// gate, polling thread's block, job map) is its ProviderState
+// gate, polling thread's block, job map) is its ProviderState `state`
 // (state/ProviderState.h); the parts never see this class.
 #ifndef VEXLAN_PROVIDER_VEXLAN_CNA_PROVIDER_CMPI_H
 #define VEXLAN_PROVIDER_VEXLAN_CNA_PROVIDER_CMPI_H
@@ -23,8 +23,7 @@ struct _CNAPortStruc;
 class Vexlan_CNA_Provider : public CmpiInstanceMI,
                             public CmpiAssociationMI,
                             public CmpiIndicationMI,
-                            public CmpiMethodMI,
-                            public ProviderState {
+                            public CmpiMethodMI {
 public:
     Vexlan_CNA_Provider(const CmpiBroker& mbp, const CmpiContext& ctx);
 
@@ -100,6 +99,8 @@ public:
     void SerializeConcreteJobInfo();
     void DeserializeConcreteJobInfo();
 
+    // What the provider shares with its parts; made and gone with the provider.
+    ProviderState state;
     // Set by startPollingLoop, cleared by stopPollingLoop.
     std::atomic<bool> pollingEnabled;
 

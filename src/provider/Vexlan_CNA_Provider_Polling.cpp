@@ -242,27 +242,27 @@ void Vexlan_CNA_Provider::startPollingLoop(const CmpiContext& ctx)
         debug("  Polling already enabled");
         return;
     }
-    threadArgs.broker = broker;
-    threadArgs.context = prepareThreadContext(ctx);
-    threadArgs.provider = this;
-    threadArgs.stopRequested = false;
-    threadArgs.threadExited = false;
+    state.threadArgs.broker = broker;
+    state.threadArgs.context = prepareThreadContext(ctx);
+    state.threadArgs.provider = &state;
+    state.threadArgs.stopRequested = false;
+    state.threadArgs.threadExited = false;
 
     // The block's mutex and condition exist before the thread that uses them.
-    int rc = pthread_mutex_init(&threadArgs.mutex, nullptr);
+    int rc = pthread_mutex_init(&state.threadArgs.mutex, nullptr);
     if (rc != 0) {
         if (g_EnableLogError)
             Vexlan_FC_Utils_CMPI::LogError("Error %d Initializing provider_lock mutex", rc);
         exit(1);
     }
-    pthread_cond_init(&threadArgs.changed, nullptr);
+    pthread_cond_init(&state.threadArgs.changed, nullptr);
 
-    rc = pthread_create(&threadArgs.threadId, nullptr, AdapterPollingLoop, &threadArgs);
+    rc = pthread_create(&state.threadArgs.threadId, nullptr, AdapterPollingLoop, &state.threadArgs);
     if (rc != 0) {
         if (g_EnableLogError)
             Vexlan_FC_Utils_CMPI::LogError("Error %d creating the polling thread", rc);
-        pthread_cond_destroy(&threadArgs.changed);
-        pthread_mutex_destroy(&threadArgs.mutex);
+        pthread_cond_destroy(&state.threadArgs.changed);
+        pthread_mutex_destroy(&state.threadArgs.mutex);
         return;
     }
     pollingEnabled = true;
@@ -277,25 +277,25 @@ void Vexlan_CNA_Provider::stopPollingLoop()
         return;
     }
     {
-        ProviderLockGuard lock(&threadArgs.mutex);
-        threadArgs.stopRequested = true;
-        pthread_cond_broadcast(&threadArgs.changed);
-        while (!threadArgs.threadExited) {
+        ProviderLockGuard lock(&state.threadArgs.mutex);
+        state.threadArgs.stopRequested = true;
+        pthread_cond_broadcast(&state.threadArgs.changed);
+        while (!state.threadArgs.threadExited) {
             struct timespec until;
             clock_gettime(CLOCK_REALTIME, &until);
             until.tv_sec += 1;
-            pthread_cond_timedwait(&threadArgs.changed, &threadArgs.mutex, &until);
+            pthread_cond_timedwait(&state.threadArgs.changed, &state.threadArgs.mutex, &until);
         }
     }
     debug("stopPollingLoop() calling pthread_join");
-    int rc = pthread_join(threadArgs.threadId, nullptr);
+    int rc = pthread_join(state.threadArgs.threadId, nullptr);
     if (rc != 0) {
         if (g_EnableLogError)
             Vexlan_FC_Utils_CMPI::LogError("stopPollingLoop() called to pthread_join failed with %d", rc);
     } else {
         debug("stopPollingLoop() completed pthread_join");
     }
-    pthread_cond_destroy(&threadArgs.changed);
-    pthread_mutex_destroy(&threadArgs.mutex);
+    pthread_cond_destroy(&state.threadArgs.changed);
+    pthread_mutex_destroy(&state.threadArgs.mutex);
     pollingEnabled = false;
 }
