@@ -1,6 +1,6 @@
 // The state that the provider shares with its parts. The provider object
-// holds one (Vexlan_CNA_Provider::state) and owns its life: it is made with
-// the provider and goes with it. Each part takes only what it needs: the locks (state/ProviderLocks.h),
+// holds one and owns its life: it is made with the provider and goes with
+// it. Each part takes only what it needs: the locks (state/ProviderLocks.h),
 // the subscription gate (state/IndicationGate.h), the polling thread's block
 // (state/PollingBlock.h), the job store (state/JobStore.h), or this whole.
 #ifndef VEXLAN_STATE_PROVIDERSTATE_H
