@@ -1,5 +1,5 @@
-// The provider's four association operations: which association modules a
-// traversal from a source object runs.
+// The four association operations of the provider: which association modules
+// a traversal from a source object runs.
 //
 // One table names every association class with its module, the CIM parent
 // that a client may ask for instead, whether its lists are rebuilt before the
@@ -20,7 +20,7 @@
 #include "associations/AssocRows.h"
 #include "support/ClassTests.h"
 #include "support/RequestLists.h"
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "state/ProviderLocks.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 namespace {
@@ -435,7 +435,7 @@ CmpiStatus dispatch(const Request& rq)
     std::string gateClosedFor;
     bool gateClosed = false;
     {
-        ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+        ProviderLockGuard lock(&ProviderLocks::provider_lock);
         const RequestScope request;
         if (rq.op == Op::Associators)
             DISPATCH_DEBUG("Vexlan_CNA_Provider::associators entered");
@@ -511,32 +511,34 @@ const AssocLookupRow* assocLookupTable(std::size_t& count)
     return tables().lookup.data();
 }
 
-CmpiStatus Vexlan_CNA_Provider::associators(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
-                                            const char* assocClass, const char* resultClass, const char* role,
-                                            const char* resultRole, const char** properties)
+namespace assocdispatch {
+
+CmpiStatus associators(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op, const char* assocClass,
+                       const char* resultClass, const char* role, const char* resultRole, const char** properties)
 {
     const PathClassTests classes(op);
     return dispatch({Op::Associators, ctx, rslt, op, classes, assocClass, resultClass, role, resultRole, properties});
 }
 
-CmpiStatus Vexlan_CNA_Provider::associatorNames(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
-                                                const char* assocClass, const char* resultClass, const char* role,
-                                                const char* resultRole)
+CmpiStatus associatorNames(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
+                           const char* assocClass, const char* resultClass, const char* role, const char* resultRole)
 {
     const PathClassTests classes(op);
     return dispatch({Op::AssociatorNames, ctx, rslt, op, classes, assocClass, resultClass, role, resultRole, nullptr});
 }
 
-CmpiStatus Vexlan_CNA_Provider::references(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
-                                           const char* resultClass, const char* role, const char** properties)
+CmpiStatus references(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op, const char* resultClass,
+                      const char* role, const char** properties)
 {
     const PathClassTests classes(op);
     return dispatch({Op::References, ctx, rslt, op, classes, resultClass, nullptr, role, nullptr, properties});
 }
 
-CmpiStatus Vexlan_CNA_Provider::referenceNames(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
-                                               const char* resultClass, const char* role)
+CmpiStatus referenceNames(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
+                          const char* resultClass, const char* role)
 {
     const PathClassTests classes(op);
     return dispatch({Op::ReferenceNames, ctx, rslt, op, classes, resultClass, nullptr, role, nullptr, nullptr});
 }
+
+}  // namespace assocdispatch

@@ -156,6 +156,19 @@ CmpiData refData(const CmpiObjectPath& p)
     return CmpiData(p);
 }
 
+// An instance of the association of `path` with its two role references,
+// and the row's uint16 property when `withExtra`.
+CmpiInstance pairInstance(const AssocRow& row, const CmpiObjectPath& path, const CmpiObjectPath& p1,
+                          const CmpiObjectPath& p2, bool withExtra)
+{
+    CmpiInstance instance(path);
+    instance.setProperty(row.end1.role, refData(p1));
+    instance.setProperty(row.end2.role, refData(p2));
+    if (row.extra.name != nullptr && withExtra)
+        instance.setProperty(row.extra.name, CmpiData(static_cast<CMPIUint16>(row.extra.value)));
+    return instance;
+}
+
 // Sets the two role keys of a reference path: setKey (plain) or the path's
 // own addKey with the reference type, whose failure is logged and returned.
 bool setRoleKeys(const AssocRow& row, CmpiObjectPath& target, const CmpiObjectPath& p1, const CmpiObjectPath& p2,
@@ -299,12 +312,7 @@ bool AssocRequest::partner(const EndItem& item)
         const CmpiObjectPath& p2 = sourceIsRole1_ ? other : source;
         CmpiObjectPath ref(ns, row.assocClass);
         if (funcType_ == FUNC_REF) {
-            CmpiInstance instance(ref);
-            instance.setProperty(row.end1.role, refData(p1));
-            instance.setProperty(row.end2.role, refData(p2));
-            if (row.extra.name != nullptr && row.extra.onReferences)
-                instance.setProperty(row.extra.name, CmpiData(static_cast<CMPIUint16>(row.extra.value)));
-            result_.returnData(instance);
+            result_.returnData(pairInstance(row, ref, p1, p2, row.extra.onReferences));
             return true;
         }
         if (!setRoleKeys(row, ref, p1, p2, findName(sourceIsRole1_), status_))
@@ -315,6 +323,51 @@ bool AssocRequest::partner(const EndItem& item)
     }
     return true;
 }
+
+namespace {
+
+// The start of both enumerations: the "Entering" line, and the namespace read
+// for its status: a path without one is refused (the filtering form's line
+// names the row's file stem and ends with `filteringWhere`), and `failure` is
+// the status.
+bool startEnumeration(const AssocRow& row, const std::string& op, const CmpiObjectPath& path,
+                      const char* filteringWhere, CmpiStatus& failure)
+{
+    enteringLine(row, op);
+    CMPIObjectPath* enc = path.getEnc();
+    CMPIStatus rc = {CMPI_RC_OK, nullptr};
+    enc->ft->getNameSpace(enc, &rc);
+    if (rc.rc == CMPI_RC_OK)
+        return true;
+    if (filtering(row))
+        ASSOC_ERROR("%s: Error getting namespace %s\n", row.file, filteringWhere);
+    else
+        ASSOC_ERROR("%s: Error getting namespace, status.rc=%d!", op.c_str(), static_cast<int>(rc.rc));
+    failure = CmpiStatus(rc);
+    return false;
+}
+
+// The paths of the row's pairs in turn, until `visit(p1, p2)` returns false.
+// An end that no list slot matches (its list was built without the adapter
+// library) names no object: the pair is left out.
+template <class Visit>
+void forEachPairPath(const AssocRow& row, Visit&& visit)
+{
+    if (row.pairs == nullptr)
+        return;
+    bool stop = false;
+    row.pairs([&](const EndItem& a, const EndItem& b) {
+        if (stop)
+            return;
+        const CmpiObjectPath p1 = row.end1.cls->makePath(row.end1.cls->className, kModelNamespace, a);
+        const CmpiObjectPath p2 = row.end2.cls->makePath(row.end2.cls->className, kModelNamespace, b);
+        if (p1.isNull() || p2.isNull())
+            return;
+        stop = !visit(p1, p2);
+    });
+}
+
+}  // namespace
 
 // ---- the seven operations -------------------------------------------------------------
 
@@ -361,32 +414,13 @@ CmpiStatus assocEnumInstances(const AssocRow& row, const CmpiContext& ctx, CmpiR
     if (row.ops != nullptr)
         return row.ops->enumInstances(row, ctx, rslt, path, properties);
     const std::string op = opName("enumInstances", row);
-    enteringLine(row, op);
-    CMPIObjectPath* enc = path.getEnc();
-    CMPIStatus rc = {CMPI_RC_OK, nullptr};
-    // The namespace is read for its status: a path without one is refused.
-    enc->ft->getNameSpace(enc, &rc);
-    if (rc.rc != CMPI_RC_OK) {
-        if (filtering(row))
-            ASSOC_ERROR("%s: Error getting namespace in enumInstances\n", row.file);
-        else
-            ASSOC_ERROR("%s: Error getting namespace, status.rc=%d!", op.c_str(), static_cast<int>(rc.rc));
-        return CmpiStatus(rc);
-    }
-    if (row.pairs != nullptr) {
-        row.pairs([&](const EndItem& a, const EndItem& b) {
-            const CmpiObjectPath p1 = row.end1.cls->makePath(row.end1.cls->className, kModelNamespace, a);
-            const CmpiObjectPath p2 = row.end2.cls->makePath(row.end2.cls->className, kModelNamespace, b);
-            if (p1.isNull() || p2.isNull())
-                return;
-            CmpiInstance instance(path);
-            instance.setProperty(row.end1.role, refData(p1));
-            instance.setProperty(row.end2.role, refData(p2));
-            if (row.extra.name != nullptr && row.extra.onEnumeration)
-                instance.setProperty(row.extra.name, CmpiData(static_cast<CMPIUint16>(row.extra.value)));
-            rslt.returnData(instance);
-        });
-    }
+    CmpiStatus failure(CMPI_RC_OK);
+    if (!startEnumeration(row, op, path, "in enumInstances", failure))
+        return failure;
+    forEachPairPath(row, [&](const CmpiObjectPath& p1, const CmpiObjectPath& p2) {
+        rslt.returnData(pairInstance(row, path, p1, p2, row.extra.onEnumeration));
+        return true;
+    });
     exitingLine(row, op);
     return CmpiStatus(CMPI_RC_OK);
 }
@@ -397,43 +431,24 @@ CmpiStatus assocEnumInstanceNames(const AssocRow& row, const CmpiContext& ctx, C
     if (row.ops != nullptr)
         return row.ops->enumInstanceNames(row, ctx, rslt, path);
     const std::string op = opName("enumInstanceNames", row);
-    enteringLine(row, op);
-    CMPIObjectPath* enc = path.getEnc();
-    CMPIStatus rc = {CMPI_RC_OK, nullptr};
-    // The namespace is read for its status: a path without one is refused.
-    enc->ft->getNameSpace(enc, &rc);
-    if (rc.rc != CMPI_RC_OK) {
-        if (filtering(row))
-            ASSOC_ERROR("%s: Error getting namespace i enumInstancesNames\n", row.file);
-        else
-            ASSOC_ERROR("%s: Error getting namespace, status.rc=%d!", op.c_str(), static_cast<int>(rc.rc));
-        return CmpiStatus(rc);
-    }
+    CmpiStatus failure(CMPI_RC_OK);
+    if (!startEnumeration(row, op, path, "i enumInstancesNames", failure))
+        return failure;
     // Every answer is the request's path with the two role keys set anew; a
     // copy of it is changed, not the server's own object.
+    CMPIObjectPath* enc = path.getEnc();
+    CMPIStatus rc = {CMPI_RC_OK, nullptr};
     CMPIObjectPath* copy = enc->ft->clone(enc, &rc);
     if (rc.rc != CMPI_RC_OK || copy == nullptr)
         return CmpiStatus(rc);
     CmpiObjectPath answer(copy);
     CmpiStatus status(CMPI_RC_OK);
-    bool stop = false;
-    if (row.pairs != nullptr) {
-        row.pairs([&](const EndItem& a, const EndItem& b) {
-            if (stop)
-                return;
-            const CmpiObjectPath p1 = row.end1.cls->makePath(row.end1.cls->className, kModelNamespace, a);
-            const CmpiObjectPath p2 = row.end2.cls->makePath(row.end2.cls->className, kModelNamespace, b);
-            // An end that no list slot matches (its list was built without
-            // the adapter library) names no object: the pair is left out.
-            if (p1.isNull() || p2.isNull())
-                return;
-            if (!setRoleKeys(row, answer, p1, p2, "enumInstanceNames", status)) {
-                stop = true;
-                return;
-            }
-            rslt.returnData(answer);
-        });
-    }
+    forEachPairPath(row, [&](const CmpiObjectPath& p1, const CmpiObjectPath& p2) {
+        if (!setRoleKeys(row, answer, p1, p2, "enumInstanceNames", status))
+            return false;
+        rslt.returnData(answer);
+        return true;
+    });
     copy->ft->release(copy);
     exitingLine(row, op);
     return status;

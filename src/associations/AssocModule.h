@@ -33,7 +33,8 @@
 #include <string>
 
 #include "CmpiImpl.h"
-#include "provider/Vexlan_CNA_Provider_Tables.h"
+#include "state/ModuleOps.h"
+#include "support/RequestLists.h"
 
 struct _CNAStruc;
 struct _CNAPortStruc;

@@ -606,7 +606,7 @@ private:
     CmpiInstance makeInstance_##X(const char* className, const char* nameSpace, const char** properties); \
     VEXLAN_DECLARE_CLASS_REQUESTS(X)
 
-#define VEXLAN_CLASS_REQUESTS(X, module)                                                                   \
+#define VEXLAN_CLASS_ENUMERATIONS(X, module)                                                               \
     CmpiStatus enumInstances_##X(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& path,     \
                                  const char** properties)                                                  \
     {                                                                                                      \
@@ -615,7 +615,10 @@ private:
     CmpiStatus enumInstanceNames_##X(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& path) \
     {                                                                                                      \
         return (module).enumInstanceNames(ctx, rslt, path);                                                \
-    }                                                                                                      \
+    }
+
+#define VEXLAN_CLASS_REQUESTS(X, module)                                                                   \
+    VEXLAN_CLASS_ENUMERATIONS(X, module)                                                                   \
     CmpiStatus getInstance_##X(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& path,       \
                                const char** properties, bool sendInstance)                                 \
     {                                                                                                      \
@@ -634,7 +637,8 @@ private:
     }                                                                                                  \
     VEXLAN_CLASS_REQUESTS(X, module)
 
-#define VEXLAN_SINGLE_CLASS_OPERATIONS(X, module)                                                      \
+// makePath_X and makeInstance_X of a single instance.
+#define VEXLAN_SINGLE_CLASS_MAKERS(X, module)                                                          \
     CmpiObjectPath makePath_##X(const char* className, const char* nameSpace)                         \
     {                                                                                                  \
         return (module).makePath(className, nameSpace, 0);                                             \
@@ -642,7 +646,10 @@ private:
     CmpiInstance makeInstance_##X(const char* className, const char* nameSpace, const char** properties) \
     {                                                                                                  \
         return (module).makeInstance(className, nameSpace, properties, 0);                             \
-    }                                                                                                  \
+    }
+
+#define VEXLAN_SINGLE_CLASS_OPERATIONS(X, module) \
+    VEXLAN_SINGLE_CLASS_MAKERS(X, module)         \
     VEXLAN_CLASS_REQUESTS(X, module)
 
 #endif

@@ -6,7 +6,7 @@
 #include <cstdio>
 #include <string>
 
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "state/ProviderState.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 namespace {
@@ -47,7 +47,7 @@ const auto kKeyRows = classmodule::rowsOfKeys(kKeys, kProperties, 1);
 // The jobs as they stand now, in ascending id.
 ConcreteJobMap jobsNow()
 {
-    Vexlan_CNA_Provider* provider = g_Vexlan_CNA_Provider.load();
+    ProviderState* provider = g_RunningProviderState.load();
     std::lock_guard<std::recursive_mutex> guard(jobStoreLock());
     return provider != nullptr ? provider->jobMap : ConcreteJobMap();
 }

@@ -8,26 +8,25 @@
 #include <cstdio>
 #include <string>
 
+#include "classes/InstallationServiceModule.h"
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
 #include "classes/Vexlan_FCHBA_SoftwareIdentity_CMPI.h"
 #include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "classes/Vexlan_FC_PortController_CMPI.h"
 #include "inventory/AdapterFunc.h"
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
 #include "support/ProviderFiles.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "support/ossimpl.h"
+#include "update/FlashUpdate.h"
 #include "update/InstallHelpers.h"
+
+using installservice::kServiceName;
+using installservice::ServiceSlot;
+using installservice::textOf;
 
 namespace {
 
-const char kServiceName[] = "CNA_SW_INSTALLER";
 const char kOperation[] = "invokeMethod_SoftwareInstallationService";
-
-struct ServiceSlot {
-    unsigned char valid;
-};
-const ServiceSlot kSlot = {1};
 
 const PropertyRow<ServiceSlot> kServiceProperties[] = {
     {"Name", CMPI_string, CLASS_VALUE(ServiceSlot, entryText(kServiceName))},
@@ -39,14 +38,9 @@ const PropertyRow<ServiceSlot> kServiceProperties[] = {
     {"Description", CMPI_string, CLASS_VALUE(ServiceSlot, entryText("Updating CNA flash(boot code, firmwares...)"))},
     {"ElementName", CMPI_string, CLASS_VALUE(ServiceSlot, entryText("Updating Vexlan CNA flash Image"))},
 };
-const char* const kServiceKeys[] = {"SystemCreationClassName", "SystemName", "CreationClassName", "Name", nullptr};
-
-const ClassModule<ServiceSlot> kService = ClassModule<ServiceSlot>("SoftwareInstallationService")
-                                              .single(kSlot)
-                                              .key("Name", [](const ServiceSlot&) { return kServiceName; })
-                                              .filterKeys(kServiceKeys)
-                                              .pathKeys(kServiceKeys)
-                                              .properties(kServiceProperties);
+const ClassModule<ServiceSlot> kService =
+    installservice::serviceModule("SoftwareInstallationService", "Name", installservice::kServiceKeys,
+                                  kServiceProperties);
 
 const PropertyRow<ServiceSlot> kCapabilitiesProperties[] = {
     {"InstanceID", CMPI_string, CLASS_VALUE(ServiceSlot, entryText(kServiceName))},
@@ -60,20 +54,12 @@ const PropertyRow<ServiceSlot> kCapabilitiesProperties[] = {
     {"Description", CMPI_string,
      CLASS_VALUE(ServiceSlot, entryText("Flash image includes boot code, ASIC and MPI Firmware"))},
 };
-const char* const kCapabilitiesKeys[] = {"InstanceID", nullptr};
-
 const ClassModule<ServiceSlot> kCapabilities =
-    ClassModule<ServiceSlot>("SoftwareInstallationServiceCapabilities")
-        .single(kSlot)
-        .key("InstanceID", [](const ServiceSlot&) { return kServiceName; })
-        .filterKeys(kCapabilitiesKeys)
-        .pathKeys(kCapabilitiesKeys)
-        .properties(kCapabilitiesProperties);
+    installservice::serviceModule("SoftwareInstallationServiceCapabilities", "InstanceID",
+                                  installservice::kCapabilitiesKeys, kCapabilitiesProperties);
 
-const char* textOf(CMPIString* s)
-{
-    return s != nullptr && s->ft != nullptr ? s->ft->getCharPtr(s, nullptr) : nullptr;
-}
+const installservice::ServiceKeyTexts kKeyTexts = {"getInstance_SoftwareInstallationService", nullptr, nullptr,
+                                                   nullptr};
 
 // A failure of the method: the text formatted, written to the error log (or
 // with `debugOnly` to the debug output) behind "<operation>: Error: ", and
@@ -121,86 +107,7 @@ unsigned int updateSynchronously(_tagZORAPSDMDevice* device, const char* fileNam
 
 }  // namespace
 
-CmpiStatus getInstanceOfService(const ServiceKeyTexts& texts, CmpiResult& rslt, const CmpiObjectPath& path,
-                                const char** properties, bool sendInstance,
-                                CmpiInstance (*make)(const char*, const char*, const char**))
-{
-    const std::string operation = texts.operation;
-    std::string keys[2];
-    const char* names[2] = {"Name", "SystemName"};
-    const char* readErrors[2] = {texts.nameKeyError, texts.systemNameKeyError};
-    CMPIObjectPath* enc = path.getEnc();
-    for (int k = 0; k < 2; ++k) {
-        if (readErrors[k] == nullptr) {
-            classmodule::KeyRead key = classmodule::readStringKey(path, names[k], operation);
-            if (!key.found)
-                return key.status;
-            keys[k] = key.text;
-            continue;
-        }
-        CMPIStatus rc = {CMPI_RC_OK, nullptr};
-        CMPIData data = enc->ft->getKey(enc, names[k], &rc);
-        if (rc.rc != CMPI_RC_OK) {
-            if (g_EnableLogError)
-                Vexlan_FC_Utils_CMPI::LogError("%s", readErrors[k]);
-            return CmpiStatus(rc);
-        }
-        if (data.type != CMPI_string) {
-            if (g_EnableLogError)
-                Vexlan_FC_Utils_CMPI::LogError("%s(%d)", texts.keyTypeError, static_cast<int>(data.type));
-            return CmpiStatus(rc);
-        }
-        const char* text = (data.state & CMPI_nullValue) ? nullptr : textOf(data.value.string);
-        keys[k] = text != nullptr ? text : "";
-    }
-    if (strcasecmp(keys[0].c_str(), kServiceName) != 0 || strcasecmp(keys[1].c_str(), hostName_ComputerSystem) != 0) {
-        if (g_EnableLogError)
-            Vexlan_FC_Utils_CMPI::LogError("%s: Error no matching instance found,                KeyValue=%s, "
-                                           "MatchingElement=%s, KeyValue2=%s, MatchingElement2=%s!",
-                                           operation.c_str(), keys[0].c_str(), kServiceName, keys[1].c_str(),
-                                           hostName_ComputerSystem);
-        throw CmpiStatus(CMPI_RC_ERR_NOT_FOUND, keys[0].c_str());
-    }
-    if (!sendInstance)
-        return CmpiStatus(CMPI_RC_OK);
-    classmodule::PathNames pathNames;
-    CmpiStatus st = classmodule::readPathNames(path, operation, pathNames);
-    if (st.rc() != CMPI_RC_OK)
-        return st;
-    rslt.returnData(make(pathNames.className, pathNames.nameSpace, properties));
-    return CmpiStatus(CMPI_RC_OK);
-}
-
-CmpiObjectPath makePath_SoftwareInstallationService(const char* className, const char* nameSpace)
-{
-    return kService.makePath(className, nameSpace, 0);
-}
-
-CmpiInstance makeInstance_SoftwareInstallationService(const char* className, const char* nameSpace,
-                                                      const char** properties)
-{
-    return kService.makeInstance(className, nameSpace, properties, 0);
-}
-
-CmpiStatus enumInstances_SoftwareInstallationService(const CmpiContext& ctx, CmpiResult& rslt,
-                                                     const CmpiObjectPath& path, const char** properties)
-{
-    return kService.enumInstances(ctx, rslt, path, properties);
-}
-
-CmpiStatus enumInstanceNames_SoftwareInstallationService(const CmpiContext& ctx, CmpiResult& rslt,
-                                                         const CmpiObjectPath& path)
-{
-    return kService.enumInstanceNames(ctx, rslt, path);
-}
-
-CmpiStatus getInstance_SoftwareInstallationService(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath& path,
-                                                   const char** properties, bool sendInstance)
-{
-    const ServiceKeyTexts texts = {"getInstance_SoftwareInstallationService", nullptr, nullptr, nullptr};
-    return getInstanceOfService(texts, rslt, path, properties, sendInstance, makeInstance_SoftwareInstallationService);
-}
-
+VEXLAN_INSTALLATION_SERVICE_OPERATIONS(SoftwareInstallationService, kService, kKeyTexts)
 VEXLAN_SINGLE_CLASS_OPERATIONS(SoftwareInstallationServiceCapabilities, kCapabilities)
 
 CmpiStatus invokeMethod_SoftwareInstallationService(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath& ref,
@@ -229,24 +136,10 @@ CmpiStatus invokeMethod_SoftwareInstallationService(const CmpiContext&, CmpiResu
         if (uri.isNullValue() || uri.isNotFound())
             fail(false, CMPI_RC_ERR_INVALID_PARAMETER, "URI argument is NULL!");
 
-        CMPIObjectPath* self = ref.getEnc();
-        CMPIStatus rc = {CMPI_RC_OK, nullptr};
-        self->ft->getClassName(self, &rc);
-        if (rc.rc != CMPI_RC_OK) {
-            if (g_EnableLogError)
-                Vexlan_FC_Utils_CMPI::LogError(
-                    "Vexlan_NIC_SoftwareInstallationService: Error getting classname, status.rc=%d!",
-                    static_cast<int>(rc.rc));
-            return CmpiStatus(rc);
-        }
-        const char* nameSpace = textOf(self->ft->getNameSpace(self, &rc));
-        if (rc.rc != CMPI_RC_OK) {
-            if (g_EnableLogError)
-                Vexlan_FC_Utils_CMPI::LogError(
-                    "Vexlan_NIC_SoftwareInstallationService: Error getting namespace, status.rc=%d!",
-                    static_cast<int>(rc.rc));
-            return CmpiStatus(rc);
-        }
+        const char* nameSpace = nullptr;
+        CmpiStatus failure(CMPI_RC_OK);
+        if (!installservice::readServiceNameSpace(ref, nameSpace, failure))
+            return failure;
 
         const CmpiObjectPath targetPath = target;
         const std::string targetClass = targetPath.getClassName().charPtr();
@@ -255,6 +148,7 @@ CmpiStatus invokeMethod_SoftwareInstallationService(const CmpiContext&, CmpiResu
                  targetClass.c_str(), "Vexlan_FCHBA_PortController");
 
         CMPIObjectPath* tp = targetPath.getEnc();
+        CMPIStatus rc = {CMPI_RC_OK, nullptr};
         CMPIData key = tp->ft->getKey(tp, "DeviceID", &rc);
         if (rc.rc != CMPI_RC_OK) {
             // A status with a message leaves the method as it came.
@@ -295,11 +189,11 @@ CmpiStatus invokeMethod_SoftwareInstallationService(const CmpiContext&, CmpiResu
         if (!options.asynchronous) {
             value = updateSynchronously(device, fileName, deviceId.c_str());
         } else {
-            CmpiObjectPath jobPath(nameSpace, "Vexlan_Adapter_ConcreteJob");
-            Vexlan_CNA_Provider* provider = g_Vexlan_CNA_Provider.load();
-            if (provider != nullptr &&
-                provider->StartFCFlashUpdateThread(device, reinterpret_cast<const unsigned char*>(fileName), jobPath)) {
-                out.setArg("Job", CmpiData(jobPath));
+            const auto start = [&](ProviderState& provider, CmpiObjectPath& jobPath) {
+                return StartFCFlashUpdateThread(provider, device, reinterpret_cast<const unsigned char*>(fileName),
+                                                jobPath);
+            };
+            if (installservice::startJob(nameSpace, out, start)) {
                 value = 4096;
             } else {
                 INSTALL_DEBUG("invokeMethod_SoftwareInstallationService: Failed to create flash update job thread");

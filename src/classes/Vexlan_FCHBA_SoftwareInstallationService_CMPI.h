@@ -16,16 +16,4 @@ CmpiStatus invokeMethod_SoftwareInstallationService(const CmpiContext& ctx, Cmpi
                                                     const CmpiObjectPath& ref, const char* methodName,
                                                     const CmpiArgs& in, CmpiArgs& out);
 
-// The getInstance of both services: Name and SystemName compared with the
-// service's, without regard to case. The log texts differ per service.
-struct ServiceKeyTexts {
-    const char* operation;        // prefix of the standard key error lines
-    const char* nameKeyError;     // null: the standard lines
-    const char* systemNameKeyError;
-    const char* keyTypeError;     // "...(%d)" form, with the type
-};
-CmpiStatus getInstanceOfService(const ServiceKeyTexts& texts, CmpiResult& rslt, const CmpiObjectPath& path,
-                                const char** properties, bool sendInstance,
-                                CmpiInstance (*make)(const char*, const char*, const char**));
-
 #endif

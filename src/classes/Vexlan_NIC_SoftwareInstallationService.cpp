@@ -2,35 +2,30 @@
 // flash update methods.
 #include "classes/Vexlan_NIC_SoftwareInstallationService.h"
 
-#include <fcntl.h>
 #include <strings.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
-#include <cerrno>
 #include <cstdio>
-#include <cstdlib>
 #include <string>
 #include <vector>
 
+#include "classes/InstallationServiceModule.h"
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
-#include "classes/Vexlan_FCHBA_SoftwareInstallationService_CMPI.h"
 #include "inventory/AdapterFunc.h"
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
 #include "support/ProviderFiles.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
+#include "support/Vexlan_NIC_PrefFile.h"
 #include "support/Vexlan_NIC_Utils.h"
+#include "update/FlashUpdate.h"
 #include "update/InstallHelpers.h"
+
+using installservice::kServiceName;
+using installservice::ServiceSlot;
+using installservice::textOf;
 
 namespace {
 
-const char kServiceName[] = "CNA_SW_INSTALLER";
 const char kLogPrefix[] = "Vexlan_NIC_SoftwareInstallationService";
-
-struct ServiceSlot {
-    unsigned char valid;
-};
-const ServiceSlot kSlot = {1};
 
 const PropertyRow<ServiceSlot> kServiceProperties[] = {
     {"Name", CMPI_string, CLASS_VALUE(ServiceSlot, entryText(kServiceName))},
@@ -41,14 +36,9 @@ const PropertyRow<ServiceSlot> kServiceProperties[] = {
     {"Description", CMPI_string, CLASS_VALUE(ServiceSlot, entryText("Updating CNA flash(boot code, firmwares..."))},
     {"ElementName", CMPI_string, CLASS_VALUE(ServiceSlot, entryText("Updating Vexlan CNA flash Image"))},
 };
-const char* const kServiceKeys[] = {"SystemCreationClassName", "SystemName", "CreationClassName", "Name", nullptr};
-
-const ClassModule<ServiceSlot> kService = ClassModule<ServiceSlot>("Nic_SoftwareInstallationService")
-                                              .single(kSlot)
-                                              .key("Name", [](const ServiceSlot&) { return kServiceName; })
-                                              .filterKeys(kServiceKeys)
-                                              .pathKeys(kServiceKeys)
-                                              .properties(kServiceProperties);
+const ClassModule<ServiceSlot> kService =
+    installservice::serviceModule("Nic_SoftwareInstallationService", "Name", installservice::kServiceKeys,
+                                  kServiceProperties);
 
 const PropertyRow<ServiceSlot> kCapabilitiesProperties[] = {
     {"InstanceID", CMPI_string, CLASS_VALUE(ServiceSlot, entryText(kServiceName))},
@@ -61,15 +51,15 @@ const PropertyRow<ServiceSlot> kCapabilitiesProperties[] = {
     {"Description", CMPI_string,
      CLASS_VALUE(ServiceSlot, entryText("Flash image includes boot code, ASIC and MPI Firmware"))},
 };
-const char* const kCapabilitiesKeys[] = {"InstanceID", nullptr};
-
 const ClassModule<ServiceSlot> kCapabilities =
-    ClassModule<ServiceSlot>("Nic_SoftwareInstallationServiceCapabilities")
-        .single(kSlot)
-        .key("InstanceID", [](const ServiceSlot&) { return kServiceName; })
-        .filterKeys(kCapabilitiesKeys)
-        .pathKeys(kCapabilitiesKeys)
-        .properties(kCapabilitiesProperties);
+    installservice::serviceModule("Nic_SoftwareInstallationServiceCapabilities", "InstanceID",
+                                  installservice::kCapabilitiesKeys, kCapabilitiesProperties);
+
+const installservice::ServiceKeyTexts kKeyTexts = {
+    "getInstance_Nic_SoftwareInstallationService",
+    "Vexlan_NIC_SoftwareIdentity: Error getting Name key in getInstance\n",
+    "Vexlan_NIC_SoftwareIdentity: Error getting SystemName key in getInstance\n",
+    "Vexlan_NIC_SoftwareIdentity: Error invalid key data type"};
 
 #define NIC_DEBUG(...)                                     \
     do {                                                   \
@@ -81,11 +71,6 @@ const ClassModule<ServiceSlot> kCapabilities =
         if (g_EnableLogError)                            \
             Vexlan_FC_Utils_CMPI::LogError(__VA_ARGS__); \
     } while (0)
-
-const char* textOf(CMPIString* s)
-{
-    return s != nullptr && s->ft != nullptr ? s->ft->getCharPtr(s, nullptr) : nullptr;
-}
 
 [[noreturn]] void raise(CMPIrc code)
 {
@@ -133,25 +118,9 @@ _CNAStruc* targetAdapter(const CmpiData& target, std::string& deviceId)
 // image's end and no further. Empty on failure.
 std::string imageFileOf(const std::vector<unsigned char>& image)
 {
-    char name[] = "/var/tmp/vxln_cna_image.XXXXXX";
-    const int fd = mkstemp(name);
-    if (fd < 0)
+    std::string name = "/var/tmp/vxln_cna_image.XXXXXX";
+    if (!WritePrivateTempFile(name, image.data(), image.size()))
         return std::string();
-    bool ok = fchmod(fd, S_IRUSR | S_IWUSR) == 0;
-    std::size_t done = 0;
-    while (ok && done < image.size()) {
-        const ssize_t n = write(fd, image.data() + done, image.size() - done);
-        if (n < 0 && errno == EINTR)
-            continue;
-        ok = n > 0;
-        if (ok)
-            done += static_cast<std::size_t>(n);
-    }
-    ok = close(fd) == 0 && ok;
-    if (!ok) {
-        unlink(name);
-        return std::string();
-    }
     return name;
 }
 
@@ -168,22 +137,9 @@ unsigned int installFromURI(const CmpiObjectPath& ref, const CmpiArgs& in, CmpiA
         raise(CMPI_RC_ERR_INVALID_PARAMETER);
     }
 
-    CMPIObjectPath* self = ref.getEnc();
-    CMPIStatus rc = {CMPI_RC_OK, nullptr};
-    self->ft->getClassName(self, &rc);
-    if (rc.rc != CMPI_RC_OK) {
-        NIC_ERROR("Vexlan_NIC_SoftwareInstallationService: Error getting classname, status.rc=%d!",
-                  static_cast<int>(rc.rc));
-        early = CmpiStatus(rc);
+    const char* nameSpace = nullptr;
+    if (!installservice::readServiceNameSpace(ref, nameSpace, early))
         return 0;
-    }
-    const char* nameSpace = textOf(self->ft->getNameSpace(self, &rc));
-    if (rc.rc != CMPI_RC_OK) {
-        NIC_ERROR("Vexlan_NIC_SoftwareInstallationService: Error getting namespace, status.rc=%d!",
-                  static_cast<int>(rc.rc));
-        early = CmpiStatus(rc);
-        return 0;
-    }
 
     const char* uriText = uri;
     if (uriText == nullptr)
@@ -242,14 +198,14 @@ unsigned int installFromURI(const CmpiObjectPath& ref, const CmpiArgs& in, CmpiA
                       "for it to be finished.");
             raise(CMPI_RC_ERR_INVALID_PARAMETER);
         }
-        CmpiObjectPath jobPath(nameSpace, "Vexlan_Adapter_ConcreteJob");
-        Vexlan_CNA_Provider* provider = g_Vexlan_CNA_Provider.load();
-        if (provider == nullptr || !provider->StartNICFlashUpdateThread(adapter, file, imageSize, jobPath)) {
+        const auto start = [&](ProviderState& provider, CmpiObjectPath& jobPath) {
+            return StartNICFlashUpdateThread(provider, adapter, file, imageSize, jobPath);
+        };
+        if (!installservice::startJob(nameSpace, out, start)) {
             gbFlashUpdateInProgress = false;
             NIC_DEBUG("Vexlan_NIC_SoftwareInstallationService: Failed to create flash update job thread");
             return 2;
         }
-        out.setArg("Job", CmpiData(jobPath));
         NIC_DEBUG("Vexlan_NIC_SoftwareInstallationService: Successfully created flash update job thread");
         return 4096;
     }
@@ -332,41 +288,7 @@ unsigned long long GetFlashImageFromURI(const char* uri, char* localFile)
     return GetFileSize(localFile);
 }
 
-CmpiObjectPath makePath_Nic_SoftwareInstallationService(const char* className, const char* nameSpace)
-{
-    return kService.makePath(className, nameSpace, 0);
-}
-
-CmpiInstance makeInstance_Nic_SoftwareInstallationService(const char* className, const char* nameSpace,
-                                                          const char** properties)
-{
-    return kService.makeInstance(className, nameSpace, properties, 0);
-}
-
-CmpiStatus enumInstances_Nic_SoftwareInstallationService(const CmpiContext& ctx, CmpiResult& rslt,
-                                                         const CmpiObjectPath& path, const char** properties)
-{
-    return kService.enumInstances(ctx, rslt, path, properties);
-}
-
-CmpiStatus enumInstanceNames_Nic_SoftwareInstallationService(const CmpiContext& ctx, CmpiResult& rslt,
-                                                             const CmpiObjectPath& path)
-{
-    return kService.enumInstanceNames(ctx, rslt, path);
-}
-
-CmpiStatus getInstance_Nic_SoftwareInstallationService(const CmpiContext&, CmpiResult& rslt,
-                                                       const CmpiObjectPath& path, const char** properties,
-                                                       bool sendInstance)
-{
-    const ServiceKeyTexts texts = {"getInstance_Nic_SoftwareInstallationService",
-                                   "Vexlan_NIC_SoftwareIdentity: Error getting Name key in getInstance\n",
-                                   "Vexlan_NIC_SoftwareIdentity: Error getting SystemName key in getInstance\n",
-                                   "Vexlan_NIC_SoftwareIdentity: Error invalid key data type"};
-    return getInstanceOfService(texts, rslt, path, properties, sendInstance,
-                                makeInstance_Nic_SoftwareInstallationService);
-}
-
+VEXLAN_INSTALLATION_SERVICE_OPERATIONS(Nic_SoftwareInstallationService, kService, kKeyTexts)
 VEXLAN_SINGLE_CLASS_OPERATIONS(Nic_SoftwareInstallationServiceCapabilities, kCapabilities)
 
 CmpiStatus invokeMethod_Nic_SoftwareInstallationService(const CmpiContext&, CmpiResult& rslt,

@@ -8,7 +8,7 @@
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
 #include "classes/Vexlan_Adapter_ConcreteJob_CMPI.h"
 #include "indications/Vexlan_CNA_HBAProviderIndications_CMPI.h"
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "state/IndicationGate.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 using indication::debug;
@@ -59,7 +59,7 @@ std::string modelPath(const Concrete_Job& job)
 template <class Fill>
 std::string send(const jobindication::Channel& channel, const char* className, const Concrete_Job& job, Fill&& fill)
 {
-    if (!Vexlan_CNA_Provider::m_bIndicationEnabled || !channel.usable())
+    if (!IndicationGate::m_bIndicationEnabled || !channel.usable())
         return std::string();
     std::lock_guard<std::mutex> guard(sendMutex);
     if (!sendingOpen) {

@@ -5,7 +5,7 @@
 // Threads. They are sent by the job's flash worker, which attaches to the
 // broker with a context prepared for it by the method request that started
 // the job. Like the alerts they are built only while the subscription gate
-// (Vexlan_CNA_Provider::m_bIndicationEnabled) is open. A provider life opens
+// (IndicationGate::m_bIndicationEnabled) is open. A provider life opens
 // the sending when it is initialised and closes it first thing in cleanup:
 // closing waits for a delivery in flight, and after it no worker builds or
 // delivers anything, so a job that ends while cleanup waits for it is not

@@ -17,7 +17,7 @@
 #include "classes/Vexlan_Adapter_ComputerSystem_CMPI.h"
 #include "classes/Vexlan_FC_FCPort_CMPI.h"
 #include "inventory/AdapterWalk.h"
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "state/ProviderState.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 std::atomic<std::uint32_t> g_indicationIdentifier{0};
@@ -174,9 +174,9 @@ const char* GetPortStatusString(unsigned short status)
     return status < sizeof(kPortStatusTexts) / sizeof(kPortStatusTexts[0]) ? kPortStatusTexts[status] : "Unknown";
 }
 
-bool alarmIsWanted(const Vexlan_CNA_Provider& provider, int alarmType)
+bool alarmIsWanted(const ProviderState& provider, int alarmType)
 {
-    return provider.initialized && Vexlan_CNA_Provider::m_bIndicationEnabled && alarmType == 0;
+    return provider.initialized && IndicationGate::m_bIndicationEnabled && alarmType == 0;
 }
 
 int OSSGenerateHostNotificationAlarm(unsigned int deviceNumber, int coreAlarmType, int stringParameterLength,
@@ -186,7 +186,7 @@ int OSSGenerateHostNotificationAlarm(unsigned int deviceNumber, int coreAlarmTyp
         std::string text = alarmText(stringParameterLength, stringParameter);
         debug("Alarm generated: Device Number: %u; coreAlarmType: %d, stringParameter: %s", deviceNumber,
               coreAlarmType, text.c_str());
-        if (g_Vexlan_CNA_Provider.load() == nullptr) {
+        if (g_RunningProviderState.load() == nullptr) {
             debug("OSSGenerateHostNotificationAlarm: ***** g_Vexlan_CNA_Provider is NULL");
             return 0;
         }
@@ -224,11 +224,11 @@ bool alarmsPending()
 void runPendingAlarms(ThreadArgs& args)
 {
     for (PendingAlarm& alarm : takePendingAlarms()) {
-        ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+        ProviderLockGuard lock(&ProviderLocks::provider_lock);
         try {
             std::string text = alarm.text;   // m_generateIndication takes a writable text
-            args.provider->m_generateIndication(alarm.device, alarm.type, alarm.length,
-                                                reinterpret_cast<unsigned char*>(&text[0]));
+            m_generateIndication(args, alarm.device, alarm.type, alarm.length,
+                                 reinterpret_cast<unsigned char*>(&text[0]));
         } catch (...) {
             debug("Exception generated when calling m_generateIndication");
         }
@@ -309,10 +309,10 @@ void deliverAlert(ThreadArgs& args, const CmpiInstance& alert, const DeliveryTex
 
 // ---- The adapter status alert --------------------------------------------------------
 
-void Vexlan_CNA_Provider::m_generateIndication(unsigned int deviceNum, int alarmType, int rsltParam,
-                                               unsigned char* strParam)
+void m_generateIndication(ThreadArgs& args, unsigned int deviceNum, int alarmType, int rsltParam,
+                          unsigned char* strParam)
 {
-    if (!alarmIsWanted(*this, alarmType))
+    if (!alarmIsWanted(*args.provider, alarmType))
         return;
 
     // First comparison: the list's status against the port's live one.
@@ -327,7 +327,7 @@ void Vexlan_CNA_Provider::m_generateIndication(unsigned int deviceNum, int alarm
     if (oldStatus == newStatus)
         return;
 
-    indication::BrokerMark mark(threadArgs.broker);
+    indication::BrokerMark mark(args.broker);
     CmpiInstance alert = indication::startAlert(kAdapterStatusClass);
 
     char element[1024] = "NOT FOUND";
@@ -394,7 +394,7 @@ void Vexlan_CNA_Provider::m_generateIndication(unsigned int deviceNum, int alarm
     debug("Vexlan_CNA_HBAProvider::messageStr=%s", message);
 
     debug("Calling Try to deliver indication");
-    indication::deliverAlert(threadArgs, alert,
+    indication::deliverAlert(args, alert,
                              {"Vexlan_CNA_Provider::m_generateIndication: Delivering...",
                               "Vexlan_CNA_Provider::m_generateIndication: Delivered",
                               "Vexlan_CNA_Provider::m_generateIndication: Error delivering indication"});

@@ -1,6 +1,5 @@
 // Indications of the provider: the adapter library's alarm callback, the
-// adapter status alert of an FC port (Vexlan_CNA_Provider::m_generateIndication)
-// and what it shares with the Ethernet link alerts of
+// adapter status alert of an FC port (m_generateIndication) and what it shares with the Ethernet link alerts of
 // Vexlan_NIC_ProviderIndications.cpp.
 //
 // Threads. The adapter library calls OSSGenerateHostNotificationAlarm on a
@@ -20,8 +19,8 @@
 
 #include "CmpiImpl.h"
 
+struct ProviderState;
 struct ThreadArgs;
-class Vexlan_CNA_Provider;
 
 // IndicationIdentifier of the last indication made; 0 at load, the first one
 // sent is "1". Shared by both kinds of alert.
@@ -36,7 +35,13 @@ int OSSGenerateHostNotificationAlarm(unsigned int deviceNumber, int coreAlarmTyp
 
 // True when an alarm of this type can lead to an indication: the provider's
 // first build has finished, a filter is active and the type is 0.
-bool alarmIsWanted(const Vexlan_CNA_Provider& provider, int alarmType);
+bool alarmIsWanted(const ProviderState& provider, int alarmType);
+
+// The adapter status alert, on the polling thread under provider_lock, with
+// the thread's block: compares the FC port's live state with the FC port list
+// and, when it changed, rebuilds the list and sends the alert.
+void m_generateIndication(ThreadArgs& args, unsigned int deviceNum, int alarmType, int rsltParam,
+                          unsigned char* strParam);
 
 // ---- Hand-off of alarms to the polling thread -----------------------------------
 // The polling thread receives alarms from startAlarmHandOff (after it attached)

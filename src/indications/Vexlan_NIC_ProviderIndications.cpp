@@ -1,6 +1,8 @@
 // Port alert indications: Vexlan_NIC_IndicationEthernetPortLinkUp and
 // ...LinkDown, sent by the link watch on the polling thread when a NIC port's
 // link state changed. The decision that it changed is the caller's.
+#include "indications/Vexlan_NIC_ProviderIndications.h"
+
 #include <cstdio>
 
 #include "classes/ClassModule.h"
@@ -8,7 +10,8 @@
 #include "classes/Vexlan_NIC_NetworkPort.h"
 #include "indications/Vexlan_CNA_HBAProviderIndications_CMPI.h"
 #include "inventory/AdapterFunc.h"
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "state/IndicationGate.h"
+#include "state/PollingBlock.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 using indication::debug;
@@ -83,7 +86,7 @@ void buildAndDeliver(ThreadArgs& args, const PortAlert& kind, _CNAStruc* adapter
 
 }  // namespace
 
-void Vexlan_CNA_Provider::generatePortAlertIndication(int alarmType, _CNAStruc* adapter, _CNAPortStruc* port)
+void generatePortAlertIndication(ThreadArgs& args, int alarmType, _CNAStruc* adapter, _CNAPortStruc* port)
 {
     debug("Entering Vexlan_NIC_Provider generatePortAlertIndication\n");
     if (alarmType != 1 && alarmType != 2) {
@@ -91,7 +94,7 @@ void Vexlan_CNA_Provider::generatePortAlertIndication(int alarmType, _CNAStruc* 
         return;
     }
     const PortAlert& kind = kPortAlerts[alarmType - 1];
-    if (!m_bIndicationEnabled) {
+    if (!IndicationGate::m_bIndicationEnabled) {
         debug("Indication generation is currently DISABLED...\n");
         return;
     }
@@ -99,7 +102,7 @@ void Vexlan_CNA_Provider::generatePortAlertIndication(int alarmType, _CNAStruc* 
     // A failure while the alert is built drops it like a failed delivery, and
     // the link watch goes on with the next port.
     try {
-        buildAndDeliver(threadArgs, kind, adapter, port);
+        buildAndDeliver(args, kind, adapter, port);
     } catch (...) {
         if (g_EnableLogError)
             Vexlan_FC_Utils_CMPI::LogError("Vexlan_NIC_Provider::generatePortAlertIndication: Error delivering indication\n");

@@ -2,7 +2,6 @@
 #include "inventory/AdapterFunc_LinkWatch.h"
 
 #include "inventory/AdapterFunc.h"
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 
 void Read_CNA_Port_Transceiver(const char* interfaceName, _CNAPortStruc* port)
@@ -23,7 +22,7 @@ void Read_CNA_Port_Transceiver(const char* interfaceName, _CNAPortStruc* port)
         Vexlan_FC_Utils_CMPI::DebugPrint("Transceiver on portID %u", port->portNumber);
 }
 
-void Update_CNA_List(ThreadArgs& args)
+void Update_CNA_List(ThreadArgs& args, PortAlertFn alert)
 {
     if (m_CNAList == nullptr)
         return;
@@ -47,7 +46,7 @@ void Update_CNA_List(ThreadArgs& args)
                 const bool up = fresh.linkState == ZORAP_LINK_UP && fresh.linkStateReserved == 0;
                 if (g_EnableDebugPrint)
                     Vexlan_FC_Utils_CMPI::DebugPrint(up ? "Generate LINK_UP event" : "Generate LINK_DOWN event");
-                args.provider->generatePortAlertIndication(up ? 1 : 2, adapter, port);
+                alert(args, up ? 1 : 2, adapter, port);
             }
             Read_CNA_Port_Transceiver(port->interfaceName, port);
         }

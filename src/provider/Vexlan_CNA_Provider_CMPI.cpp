@@ -10,47 +10,18 @@
 #include <cstdlib>
 #include <ctime>
 
+#include "associations/AssocDispatch.h"
 #include "indications/Vexlan_Adapter_JobIndications.h"
+#include "indications/Vexlan_CNA_HBAProviderIndications_CMPI.h"
+#include "indications/Vexlan_NIC_ProviderIndications.h"
 #include "inventory/AdapterFunc.h"
 #include "support/ClassTests.h"
 #include "support/RequestLists.h"
 #include "provider/Vexlan_CNA_Provider_Tables.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "update/FlashUpdate.h"
+#include "update/JobPersistence.h"
 #include "support/Vexlan_NIC_Properties.h"
-
-pthread_mutex_t Vexlan_CNA_Provider::provider_lock;
-pthread_mutex_t Vexlan_CNA_Provider::provider_write_lock;
-pthread_mutex_t Vexlan_CNA_Provider::linux_enable_indications_mutex;
-pthread_mutex_t Vexlan_CNA_Provider::properties_file_lock;
-std::atomic<bool> Vexlan_CNA_Provider::m_bIndicationEnabled{false};
-std::atomic<int> Vexlan_CNA_Provider::m_numSubscriptions{0};
-
-std::atomic<Vexlan_CNA_Provider*> g_Vexlan_CNA_Provider{nullptr};
-const int g_SUPPORT_HDR = 1;
-const int g_SupportTRB2xx = 1;
-
-// ---- Locks --------------------------------------------------------------------
-
-void lockProviderMutex(pthread_mutex_t* mutex)
-{
-    // Repeated until it succeeds; a failing call (never seen on a sound mutex)
-    // is retried after a short pause rather than at full speed.
-    while (pthread_mutex_lock(mutex) != 0) {
-        struct timespec pause = {0, 1000000};
-        nanosleep(&pause, nullptr);
-    }
-}
-
-ProviderLockGuard::ProviderLockGuard(pthread_mutex_t* mutex) : mutex_(mutex)
-{
-    lockProviderMutex(mutex_);
-}
-
-ProviderLockGuard::~ProviderLockGuard()
-{
-    pthread_mutex_unlock(mutex_);
-}
 
 namespace {
 
@@ -124,7 +95,7 @@ template <class Call>
 CmpiStatus dispatchInstanceRequest(const char* name, CmpiResult& rslt, const CmpiObjectPath& cop, Call&& call)
 {
     {
-        ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+        ProviderLockGuard lock(&ProviderLocks::provider_lock);
         const RequestScope request;
         try {
             CMPIStatus rc;
@@ -170,20 +141,17 @@ Vexlan_CNA_Provider::Vexlan_CNA_Provider(const CmpiBroker& mbp, const CmpiContex
       CmpiAssociationMI(mbp, ctx),
       CmpiIndicationMI(mbp, ctx),
       CmpiMethodMI(mbp, ctx),
-      methodContext(nullptr),
-      initialized(false),
-      initializing(false),
-      pollingEnabled(false),
-      threadArgs()
+      state(),
+      pollingEnabled(false)
 {
     Vexlan_FC_Utils_CMPI::InitializeLogFile();
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("Vexlan_CNA_Provider constructor was called");
 
-    initMutexOrExit(&provider_lock, "provider_lock");
-    initMutexOrExit(&linux_enable_indications_mutex, "enable_indications_mutex");
-    initMutexOrExit(&properties_file_lock, "properties_file_lock");
-    initMutexOrExit(&provider_write_lock, "provider_write_lock");
+    initMutexOrExit(&ProviderLocks::provider_lock, "provider_lock");
+    initMutexOrExit(&ProviderLocks::linux_enable_indications_mutex, "enable_indications_mutex");
+    initMutexOrExit(&ProviderLocks::properties_file_lock, "properties_file_lock");
+    initMutexOrExit(&ProviderLocks::provider_write_lock, "provider_write_lock");
 
     // Both log switches off, the configured texts at their defaults, then the
     // settings file; with the debug log on, the banner and the configuration.
@@ -191,11 +159,11 @@ Vexlan_CNA_Provider::Vexlan_CNA_Provider(const CmpiBroker& mbp, const CmpiContex
 
     // A provider made again in the same process (after the last cleanup)
     // starts with the subscription gate closed, as a fresh load does.
-    m_bIndicationEnabled = false;
-    m_numSubscriptions = 0;
+    IndicationGate::m_bIndicationEnabled = false;
+    IndicationGate::m_numSubscriptions = 0;
 
-    initialized = false;
-    initializing = false;
+    state.initialized = false;
+    state.initializing = false;
     pollingEnabled = false;
 }
 
@@ -203,12 +171,12 @@ Vexlan_CNA_Provider::~Vexlan_CNA_Provider()
 {
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider destructor was called *****");
-    pthread_mutex_destroy(&provider_lock);
-    pthread_mutex_destroy(&linux_enable_indications_mutex);
-    pthread_mutex_destroy(&properties_file_lock);
-    pthread_mutex_destroy(&provider_write_lock);
-    Vexlan_CNA_Provider* self = this;
-    g_Vexlan_CNA_Provider.compare_exchange_strong(self, nullptr);
+    pthread_mutex_destroy(&ProviderLocks::provider_lock);
+    pthread_mutex_destroy(&ProviderLocks::linux_enable_indications_mutex);
+    pthread_mutex_destroy(&ProviderLocks::properties_file_lock);
+    pthread_mutex_destroy(&ProviderLocks::provider_write_lock);
+    ProviderState* self = &state;
+    g_RunningProviderState.compare_exchange_strong(self, nullptr);
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("Vexlan_CNA_Provider destructor complete");
 }
@@ -227,7 +195,7 @@ CmpiStatus Vexlan_CNA_Provider::initialize(const CmpiContext& ctx)
 {
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider initialize was called *****");
-    if (initialized) {
+    if (state.initialized) {
         if (g_EnableDebugPrint)
             Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider already initialized *****\n\n");
         sleep(2);
@@ -238,7 +206,7 @@ CmpiStatus Vexlan_CNA_Provider::initialize(const CmpiContext& ctx)
     jobindication::open();
     // The running thread keeps the context it attached with until it ends.
     if (!pollingEnabled)
-        threadArgs.context = prepareThreadContext(ctx);
+        state.threadArgs.context = prepareThreadContext(ctx);
     startPollingLoop(ctx);
     // Gives the new thread time to take provider_lock, so that a request that
     // follows waits for the first build instead of seeing empty lists.
@@ -258,16 +226,16 @@ CmpiStatus Vexlan_CNA_Provider::cleanup(CmpiContext&)
     // returned.
     jobindication::close();
     WaitForFlashWorkers();
-    bool started = initializing || initialized;
-    if (initializing) {
-        while (!initialized)
+    bool started = state.initializing || state.initialized;
+    if (state.initializing) {
+        while (!state.initialized)
             sleep(1);
     }
     if (started) {
         stopPollingLoop();
         cleanupAgent();
-        initialized = false;
-        initializing = false;
+        state.initialized = false;
+        state.initializing = false;
     }
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("***** Vexlan_CNA_Provider cleanup done *****");
@@ -289,7 +257,7 @@ bool Vexlan_CNA_Provider::isUnloadable() const
 
 void Vexlan_CNA_Provider::cleanupAgent()
 {
-    ProviderLockGuard lock(&provider_lock);
+    ProviderLockGuard lock(&ProviderLocks::provider_lock);
     Clear_CNA_List();
     kPollingSteps.Clear_RegisteredProfile_List();
     std::size_t count = 0;
@@ -342,8 +310,8 @@ CmpiStatus Vexlan_CNA_Provider::setInstance(const CmpiContext&, CmpiResult&, con
         Vexlan_FC_Utils_CMPI::DebugPrint("Vexlan_CNA_Provider setInstance was called but NOT SUPPORTED");
     // Waits for any running request and any running backup enumeration.
     {
-        ProviderLockGuard outer(&provider_lock);
-        ProviderLockGuard inner(&provider_write_lock);
+        ProviderLockGuard outer(&ProviderLocks::provider_lock);
+        ProviderLockGuard inner(&ProviderLocks::provider_write_lock);
     }
     return CmpiStatus(CMPI_RC_ERR_NOT_SUPPORTED, "Vexlan_CNA_Provider cannot set");
 }
@@ -363,7 +331,7 @@ CmpiStatus Vexlan_CNA_Provider::invokeMethod(const CmpiContext& ctx, CmpiResult&
     // Up to five rounds of 2 seconds for the first build; the call goes on
     // after them whether it has finished or not.
     for (int round = 0; round < 5; ++round) {
-        if (!initialized) {
+        if (!state.initialized) {
             if (g_EnableDebugPrint)
                 Vexlan_FC_Utils_CMPI::DebugPrint("invokeMethod is waiting for the provider to initialize...");
             sleep(2);
@@ -372,8 +340,8 @@ CmpiStatus Vexlan_CNA_Provider::invokeMethod(const CmpiContext& ctx, CmpiResult&
     {
         // An exception out of a method passes to the wrapper, which turns it
         // into the status; the guards release both locks on the way.
-        ProviderLockGuard outer(&provider_lock);
-        ProviderLockGuard inner(&provider_write_lock);
+        ProviderLockGuard outer(&ProviderLocks::provider_lock);
+        ProviderLockGuard inner(&ProviderLocks::provider_write_lock);
         CMPIStatus rc;
         const char* className = classNameText(ref, rc);
         if (rc.rc != CMPI_RC_OK) {
@@ -391,8 +359,8 @@ CmpiStatus Vexlan_CNA_Provider::invokeMethod(const CmpiContext& ctx, CmpiResult&
         // Cleared on every way out, exceptions included.
         struct MethodContextScope {
             Vexlan_CNA_Provider& provider;
-            MethodContextScope(Vexlan_CNA_Provider& p, const CmpiContext& c) : provider(p) { p.methodContext = &c; }
-            ~MethodContextScope() { provider.methodContext = nullptr; }
+            MethodContextScope(Vexlan_CNA_Provider& p, const CmpiContext& c) : provider(p) { p.state.methodContext = &c; }
+            ~MethodContextScope() { provider.state.methodContext = nullptr; }
         } scope(*this, ctx);
         const PathClassTests classes(ref);
         for (std::size_t i = 0; i < count; ++i) {
@@ -409,7 +377,33 @@ CmpiStatus Vexlan_CNA_Provider::invokeMethod(const CmpiContext& ctx, CmpiResult&
 }
 
 // ---- Associations ---------------------------------------------------------------------
-// The four association operations are in associations/AssocDispatch.cpp.
+// The association dispatch of associations/AssocDispatch.h.
+
+CmpiStatus Vexlan_CNA_Provider::associators(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
+                                            const char* assocClass, const char* resultClass, const char* role,
+                                            const char* resultRole, const char** properties)
+{
+    return assocdispatch::associators(ctx, rslt, op, assocClass, resultClass, role, resultRole, properties);
+}
+
+CmpiStatus Vexlan_CNA_Provider::associatorNames(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
+                                                const char* assocClass, const char* resultClass, const char* role,
+                                                const char* resultRole)
+{
+    return assocdispatch::associatorNames(ctx, rslt, op, assocClass, resultClass, role, resultRole);
+}
+
+CmpiStatus Vexlan_CNA_Provider::references(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
+                                           const char* resultClass, const char* role, const char** properties)
+{
+    return assocdispatch::references(ctx, rslt, op, resultClass, role, properties);
+}
+
+CmpiStatus Vexlan_CNA_Provider::referenceNames(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& op,
+                                               const char* resultClass, const char* role)
+{
+    return assocdispatch::referenceNames(ctx, rslt, op, resultClass, role);
+}
 
 // ---- Indications ------------------------------------------------------------------------
 // The subscription gate: one process-wide switch, on while at least one filter
@@ -441,10 +435,10 @@ CmpiStatus Vexlan_CNA_Provider::activateFilter(const CmpiContext&, const CmpiSel
                                                const CmpiObjectPath&, CMPIBoolean)
 {
     debugLine("Entering Vexlan_CNA_Provider activateFilter\n");
-    m_bIndicationEnabled = true;
+    IndicationGate::m_bIndicationEnabled = true;
     // The count lines are formatted first and written as texts of their own.
     char text[64];
-    snprintf(text, sizeof(text), "Number of subscriptions is: %d\n", ++m_numSubscriptions);
+    snprintf(text, sizeof(text), "Number of subscriptions is: %d\n", ++IndicationGate::m_numSubscriptions);
     debugLine(text);
     return CmpiStatus(CMPI_RC_OK);
 }
@@ -455,12 +449,12 @@ CmpiStatus Vexlan_CNA_Provider::deActivateFilter(const CmpiContext&, const CmpiS
     debugLine("Entering Vexlan_CNA_Provider deActivateFilter\n");
     // Only a count of exactly 0 closes the gate: after an unbalanced
     // deactivation the count goes below 0 and the switch stays as it was.
-    const int before = m_numSubscriptions.fetch_sub(1);
+    const int before = IndicationGate::m_numSubscriptions.fetch_sub(1);
     char text[64];
     snprintf(text, sizeof(text), "Number of subscriptions still available is: %d\n", before);
     debugLine(text);
     if (before - 1 == 0)
-        m_bIndicationEnabled = false;
+        IndicationGate::m_bIndicationEnabled = false;
     return CmpiStatus(CMPI_RC_OK);
 }
 
@@ -470,8 +464,8 @@ CmpiStatus Vexlan_CNA_Provider::enableIndications()
     // Waits for the end of the first build, over which the polling thread
     // holds this mutex.
     {
-        ProviderLockGuard lock(&linux_enable_indications_mutex);
-        m_bIndicationEnabled = true;
+        ProviderLockGuard lock(&ProviderLocks::linux_enable_indications_mutex);
+        IndicationGate::m_bIndicationEnabled = true;
     }
     debugLine("enableIndications: Indication enabled\n");
     return CmpiStatus(CMPI_RC_OK);
@@ -480,7 +474,42 @@ CmpiStatus Vexlan_CNA_Provider::enableIndications()
 CmpiStatus Vexlan_CNA_Provider::disableIndications()
 {
     debugLine("Entering Vexlan_CNA_Provider disableIndications\n");
-    m_bIndicationEnabled = false;
+    IndicationGate::m_bIndicationEnabled = false;
     debugLine("disableIndications:Indications disabled\n");
     return CmpiStatus(CMPI_RC_OK);
+}
+
+// ---- Operations of the parts on this provider's state ------------------------------------
+
+void Vexlan_CNA_Provider::m_generateIndication(unsigned int deviceNum, int alarmType, int rsltParam,
+                                               unsigned char* strParam)
+{
+    ::m_generateIndication(state.threadArgs, deviceNum, alarmType, rsltParam, strParam);
+}
+
+void Vexlan_CNA_Provider::generatePortAlertIndication(int alarmType, _CNAStruc* adapter, _CNAPortStruc* port)
+{
+    ::generatePortAlertIndication(state.threadArgs, alarmType, adapter, port);
+}
+
+bool Vexlan_CNA_Provider::StartFCFlashUpdateThread(_tagZORAPSDMDevice* device, const unsigned char* fileName,
+                                                   CmpiObjectPath& jobPath)
+{
+    return ::StartFCFlashUpdateThread(state, device, fileName, jobPath);
+}
+
+bool Vexlan_CNA_Provider::StartNICFlashUpdateThread(_CNAStruc* adapter, const unsigned char* fileName,
+                                                    unsigned long long imageSize, CmpiObjectPath& jobPath)
+{
+    return ::StartNICFlashUpdateThread(state, adapter, fileName, imageSize, jobPath);
+}
+
+void Vexlan_CNA_Provider::SerializeConcreteJobInfo()
+{
+    SerializeConcreteJobToPrefFile();
+}
+
+void Vexlan_CNA_Provider::DeserializeConcreteJobInfo()
+{
+    DeserializeConcreteJobToPrefFile();
 }

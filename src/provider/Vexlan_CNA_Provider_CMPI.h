@@ -2,14 +2,9 @@
 // of the library enters here: the instance, association, indication and
 // method operations of CMPI, the lifecycle (initialize, cleanup,
 // isUnloadable) and the adapter polling thread that owns the life of the
-// process-wide lists.
-//
-// Locks, always taken in this order when more than one is held:
-//   provider_lock                   every request, the first build, every rebuild
-//   linux_enable_indications_mutex  held by the polling thread over the first build
-//   provider_write_lock             inner lock of invokeMethod and setInstance; the
-//                                   polling thread takes it alone around the
-//                                   backup enumeration
+// process-wide lists. The state it shares with the parts (locks, subscription
+// gate, polling thread's block, job map) is its ProviderState `state`
+// (state/ProviderState.h); the parts never see this class.
 #ifndef VEXLAN_PROVIDER_VEXLAN_CNA_PROVIDER_CMPI_H
 #define VEXLAN_PROVIDER_VEXLAN_CNA_PROVIDER_CMPI_H
 
@@ -20,39 +15,10 @@
 #include <vector>
 
 #include "CmpiImpl.h"
-#include "update/ConcreteJob.h"
+#include "state/ProviderState.h"
 
-class Vexlan_CNA_Provider;
 struct _CNAStruc;
 struct _CNAPortStruc;
-
-// The polling thread's block, inside the provider object.
-struct ThreadArgs {
-    CmpiBroker* broker;              // the broker of the provider's CmpiBaseMI part
-    CmpiContext* context;            // prepared with prepareAttachThread, owned by the provider
-    Vexlan_CNA_Provider* provider;
-    pthread_t threadId;
-    pthread_mutex_t mutex;           // guards threadExited and stopRequested
-    pthread_cond_t changed;          // signalled when either of them is set, and when
-                                     // an adapter alarm is handed to the thread
-    bool threadExited;               // set by the thread as its last act
-    bool stopRequested;              // set by stopPollingLoop
-};
-
-// Locks a pthread mutex for the life of the guard. The lock call is repeated
-// until it succeeds; the unlock happens on every way out of the scope.
-class ProviderLockGuard {
-public:
-    explicit ProviderLockGuard(pthread_mutex_t* mutex);
-    ~ProviderLockGuard();
-    ProviderLockGuard(const ProviderLockGuard&) = delete;
-    ProviderLockGuard& operator=(const ProviderLockGuard&) = delete;
-
-private:
-    pthread_mutex_t* mutex_;
-};
-// Locks with the same repeated call, for the places that unlock by hand.
-void lockProviderMutex(pthread_mutex_t* mutex);
 
 class Vexlan_CNA_Provider : public CmpiInstanceMI,
                             public CmpiAssociationMI,
@@ -121,49 +87,22 @@ public:
     // Removes every list and shuts the adapter library down, under provider_lock.
     void cleanupAgent();
 
-    // Indications (src/indications), both on the polling thread under
-    // provider_lock. An adapter alarm on an FC port: compares the port's live
-    // state with the FC port list and, when it changed, rebuilds the list and
-    // sends an adapter status alert. A NIC link change found by the link
-    // watch: alarm type 1 sends a link up alert, 2 a link down alert.
+    // The operations of the parts, on this provider's state: the alerts of
+    // src/indications (on the polling thread under provider_lock), the job
+    // starts of src/update and the job file of src/update.
     void m_generateIndication(unsigned int deviceNum, int alarmType, int rsltParam, unsigned char* strParam);
     void generatePortAlertIndication(int alarmType, _CNAStruc* adapter, _CNAPortStruc* port);
-
-    // Update jobs (src/update). The two start functions begin an
-    // asynchronous flash write on a worker thread of its own and enter its
-    // job in jobMap; false when no job id is free or the thread can't start.
-    // jobPath arrives with its name space and class and gets the InstanceID.
     bool StartFCFlashUpdateThread(_tagZORAPSDMDevice* device, const unsigned char* fileName,
                                   CmpiObjectPath& jobPath);
     bool StartNICFlashUpdateThread(_CNAStruc* adapter, const unsigned char* fileName,
                                    unsigned long long imageSize, CmpiObjectPath& jobPath);
-    // Forward to SerializeConcreteJobToPrefFile and DeserializeConcreteJobToPrefFile.
     void SerializeConcreteJobInfo();
     void DeserializeConcreteJobInfo();
 
-    // Every known update job by id, under jobStoreLock().
-    ConcreteJobMap jobMap;
-    // The context of the method request being served, set by invokeMethod
-    // under provider_lock for the length of the call; the start functions
-    // prepare each flash worker's own context from it. Null otherwise.
-    const CmpiContext* methodContext;
-
-    // Set by the polling thread: initializing as the first build begins,
-    // initialized when it has finished. Read without a lock by invokeMethod
-    // and cleanup.
-    std::atomic<bool> initialized;
-    std::atomic<bool> initializing;
+    // What the provider shares with its parts; made and gone with the provider.
+    ProviderState state;
     // Set by startPollingLoop, cleared by stopPollingLoop.
     std::atomic<bool> pollingEnabled;
-    ThreadArgs threadArgs;
-
-    static pthread_mutex_t provider_lock;
-    static pthread_mutex_t provider_write_lock;
-    static pthread_mutex_t linux_enable_indications_mutex;
-    static pthread_mutex_t properties_file_lock;
-    // The subscription gate: on while at least one filter is active.
-    static std::atomic<bool> m_bIndicationEnabled;
-    static std::atomic<int> m_numSubscriptions;
 
 private:
     // Prepares a context for the polling thread; the provider keeps every one
@@ -172,15 +111,6 @@ private:
 
     std::vector<std::unique_ptr<CmpiContext>> contextHolders_;
 };
-
-// The provider once its polling thread runs; null before and after. Read by
-// the flash workers and the alarm callback, which tolerate null.
-extern std::atomic<Vexlan_CNA_Provider*> g_Vexlan_CNA_Provider;
-
-// Compile-time switch of the SCSI endpoint, target and storage extent
-// classes in every route and in the build sequence.
-extern const int g_SUPPORT_HDR;
-extern const int g_SupportTRB2xx;
 
 // Result of the last ZORAP_DidConfigChange; used by the polling thread alone.
 extern int gNeedRefresh;

@@ -32,6 +32,11 @@ void debug(const char* text)
         Vexlan_FC_Utils_CMPI::DebugPrint("%s", text);
 }
 
+int pollingInterval()
+{
+    return Vexlan_NIC_Properties::instance()->linkStatusPollIntervalSeconds;
+}
+
 bool hdrRowSkipped(const ListSequenceRow& row)
 {
     return row.supportHdr && g_SUPPORT_HDR == 0;
@@ -57,15 +62,15 @@ void removeAllLists()
 }
 
 // The first build, with provider_lock and linux_enable_indications_mutex held.
-void firstBuild(Vexlan_CNA_Provider& provider)
+void firstBuild(ProviderState& provider)
 {
-    ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+    ProviderLockGuard lock(&ProviderLocks::provider_lock);
     // The indication mutex is never held across a request, so there is no
     // earlier holding to clear: an unlock of a mutex that this thread does not
     // hold is not made, and the line is the one such an unlock reports on a
     // default mutex. Then the mutex is taken for the whole build.
     debug("Indication Mutex was locked and has been unlocked ...");
-    ProviderLockGuard indications(&Vexlan_CNA_Provider::linux_enable_indications_mutex);
+    ProviderLockGuard indications(&ProviderLocks::linux_enable_indications_mutex);
 
     if (g_EnableDebugPrint)
         Vexlan_FC_Utils_CMPI::DebugPrint("Vexlan CNA CMPI provider, version: %s", vexlan::kProviderVersion);
@@ -96,13 +101,13 @@ void rebuild()
 {
     debug("gNeedRefresh flag is ON");
     {
-        ProviderLockGuard write(&Vexlan_CNA_Provider::provider_write_lock);
+        ProviderLockGuard write(&ProviderLocks::provider_write_lock);
         debug("About to call ZORAP_UpdateBackupAdapterList()");
         ZORAP_UpdateBackupAdapterList();
         debug("After the call to ZORAP_UpdateBackupAdapterList()");
     }
     {
-        ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+        ProviderLockGuard lock(&ProviderLocks::provider_lock);
         debug("About to call ZORAP_SwapBackupToMainAdapterList()");
         ZORAP_SwapBackupToMainAdapterList();
         debug("After the call to ZORAP_SwapBackupToMainAdapterList()");
@@ -120,16 +125,16 @@ void rebuild()
 
 // One round of the main loop: a poll when the interval has passed and no
 // flash write runs.
-void pollRound(Vexlan_CNA_Provider& provider, ThreadArgs& args, time_t& lastPoll)
+void pollRound(ThreadArgs& args, time_t& lastPoll)
 {
     time_t now = time(nullptr);
-    if (difftime(now, lastPoll) > provider.GetPollingInterval() && !gbFlashUpdateInProgress) {
+    if (difftime(now, lastPoll) > pollingInterval() && !gbFlashUpdateInProgress) {
         gNeedRefresh = ZORAP_DidConfigChange();
         ZORAP_ResetConfigChange();
         if (gNeedRefresh != 0)
             rebuild();
         {
-            ProviderLockGuard lock(&Vexlan_CNA_Provider::provider_lock);
+            ProviderLockGuard lock(&ProviderLocks::provider_lock);
             kPollingSteps.Update_CNA_List(args);
         }
         lastPoll = now;
@@ -164,8 +169,8 @@ void* AdapterPollingLoop(void* rawArgs)
             Vexlan_FC_Utils_CMPI::LogError("**** Error: Thread context not established for poll thread");
         exit(1);
     }
-    Vexlan_CNA_Provider& provider = *args->provider;
-    g_Vexlan_CNA_Provider = args->provider;
+    ProviderState& provider = *args->provider;
+    g_RunningProviderState = args->provider;
 
     try {
         args->broker->attachThread(*args->context);
@@ -192,7 +197,7 @@ void* AdapterPollingLoop(void* rawArgs)
     for (;;) {
         try {
             runPendingAlarms(*args);
-            pollRound(provider, *args, lastPoll);
+            pollRound(*args, lastPoll);
         } catch (...) {
             if (g_EnableLogError)
                 Vexlan_FC_Utils_CMPI::LogError("AdapterPollingLoop() detected an exception during a poll");
@@ -227,7 +232,7 @@ void* AdapterPollingLoop(void* rawArgs)
 
 int Vexlan_CNA_Provider::GetPollingInterval()
 {
-    return Vexlan_NIC_Properties::instance()->linkStatusPollIntervalSeconds;
+    return pollingInterval();
 }
 
 void Vexlan_CNA_Provider::startPollingLoop(const CmpiContext& ctx)
@@ -237,27 +242,27 @@ void Vexlan_CNA_Provider::startPollingLoop(const CmpiContext& ctx)
         debug("  Polling already enabled");
         return;
     }
-    threadArgs.broker = broker;
-    threadArgs.context = prepareThreadContext(ctx);
-    threadArgs.provider = this;
-    threadArgs.stopRequested = false;
-    threadArgs.threadExited = false;
+    state.threadArgs.broker = broker;
+    state.threadArgs.context = prepareThreadContext(ctx);
+    state.threadArgs.provider = &state;
+    state.threadArgs.stopRequested = false;
+    state.threadArgs.threadExited = false;
 
     // The block's mutex and condition exist before the thread that uses them.
-    int rc = pthread_mutex_init(&threadArgs.mutex, nullptr);
+    int rc = pthread_mutex_init(&state.threadArgs.mutex, nullptr);
     if (rc != 0) {
         if (g_EnableLogError)
             Vexlan_FC_Utils_CMPI::LogError("Error %d Initializing provider_lock mutex", rc);
         exit(1);
     }
-    pthread_cond_init(&threadArgs.changed, nullptr);
+    pthread_cond_init(&state.threadArgs.changed, nullptr);
 
-    rc = pthread_create(&threadArgs.threadId, nullptr, AdapterPollingLoop, &threadArgs);
+    rc = pthread_create(&state.threadArgs.threadId, nullptr, AdapterPollingLoop, &state.threadArgs);
     if (rc != 0) {
         if (g_EnableLogError)
             Vexlan_FC_Utils_CMPI::LogError("Error %d creating the polling thread", rc);
-        pthread_cond_destroy(&threadArgs.changed);
-        pthread_mutex_destroy(&threadArgs.mutex);
+        pthread_cond_destroy(&state.threadArgs.changed);
+        pthread_mutex_destroy(&state.threadArgs.mutex);
         return;
     }
     pollingEnabled = true;
@@ -272,25 +277,25 @@ void Vexlan_CNA_Provider::stopPollingLoop()
         return;
     }
     {
-        ProviderLockGuard lock(&threadArgs.mutex);
-        threadArgs.stopRequested = true;
-        pthread_cond_broadcast(&threadArgs.changed);
-        while (!threadArgs.threadExited) {
+        ProviderLockGuard lock(&state.threadArgs.mutex);
+        state.threadArgs.stopRequested = true;
+        pthread_cond_broadcast(&state.threadArgs.changed);
+        while (!state.threadArgs.threadExited) {
             struct timespec until;
             clock_gettime(CLOCK_REALTIME, &until);
             until.tv_sec += 1;
-            pthread_cond_timedwait(&threadArgs.changed, &threadArgs.mutex, &until);
+            pthread_cond_timedwait(&state.threadArgs.changed, &state.threadArgs.mutex, &until);
         }
     }
     debug("stopPollingLoop() calling pthread_join");
-    int rc = pthread_join(threadArgs.threadId, nullptr);
+    int rc = pthread_join(state.threadArgs.threadId, nullptr);
     if (rc != 0) {
         if (g_EnableLogError)
             Vexlan_FC_Utils_CMPI::LogError("stopPollingLoop() called to pthread_join failed with %d", rc);
     } else {
         debug("stopPollingLoop() completed pthread_join");
     }
-    pthread_cond_destroy(&threadArgs.changed);
-    pthread_mutex_destroy(&threadArgs.mutex);
+    pthread_cond_destroy(&state.threadArgs.changed);
+    pthread_mutex_destroy(&state.threadArgs.mutex);
     pollingEnabled = false;
 }

@@ -35,13 +35,13 @@
 #include "classes/Vexlan_Adapter_PhysicalConnector_CMPI.h"
 #include "classes/Vexlan_Adapter_PhysicalPort_CMPI.h"
 #include "indications/Vexlan_CNA_HBAProviderIndications_CMPI.h"
+#include "indications/Vexlan_NIC_ProviderIndications.h"
 #include "inventory/AdapterFunc_LinkWatch.h"
 #include "classes/Vexlan_Adapter_ConcreteJob_CMPI.h"
 #include "classes/Vexlan_FCHBA_SoftwareIdentity_CMPI.h"
 #include "classes/Vexlan_FCHBA_SoftwareInstallationService_CMPI.h"
 #include "classes/Vexlan_NIC_SoftwareIdentity.h"
 #include "classes/Vexlan_NIC_SoftwareInstallationService.h"
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
 #include "update/JobPersistence.h"
 
 namespace {
@@ -179,7 +179,11 @@ namespace steps {
 constexpr void (*InitializeRegisteredProfileList)() = ::InitializeRegisteredProfileList;
 constexpr void (*Clear_RegisteredProfile_List)() = ::Clear_RegisteredProfile_List;
 constexpr void (*DeserializeConcreteJobToPrefFile)() = ::DeserializeConcreteJobToPrefFile;
-constexpr void (*Update_CNA_List)(ThreadArgs&) = ::Update_CNA_List;
+// The link watch, with the Ethernet link alerts for the links it finds changed.
+void Update_CNA_List(ThreadArgs& args)
+{
+    ::Update_CNA_List(args, ::generatePortAlertIndication);
+}
 constexpr ZORAP_ALARM_CALLBACK OSSGenerateHostNotificationAlarm = ::OSSGenerateHostNotificationAlarm;
 }  // namespace steps
 

@@ -10,35 +10,9 @@
 
 #include "CmpiImpl.h"
 #include "zorap_cna.h"
+#include "state/ModuleOps.h"
+#include "state/PollingBlock.h"
 #include "support/RequestLists.h"
-
-struct ThreadArgs;
-
-using EnumInstanceNamesOp = CmpiStatus (*)(const CmpiContext&, CmpiResult&, const CmpiObjectPath&);
-using EnumInstancesOp = CmpiStatus (*)(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char**);
-// getInstance_X with its sendInstance argument; the dispatcher passes true.
-using GetInstanceOp = CmpiStatus (*)(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char**,
-                                     bool);
-using InvokeMethodOp = CmpiStatus (*)(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char*,
-                                      const CmpiArgs&, CmpiArgs&);
-
-// The three request operations of one class or association module.
-struct ClassOps {
-    EnumInstanceNamesOp enumInstanceNames;
-    EnumInstancesOp enumInstances;
-    GetInstanceOp getInstance;
-};
-#define CLASS_OPS(X) ClassOps{::enumInstanceNames_##X, ::enumInstances_##X, ::getInstance_##X}
-
-// For a module whose getInstance_X has no sendInstance argument:
-//     ClassOps{::enumInstanceNames_X, ::enumInstances_X, withoutSendFlag<::getInstance_X>}
-template <CmpiStatus (*Get)(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char**)>
-CmpiStatus withoutSendFlag(const CmpiContext& ctx, CmpiResult& rslt, const CmpiObjectPath& cop,
-                           const char** properties, bool)
-{
-    return Get(ctx, rslt, cop, properties);
-}
-
 
 // The three groups of routes, walked in this order; a match ends its group,
 // not the request.

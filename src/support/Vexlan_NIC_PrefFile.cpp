@@ -111,25 +111,8 @@ bool replaceFile(const char* path, const std::string& content)
         return false;
     }
     std::string temp = std::string(path) + ".XXXXXX";
-    const int fd = mkstemp(&temp[0]);
-    if (fd < 0) {
+    if (!WritePrivateTempFile(temp, content.data(), content.size())) {
         PREF_ERROR("Failed to write to temp file!");
-        return false;
-    }
-    bool ok = fchmod(fd, S_IRUSR | S_IWUSR) == 0;
-    std::size_t done = 0;
-    while (ok && done < content.size()) {
-        const ssize_t n = write(fd, content.data() + done, content.size() - done);
-        if (n < 0 && errno == EINTR)
-            continue;
-        ok = n > 0;
-        if (ok)
-            done += static_cast<std::size_t>(n);
-    }
-    ok = close(fd) == 0 && ok;
-    if (!ok) {
-        PREF_ERROR("Failed to write to temp file!");
-        unlink(temp.c_str());
         return false;
     }
     if (rename(temp.c_str(), path) != 0) {
@@ -187,6 +170,28 @@ void setInLines(std::vector<std::string>& lines, const unsigned char* key, const
 }
 
 }  // namespace
+
+bool WritePrivateTempFile(std::string& nameTemplate, const void* data, std::size_t size)
+{
+    const int fd = mkstemp(&nameTemplate[0]);
+    if (fd < 0)
+        return false;
+    const char* bytes = static_cast<const char*>(data);
+    bool ok = fchmod(fd, S_IRUSR | S_IWUSR) == 0;
+    std::size_t done = 0;
+    while (ok && done < size) {
+        const ssize_t n = write(fd, bytes + done, size - done);
+        if (n < 0 && errno == EINTR)
+            continue;
+        ok = n > 0;
+        if (ok)
+            done += static_cast<std::size_t>(n);
+    }
+    ok = close(fd) == 0 && ok;
+    if (!ok)
+        unlink(nameTemplate.c_str());
+    return ok;
+}
 
 PrefRewrite::PrefRewrite()
 {

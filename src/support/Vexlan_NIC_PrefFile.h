@@ -8,13 +8,14 @@
 // into place: a reader sees the old file or the new one, never a mixture, and
 // no tail of older content stays behind.
 //
-// The functions take no lock; the job store (update/ConcreteJob.h) serialises
+// The functions take no lock; the job store (state/JobStore.h) serialises
 // every use.
 #ifndef VEXLAN_SUPPORT_VEXLAN_NIC_PREFFILE_H
 #define VEXLAN_SUPPORT_VEXLAN_NIC_PREFFILE_H
 
 #include <cstddef>
 #include <cstdio>
+#include <string>
 
 // The file of the saved jobs.
 extern const unsigned char kPrefFileName[];
@@ -40,6 +41,11 @@ int PrefSetProperty(FILE* file, const unsigned char* key, const unsigned char* v
 // The value behind `key` on the first line that holds it, or null. The text
 // lives in a buffer of this thread until its next call.
 char* PrefGetProperty(FILE* file, const unsigned char* key);
+
+// A new private file (mode 0600) made by mkstemp from `nameTemplate`, which
+// then holds its name, with `size` bytes of `data` written and the file
+// closed. False, with nothing left behind, when it can't be made or written.
+bool WritePrivateTempFile(std::string& nameTemplate, const void* data, std::size_t size);
 
 // A new version of the preference file made of many PrefSetProperty calls:
 // while it lives, PrefSetProperty with a null file on this thread changes a

@@ -5,7 +5,7 @@
 
 #include <cstdlib>
 
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "state/ProviderState.h"
 #include "update/FlashUpdate.h"
 
 namespace {
@@ -34,12 +34,6 @@ std::optional<unsigned short> JobPercentComplete(const Concrete_Job& job)
     return std::nullopt;
 }
 
-std::recursive_mutex& jobStoreLock()
-{
-    static std::recursive_mutex lock;
-    return lock;
-}
-
 unsigned PickNextJobIdIn(const ConcreteJobMap& jobs)
 {
     // With every id taken no draw can succeed: the job is refused instead of
@@ -55,7 +49,7 @@ unsigned PickNextJobIdIn(const ConcreteJobMap& jobs)
 
 unsigned PickNextJobId()
 {
-    Vexlan_CNA_Provider* provider = g_Vexlan_CNA_Provider.load();
+    ProviderState* provider = g_RunningProviderState.load();
     std::lock_guard<std::recursive_mutex> guard(jobStoreLock());
     if (provider == nullptr)
         return PickNextJobIdIn(ConcreteJobMap());

@@ -1,4 +1,4 @@
-// The flash update workers and the two start functions of the provider.
+// The flash update workers and the two start functions.
 #include "update/FlashUpdate.h"
 
 #include <pthread.h>
@@ -14,7 +14,7 @@
 
 #include "indications/Vexlan_Adapter_JobIndications.h"
 #include "inventory/AdapterFunc.h"
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "state/ProviderState.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "update/ConcreteJob.h"
 #include "update/JobPersistence.h"
@@ -75,7 +75,7 @@ jobindication::Channel takeChannel()
 
 // A context for a new worker, prepared from the method request that starts
 // it; none when the start comes from elsewhere or the broker gives none.
-jobindication::Channel prepareChannel(Vexlan_CNA_Provider& provider)
+jobindication::Channel prepareChannel(ProviderState& provider)
 {
     jobindication::Channel channel;
     if (provider.threadArgs.broker == nullptr || provider.methodContext == nullptr)
@@ -161,7 +161,7 @@ std::string jobDescription(const char* side, const std::string& serial, const un
 // Enters the job, starts its worker, saves the jobs and names the job in
 // `jobPath`. False, with the job taken back out, when no id is free or the
 // thread can't start.
-bool startJob(Vexlan_CNA_Provider& provider, Concrete_Job& job, void* (*proc)(void*), CmpiObjectPath& jobPath)
+bool startJob(ProviderState& provider, Concrete_Job& job, void* (*proc)(void*), CmpiObjectPath& jobPath)
 {
     joinWorkers(false);
     std::lock_guard<std::recursive_mutex> guard(jobStoreLock());
@@ -200,7 +200,7 @@ bool startJob(Vexlan_CNA_Provider& provider, Concrete_Job& job, void* (*proc)(vo
         workers.push_back(Worker{thread, false, job.id, channel});
     }
     provider.jobMap[job.id].threadId = thread;
-    provider.SerializeConcreteJobInfo();
+    SerializeConcreteJobToPrefFile();
     char id[256] = {};
     std::snprintf(id, sizeof(id), "%u", job.id);
     jobPath.setKey("InstanceID", CmpiData(id));
@@ -217,7 +217,7 @@ void finishJob(Concrete_Job* job, unsigned int result, const AttachedWorker& att
     job->status = result == 0 ? 2 : 1;
     job->result = result;
     gbFlashUpdateInProgress = false;
-    Vexlan_CNA_Provider* provider = g_Vexlan_CNA_Provider.load();
+    ProviderState* provider = g_RunningProviderState.load();
     {
         std::lock_guard<std::recursive_mutex> guard(jobStoreLock());
         if (provider != nullptr)
@@ -225,7 +225,7 @@ void finishJob(Concrete_Job* job, unsigned int result, const AttachedWorker& att
         job->timeOfLastStateChange = JobTimeNow();
         if (provider != nullptr) {
             provider->jobMap[job->id] = *job;
-            provider->SerializeConcreteJobInfo();
+            SerializeConcreteJobToPrefFile();
         }
     }
     jobindication::sendModification(attached.channel(), previous, *job, creationIdentifier);
@@ -318,8 +318,8 @@ int FlashWorkerCount()
     return static_cast<int>(workers.size());
 }
 
-bool Vexlan_CNA_Provider::StartFCFlashUpdateThread(_tagZORAPSDMDevice* device, const unsigned char* fileName,
-                                                   CmpiObjectPath& jobPath)
+bool StartFCFlashUpdateThread(ProviderState& provider, _tagZORAPSDMDevice* device, const unsigned char* fileName,
+                              CmpiObjectPath& jobPath)
 {
     Concrete_Job job;
     job.isNic = false;
@@ -328,11 +328,11 @@ bool Vexlan_CNA_Provider::StartFCFlashUpdateThread(_tagZORAPSDMDevice* device, c
     if (device != nullptr)
         job.serialNumber.assign(device->deviceSerial, strnlen(device->deviceSerial, sizeof(device->deviceSerial)));
     job.description = jobDescription("FC", job.serialNumber, fileName);
-    return startJob(*this, job, FCFlashUpdateProc, jobPath);
+    return startJob(provider, job, FCFlashUpdateProc, jobPath);
 }
 
-bool Vexlan_CNA_Provider::StartNICFlashUpdateThread(_CNAStruc* adapter, const unsigned char* fileName,
-                                                    unsigned long long, CmpiObjectPath& jobPath)
+bool StartNICFlashUpdateThread(ProviderState& provider, _CNAStruc* adapter, const unsigned char* fileName,
+                               unsigned long long, CmpiObjectPath& jobPath)
 {
     Concrete_Job job;
     job.isNic = true;
@@ -343,5 +343,5 @@ bool Vexlan_CNA_Provider::StartNICFlashUpdateThread(_CNAStruc* adapter, const un
         job.adapterInstance = adapter->adapterInstance;
     }
     job.description = jobDescription("NIC", job.serialNumber, fileName);
-    return startJob(*this, job, NICFlashUpdateProc, jobPath);
+    return startJob(provider, job, NICFlashUpdateProc, jobPath);
 }

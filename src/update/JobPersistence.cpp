@@ -7,7 +7,7 @@
 #include <cstdio>
 #include <cstring>
 
-#include "provider/Vexlan_CNA_Provider_CMPI.h"
+#include "state/ProviderState.h"
 #include "support/ProviderFiles.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
 #include "support/Vexlan_NIC_PrefFile.h"
@@ -138,7 +138,7 @@ void DeserializeJobsFromPrefFile(ConcreteJobMap& jobs, unsigned long long now)
 
 void SerializeConcreteJobToPrefFile()
 {
-    Vexlan_CNA_Provider* provider = g_Vexlan_CNA_Provider.load();
+    ProviderState* provider = g_RunningProviderState.load();
     if (provider == nullptr)
         return;
     std::lock_guard<std::recursive_mutex> guard(jobStoreLock());
@@ -147,20 +147,10 @@ void SerializeConcreteJobToPrefFile()
 
 void DeserializeConcreteJobToPrefFile()
 {
-    Vexlan_CNA_Provider* provider = g_Vexlan_CNA_Provider.load();
+    ProviderState* provider = g_RunningProviderState.load();
     if (provider == nullptr)
         return;
     DeserializeJobsFromPrefFile(provider->jobMap, JobTimeNow());
-}
-
-void Vexlan_CNA_Provider::SerializeConcreteJobInfo()
-{
-    SerializeConcreteJobToPrefFile();
-}
-
-void Vexlan_CNA_Provider::DeserializeConcreteJobInfo()
-{
-    DeserializeConcreteJobToPrefFile();
 }
 
 unsigned long long GetDataFromFile(const char* path, unsigned long long size, unsigned char* buffer)

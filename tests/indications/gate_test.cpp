@@ -33,8 +33,8 @@ protected:
 
     void activate() { provider_->activateFilter(context_, select_, "C", path_, 1); }
     void deactivate() { provider_->deActivateFilter(context_, select_, "C", path_, 1); }
-    static bool on() { return Vexlan_CNA_Provider::m_bIndicationEnabled; }
-    static int count() { return Vexlan_CNA_Provider::m_numSubscriptions; }
+    static bool on() { return IndicationGate::m_bIndicationEnabled; }
+    static int count() { return IndicationGate::m_numSubscriptions; }
 
     std::unique_ptr<CmpiBroker> broker_;
     CmpiContext context_;
@@ -69,7 +69,7 @@ TEST_F(Gate, OnlyACountOfExactlyZeroClosesIt)
 TEST_F(Gate, EnableIndicationsWaitsWhileTheFirstBuildHoldsItsMutex)
 {
     std::atomic<bool> returned{false};
-    pthread_mutex_lock(&Vexlan_CNA_Provider::linux_enable_indications_mutex);
+    pthread_mutex_lock(&ProviderLocks::linux_enable_indications_mutex);
     std::thread caller([&] {
         provider_->enableIndications();
         returned = true;
@@ -77,7 +77,7 @@ TEST_F(Gate, EnableIndicationsWaitsWhileTheFirstBuildHoldsItsMutex)
     std::this_thread::sleep_for(std::chrono::milliseconds(100));
     EXPECT_FALSE(returned.load());
     EXPECT_FALSE(on());
-    pthread_mutex_unlock(&Vexlan_CNA_Provider::linux_enable_indications_mutex);
+    pthread_mutex_unlock(&ProviderLocks::linux_enable_indications_mutex);
     caller.join();
     EXPECT_TRUE(on());
     EXPECT_EQ(countLog("enableIndications: Indication enabled"), 1);

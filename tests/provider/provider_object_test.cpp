@@ -51,8 +51,8 @@ TEST_F(ProviderObject, ASecondInitializeStartsNoSecondThreadAndCleanupStopsIt)
 {
     const int threadsBefore = threadCount();
     ASSERT_TRUE(provider_->initialize(context_).rc() == CMPI_RC_OK);
-    EXPECT_TRUE(provider_->initialized);
-    EXPECT_TRUE(provider_->initializing);
+    EXPECT_TRUE(provider_->state.initialized);
+    EXPECT_TRUE(provider_->state.initializing);
     // The polling thread, and the adapter library's alarm thread.
     const int threadsRunning = threadCount();
     EXPECT_EQ(threadsRunning, threadsBefore + 2);
@@ -66,8 +66,8 @@ TEST_F(ProviderObject, ASecondInitializeStartsNoSecondThreadAndCleanupStopsIt)
 
     CmpiContext ctx(fake::newContext());
     ASSERT_TRUE(provider_->cleanup(ctx).rc() == CMPI_RC_OK);
-    EXPECT_FALSE(provider_->initialized);
-    EXPECT_FALSE(provider_->initializing);
+    EXPECT_FALSE(provider_->state.initialized);
+    EXPECT_FALSE(provider_->state.initializing);
     EXPECT_FALSE(provider_->pollingEnabled);
     EXPECT_EQ(fake::attachedThreads(), 0);
     EXPECT_EQ(threadCount(), threadsBefore);
@@ -76,7 +76,7 @@ TEST_F(ProviderObject, ASecondInitializeStartsNoSecondThreadAndCleanupStopsIt)
 
     // The same object may start again after a cleanup.
     ASSERT_TRUE(provider_->initialize(context_).rc() == CMPI_RC_OK);
-    EXPECT_TRUE(provider_->initialized);
+    EXPECT_TRUE(provider_->state.initialized);
     EXPECT_EQ(zorap_sim_call_count(ZORAP_FN_Initialize), 2u);
 }
 
