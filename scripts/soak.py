@@ -27,8 +27,18 @@ Then it prints a report. Needs wbemcli (sblim-wbemcli) and Python 3.
 
 The description file (beside the installed adapter library unless
 --description says otherwise) is restored at the end. The server should read
-a LinkStatusPollIntervalSeconds of a few seconds (vexlancna.properties in its
-working directory), so link changes and configuration changes show soon.
+a LinkStatusPollIntervalSeconds of a few seconds (vexlancna.properties in the
+working directory of the process that runs the provider), so link changes and
+configuration changes show soon. The report names that directory and the
+interval it found there: with the default of 180 seconds most FC alerts are
+lost, because every edit of the description made while a configuration
+change waits for the next poll counts as part of that change, port states
+included, and the rebuild at the poll takes them in without an alert. sfcbd
+started as a daemon, or through nsenter, runs in "/".
+
+Classes marked for the interop namespace are asked there only when the
+server has them there (sfcb; OpenPegasus's own interop provider serves that
+namespace and gets no class of the provider).
 """
 
 import argparse
@@ -65,6 +75,9 @@ class Soak:
         self.subscriptions = collections.Counter()
         self.subscribed = False
         self.samples = []
+        self.rows = None
+        self.not_in_interop = []
+        self.settings = "?"
         self.start = time.time()
 
     # ------------------------------------------------------------ requests
@@ -91,6 +104,12 @@ class Soak:
         return ok, out
 
     def classes(self):
+        """(class, namespace, association) of every instance class; the rows
+        of the interop namespace only for the classes the server has there
+        (OpenPegasus gets none: its own interop provider serves that
+        namespace), found once."""
+        if self.rows is not None:
+            return list(self.rows)
         table = os.path.join(self.a.prefix, "share", "vexlan-cna", "classes.tsv")
         rows = []
         with open(table) as f:
@@ -101,9 +120,41 @@ class Soak:
                 kinds = cols[3].split()
                 if "instance" not in kinds:
                     continue
-                spaces = [self.a.namespace] + ([self.a.interop] if "interop" in cols[1].split() else [])
-                rows.extend((cols[0], ns, "association" in kinds) for ns in spaces)
-        return rows
+                rows.append((cols[0], self.a.namespace, "association" in kinds))
+                if "interop" in cols[1].split():
+                    ok, out = self.wbemcli("gc", "%s/%s:%s" % (self.url, self.a.interop, cols[0]))
+                    if ok:
+                        rows.append((cols[0], self.a.interop, "association" in kinds))
+                    else:
+                        self.not_in_interop.append(cols[0])
+        self.rows = rows
+        return list(rows)
+
+    def settings_in_effect(self):
+        """The working directory of the provider process and the
+        LinkStatusPollIntervalSeconds its settings file there gives (the
+        provider reads vexlancna.properties of its working directory; 180
+        seconds without one)."""
+        pids = self.provider_pids()
+        if not pids:
+            return "no provider process found"
+        pid = pids[0]
+        try:
+            cwd = os.readlink("/proc/%d/cwd" % pid)
+        except OSError as e:
+            return "working directory of %d unknown (%s)" % (pid, e)
+        interval = None
+        try:
+            with open("/proc/%d/cwd/vexlancna.properties" % pid) as f:
+                for word in f.read().split():
+                    if word.lower().startswith("linkstatuspollintervalseconds"):
+                        value = word[len("LinkStatusPollIntervalSeconds"):].lstrip("= \t")
+                        interval = value
+        except OSError:
+            return "working directory %s, no vexlancna.properties there: polls every 180 s" % cwd
+        if interval is None:
+            return "working directory %s, its vexlancna.properties sets no poll interval: polls every 180 s" % cwd
+        return "working directory %s, LinkStatusPollIntervalSeconds=%s" % (cwd, interval)
 
     def client(self, number):
         rows = self.classes()
@@ -332,6 +383,9 @@ class Soak:
             # The provider is loaded first, by one request, before the
             # subscriptions and the clients come at once.
             self.wbemcli("ein", "%s/%s:Vexlan_Adapter_ComputerSystem" % (self.url, self.a.namespace))
+            self.settings = self.settings_in_effect()
+            sys.stderr.write("soak: provider settings: %s\n" % self.settings)
+            self.classes()
             time.sleep(self.a.warm_up)
             self.teardown_indications()
             self.setup_indications()
@@ -383,6 +437,10 @@ class Soak:
         p = print
         p("soak report: %s, namespaces %s and %s, %.1f minutes, %d clients" % (
             self.url, self.a.namespace, self.a.interop, minutes, self.a.clients))
+        p("provider settings: %s" % self.settings)
+        if self.not_in_interop:
+            p("classes not asked in %s (the server has no such class there): %d" % (
+                self.a.interop, len(self.not_in_interop)))
         p("requests served: %d (%s)" % (sum(self.served.values()),
                                          ", ".join("%s %d" % kv for kv in sorted(self.served.items()))))
         p("errors: %d" % sum(self.errors.values()))
