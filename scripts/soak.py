@@ -153,8 +153,31 @@ class Soak:
         except OSError:
             return "working directory %s, no vexlancna.properties there: polls every 180 s" % cwd
         if interval is None:
-            return "working directory %s, its vexlancna.properties sets no poll interval: polls every 180 s" % cwd
-        return "working directory %s, LinkStatusPollIntervalSeconds=%s" % (cwd, interval)
+            text = "working directory %s, its vexlancna.properties sets no poll interval: polls every 180 s" % cwd
+        else:
+            text = "working directory %s, LinkStatusPollIntervalSeconds=%s" % (cwd, interval)
+        return text + self.description_in_use(pid)
+
+    def description_in_use(self, pid):
+        """A warning when the provider process reads another description
+        than the one this run rewrites: the adapter library it maps looks
+        for the file beside itself (or where ZORAP_SIM_ADAPTERS says)."""
+        try:
+            with open("/proc/%d/environ" % pid, "rb") as f:
+                env = dict(v.split(b"=", 1) for v in f.read().split(b"\0") if b"=" in v)
+            if env.get(b"ZORAP_SIM_ADAPTERS"):
+                used = env[b"ZORAP_SIM_ADAPTERS"].decode(errors="replace")
+            else:
+                with open("/proc/%d/maps" % pid) as f:
+                    libs = {l.split()[-1] for l in f if "libzorap_cna_provider" in l}
+                if not libs:
+                    return ""
+                used = os.path.join(os.path.dirname(sorted(libs)[0]), "zorap_sim_adapters.json")
+        except OSError:
+            return ""
+        if os.path.realpath(used) == os.path.realpath(self.a.description):
+            return ""
+        return "; WARNING: the provider reads the description %s, this run rewrites %s" % (used, self.a.description)
 
     def client(self, number):
         rows = self.classes()
