@@ -27,8 +27,18 @@ Then it prints a report. Needs wbemcli (sblim-wbemcli) and Python 3.
 
 The description file (beside the installed adapter library unless
 --description says otherwise) is restored at the end. The server should read
-a LinkStatusPollIntervalSeconds of a few seconds (vexlancna.properties in its
-working directory), so link changes and configuration changes show soon.
+a LinkStatusPollIntervalSeconds of a few seconds (vexlancna.properties in the
+working directory of the process that runs the provider), so link changes and
+configuration changes show soon. The report names that directory and the
+interval it found there: with the default of 180 seconds most FC alerts are
+lost, because every edit of the description made while a configuration
+change waits for the next poll counts as part of that change, port states
+included, and the rebuild at the poll takes them in without an alert. sfcbd
+started as a daemon, or through nsenter, runs in "/".
+
+Classes marked for the interop namespace are asked there only when the
+server has them there (sfcb; OpenPegasus's own interop provider serves that
+namespace and gets no class of the provider).
 """
 
 import argparse
@@ -59,12 +69,15 @@ class Soak:
         self.lock = threading.Lock()
         self.served = collections.Counter()      # request kind -> count
         self.errors = collections.Counter()      # (kind, class, text) -> count
-        self.gone = collections.Counter()        # NOT_FOUND of an instance a rebuild removed
+        self.gone = collections.Counter()        # (kind, class): NOT_FOUND of a path just enumerated
         self.jobs = collections.Counter()
         self.changes = collections.Counter()
         self.subscriptions = collections.Counter()
         self.subscribed = False
         self.samples = []
+        self.rows = None
+        self.not_in_interop = []
+        self.settings = "?"
         self.start = time.time()
 
     # ------------------------------------------------------------ requests
@@ -85,12 +98,18 @@ class Soak:
             if not ok:
                 text = out.strip().splitlines()[-2 if out.strip().count("\n") else -1][:160] if out.strip() else "?"
                 if "CIM_ERR_NOT_FOUND" in out and kind not in ("ein", "ei"):
-                    self.gone[kind] += 1
+                    self.gone[(kind, cls)] += 1
                 else:
                     self.errors[(kind, cls, text)] += 1
         return ok, out
 
     def classes(self):
+        """(class, namespace, association) of every instance class; the rows
+        of the interop namespace only for the classes the server has there
+        (OpenPegasus gets none: its own interop provider serves that
+        namespace), found once."""
+        if self.rows is not None:
+            return list(self.rows)
         table = os.path.join(self.a.prefix, "share", "vexlan-cna", "classes.tsv")
         rows = []
         with open(table) as f:
@@ -101,9 +120,64 @@ class Soak:
                 kinds = cols[3].split()
                 if "instance" not in kinds:
                     continue
-                spaces = [self.a.namespace] + ([self.a.interop] if "interop" in cols[1].split() else [])
-                rows.extend((cols[0], ns, "association" in kinds) for ns in spaces)
-        return rows
+                rows.append((cols[0], self.a.namespace, "association" in kinds))
+                if "interop" in cols[1].split():
+                    ok, out = self.wbemcli("gc", "%s/%s:%s" % (self.url, self.a.interop, cols[0]))
+                    if ok:
+                        rows.append((cols[0], self.a.interop, "association" in kinds))
+                    else:
+                        self.not_in_interop.append(cols[0])
+        self.rows = rows
+        return list(rows)
+
+    def settings_in_effect(self):
+        """The working directory of the provider process and the
+        LinkStatusPollIntervalSeconds its settings file there gives (the
+        provider reads vexlancna.properties of its working directory; 180
+        seconds without one)."""
+        pids = self.provider_pids()
+        if not pids:
+            return "no provider process found"
+        pid = pids[0]
+        try:
+            cwd = os.readlink("/proc/%d/cwd" % pid)
+        except OSError as e:
+            return "working directory of %d unknown (%s)" % (pid, e)
+        interval = None
+        try:
+            with open("/proc/%d/cwd/vexlancna.properties" % pid) as f:
+                for word in f.read().split():
+                    if word.lower().startswith("linkstatuspollintervalseconds"):
+                        value = word[len("LinkStatusPollIntervalSeconds"):].lstrip("= \t")
+                        interval = value
+        except OSError:
+            return "working directory %s, no vexlancna.properties there: polls every 180 s" % cwd
+        if interval is None:
+            text = "working directory %s, its vexlancna.properties sets no poll interval: polls every 180 s" % cwd
+        else:
+            text = "working directory %s, LinkStatusPollIntervalSeconds=%s" % (cwd, interval)
+        return text + self.description_in_use(pid)
+
+    def description_in_use(self, pid):
+        """A warning when the provider process reads another description
+        than the one this run rewrites: the adapter library it maps looks
+        for the file beside itself (or where ZORAP_SIM_ADAPTERS says)."""
+        try:
+            with open("/proc/%d/environ" % pid, "rb") as f:
+                env = dict(v.split(b"=", 1) for v in f.read().split(b"\0") if b"=" in v)
+            if env.get(b"ZORAP_SIM_ADAPTERS"):
+                used = env[b"ZORAP_SIM_ADAPTERS"].decode(errors="replace")
+            else:
+                with open("/proc/%d/maps" % pid) as f:
+                    libs = {l.split()[-1] for l in f if "libzorap_cna_provider" in l}
+                if not libs:
+                    return ""
+                used = os.path.join(os.path.dirname(sorted(libs)[0]), "zorap_sim_adapters.json")
+        except OSError:
+            return ""
+        if os.path.realpath(used) == os.path.realpath(self.a.description):
+            return ""
+        return "; WARNING: the provider reads the description %s, this run rewrites %s" % (used, self.a.description)
 
     def client(self, number):
         rows = self.classes()
@@ -332,6 +406,9 @@ class Soak:
             # The provider is loaded first, by one request, before the
             # subscriptions and the clients come at once.
             self.wbemcli("ein", "%s/%s:Vexlan_Adapter_ComputerSystem" % (self.url, self.a.namespace))
+            self.settings = self.settings_in_effect()
+            sys.stderr.write("soak: provider settings: %s\n" % self.settings)
+            self.classes()
             time.sleep(self.a.warm_up)
             self.teardown_indications()
             self.setup_indications()
@@ -383,13 +460,22 @@ class Soak:
         p = print
         p("soak report: %s, namespaces %s and %s, %.1f minutes, %d clients" % (
             self.url, self.a.namespace, self.a.interop, minutes, self.a.clients))
+        p("provider settings: %s" % self.settings)
+        if self.not_in_interop:
+            p("classes not asked in %s (the server has no such class there): %d" % (
+                self.a.interop, len(self.not_in_interop)))
         p("requests served: %d (%s)" % (sum(self.served.values()),
                                          ", ".join("%s %d" % kv for kv in sorted(self.served.items()))))
         p("errors: %d" % sum(self.errors.values()))
         for (kind, cls, text), n in sorted(self.errors.items()):
             p("  %d x %s %s: %s" % (n, kind, cls, text))
-        p("instances gone between enumeration and a request on them (a rebuild in between, CIM_ERR_NOT_FOUND): %d (%s)"
-          % (sum(self.gone.values()), ", ".join("%s %d" % kv for kv in sorted(self.gone.items()))))
+        # A rebuild between the enumeration and the request removes an
+        # instance; the getInstance of an association whose ends are checked
+        # by other classes' lookups finds no end every time.
+        p("CIM_ERR_NOT_FOUND for a path just enumerated (a rebuild in between, or an association's check of its ends): %d"
+          % sum(self.gone.values()))
+        for (kind, cls), n in sorted(self.gone.items()):
+            p("  %d x %s %s" % (n, kind, cls))
         p("description changes made: %s" % ", ".join("%s %d" % kv for kv in sorted(self.changes.items())))
         p("subscriptions: %s" % ", ".join("%s %d" % kv for kv in sorted(self.subscriptions.items())))
         p("indications received: %d (%s)" % (sum(received.values()),
