@@ -90,46 +90,31 @@ TEST_F(FCBuild, PortTypeCodesMapToCimPortTypes)
         EXPECT_EQ(expected[i], port(i).portType) << "code " << i;
 }
 
-struct SpeedCase {
-    const char* chip;
-    int speedCode;
-    unsigned long long speed;
-    const char* description;
-};
-
-class FCBuildSpeed : public FCBuild, public ::testing::WithParamInterface<SpeedCase> {};
-
-TEST_P(FCBuildSpeed, SpeedAndDescriptionFromSpeedCodeAndChip)
+// One port per row: the speed and its description from the speed code,
+// where code 16 means the chip generation's top speed.
+TEST_F(FCBuild, SpeedAndDescriptionFromSpeedCodeAndChip)
 {
-    const SpeedCase& c = GetParam();
-    use(oneAdapter(c.chip, {fcFunction(1, 0, {{"speed", c.speedCode}})}));
-    buildFCPortList();
-    ASSERT_EQ(1, g_FCPortList.count);
-    EXPECT_EQ(c.speed, port(0).speed);
-    EXPECT_STREQ(c.description, port(0).speedDescription);
+    const struct {
+        const char* chip;
+        int speedCode;
+        unsigned long long speed;
+        const char* description;
+    } rows[] = {{"RSX-1610", 0, 0ull, "See Speed"},           {"RSX-1610", 1, 1062500000ull, "See Speed"},
+                {"RSX-1610", 2, 2125000000ull, "See Speed"},  {"RSX-1610", 3, 0ull, "Auto Negotiate"},
+                {"RSX-1610", 4, 4250000000ull, "See Speed"},  {"RSX-1610", 5, 0ull, "See Speed"},
+                {"RSX-1610", 8, 8500000000ull, "See Speed"},  {"RSX-1610", 10, 10625000000ull, "See Speed"},
+                {"RSX-1610", 16, 17000000000ull, "See Speed"}, {"RSX-A20", 16, 10625000000ull, "See Speed"},
+                {"RSX-AB1", 16, 10625000000ull, "See Speed"},  {"RSX-A30", 16, 17000000000ull, "See Speed"}};
+    for (const auto& row : rows) {
+        SCOPED_TRACE(std::string(row.chip) + " code " + std::to_string(row.speedCode));
+        removeFCPortList();
+        use(oneAdapter(row.chip, {fcFunction(1, 0, {{"speed", row.speedCode}})}));
+        buildFCPortList();
+        ASSERT_EQ(1, g_FCPortList.count);
+        EXPECT_EQ(row.speed, port(0).speed);
+        EXPECT_STREQ(row.description, port(0).speedDescription);
+    }
 }
-
-INSTANTIATE_TEST_SUITE_P(Codes, FCBuildSpeed,
-                         ::testing::Values(SpeedCase{"RSX-1610", 0, 0ull, "See Speed"},
-                                           SpeedCase{"RSX-1610", 1, 1062500000ull, "See Speed"},
-                                           SpeedCase{"RSX-1610", 2, 2125000000ull, "See Speed"},
-                                           SpeedCase{"RSX-1610", 3, 0ull, "Auto Negotiate"},
-                                           SpeedCase{"RSX-1610", 4, 4250000000ull, "See Speed"},
-                                           SpeedCase{"RSX-1610", 5, 0ull, "See Speed"},
-                                           SpeedCase{"RSX-1610", 8, 8500000000ull, "See Speed"},
-                                           SpeedCase{"RSX-1610", 10, 10625000000ull, "See Speed"},
-                                           SpeedCase{"RSX-1610", 16, 17000000000ull, "See Speed"},
-                                           SpeedCase{"RSX-A20", 16, 10625000000ull, "See Speed"},
-                                           SpeedCase{"RSX-AB1", 16, 10625000000ull, "See Speed"},
-                                           SpeedCase{"RSX-A30", 16, 17000000000ull, "See Speed"}),
-                         [](const ::testing::TestParamInfo<SpeedCase>& param) {
-                             std::string name = std::string(param.param.chip) + "_code" +
-                                                std::to_string(param.param.speedCode);
-                             for (char& ch : name)
-                                 if (ch == '-')
-                                     ch = '_';
-                             return name;
-                         });
 
 TEST_F(FCBuild, MaxSpeedByChipGeneration)
 {
