@@ -32,6 +32,8 @@ run() {   # run EXPECTED_CODE PATTERN ARGS... : PATTERN in stdout (or stderr whe
 W1='Tiny_Thing.Name="alpha",Id=1'
 
 run 0 'Big = 18446744073709551615;'           ei Tiny_Thing
+run 0 'Tags = {"x", "y\"q"};'                  ei Tiny_Thing
+run 0 'When = "00000001020304.000005:000";'   ei Tiny_Thing
 run 0 'root/tiny:Tiny_Thing.Name="beta",Id=2' ein Tiny_Thing
 run 0 'Count = 10;'                           gi -P Count "$W1"
 run 0 'root/tiny:Tiny_Thing.Name="n",Id=5'    ci 'Tiny_Thing.Name="n",Id=5' Count=7
