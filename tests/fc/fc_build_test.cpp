@@ -241,19 +241,6 @@ TEST_F(FCBuild, PortControllerDropsSerialsSeenBeforeComparingWithCase)
     EXPECT_EQ(-1, index);
 }
 
-TEST_F(FCBuild, LogicalPortGroupOfOneDualPortAdapterNamesItsFirstPort)
-{
-    use(host(json::array({fcAdapter(5, "RSX-1620", 2, "GRP")})));
-    buildLogicalPortGroupList();
-    char hostName[kHostNameBufferSize] = {};
-    int kind = 0;
-    GetHostName(hostName, &kind);
-    ASSERT_EQ(1, g_LogicalPortGroupList.count);
-    EXPECT_EQ(std::string(hostName) + "_GRP_3000000000050000_3100000000050000",
-              g_LogicalPortGroupList.entries[0].instanceId);
-    EXPECT_STREQ("3000000000050000", g_LogicalPortGroupList.entries[0].nodeWWN);
-}
-
 TEST_F(FCBuild, LogicalPortGroupSlotsAndCountPartAfterADuplicate)
 {
     use(host(json::array({fcAdapter(1, "RSX-1620", 2, "A1"), fcAdapter(2, "RSX-1620", 2, "A2")})));

@@ -338,18 +338,6 @@ TEST_F(PhysicalBuild, MezzanineBoardsShowAGoodModuleAndCagelessBoardsNone)
     EXPECT_EQ(1u, zorap_sim_call_count(ZORAP_FN_GetSFPData));
 }
 
-TEST_F(PhysicalBuild, AFailedModuleReadForOneDeviceDropsOnlyThatConnector)
-{
-    json a = adapterWithPorts("BOARD", "RSX-1620",
-                              json::array({port(0, json::array({fcFunction(1, 0)}), transceiver("SFP0")),
-                                           port(1, json::array({fcFunction(1, 1)}), transceiver("SFP1"))}));
-    use(host(json::array({a})));
-    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_GetSFPData, ZORAP_ERR_FAILED, 1));
-    buildPhysicalConnectorList();
-    ASSERT_EQ(1, g_PhysicalConnectorList.count);
-    EXPECT_STREQ("SFP1_BOARD_1", g_PhysicalConnectorList.entries[0].tag);
-}
-
 TEST_F(PhysicalBuild, OneModuleSharedByFcAndNicFunctionsIsOneConnector)
 {
     json cna = adapterWithPorts(
