@@ -2,7 +2,6 @@
 // the values each slot takes from the adapter library, and how each list
 // places and counts its slots.
 #include <cstring>
-#include <set>
 #include <string>
 #include <vector>
 
@@ -218,29 +217,6 @@ TEST_F(FCBuild, NoAdaptersLeavesEveryListEmpty)
     EXPECT_EQ(nullptr, g_FCPortStatisticsList.entries);
 }
 
-TEST_F(FCBuild, PortControllerDropsSerialsSeenBeforeComparingWithCase)
-{
-    json a = fcAdapter(1, "RSX-1610", 2, "abc1");
-    json b = fcAdapter(2, "RSX-1610", 1, "ABC1");
-    json c = fcAdapter(3, "RSX-1610", 1, "abc1");
-    use(host(json::array({a, b, c})));
-    buildPortControllerList();
-    ASSERT_EQ(2, g_PortControllerList.count);
-    EXPECT_STREQ("abc1", g_PortControllerList.entries[0].deviceId);
-    EXPECT_STREQ("ABC1", g_PortControllerList.entries[1].deviceId);
-    EXPECT_EQ(&ZORAP_GetAdapterList()->firstAdapter->phyPortList->firstPhyPort->protocolList->firstProtocol->fcDevice,
-              g_PortControllerList.entries[0].device);
-
-    int index = -1;
-    unsigned char upper[] = "ABC1";
-    EXPECT_EQ(1, IsDeviceInPortControllerList(upper, &index));
-    EXPECT_EQ(0, index) << "the first slot wins, case ignored";
-    unsigned char other[] = "zzz";
-    index = -1;
-    EXPECT_EQ(0, IsDeviceInPortControllerList(other, &index));
-    EXPECT_EQ(-1, index);
-}
-
 TEST_F(FCBuild, LogicalPortGroupSlotsAndCountPartAfterADuplicate)
 {
     use(host(json::array({fcAdapter(1, "RSX-1620", 2, "A1"), fcAdapter(2, "RSX-1620", 2, "A2")})));
@@ -279,41 +255,6 @@ TEST_F(FCBuild, StatisticsCopyTheNineCountersInOrder)
     EXPECT_EQ(8u, s.invalidTxWords);
     EXPECT_EQ(1u, s.ioCount);
     EXPECT_EQ(2u, s.megabyteCount);
-}
-
-TEST_F(FCBuild, SixtyFourAdaptersOfFourFunctionsEach)
-{
-    use(fctest::wideHost());
-    buildFCPortList();
-    buildPortControllerList();
-    buildLogicalPortGroupList();
-    buildFCPortStatisticsList();
-
-    ASSERT_EQ(256, g_FCPortList.count);
-    ASSERT_EQ(256, g_FCPortStatisticsList.count);
-    std::set<std::string> ports, stats;
-    for (int i = 0; i < 256; ++i) {
-        EXPECT_EQ(1, port(i).valid);
-        EXPECT_EQ(i % 4, port(i).deviceNumber);
-        ports.insert(port(i).deviceId);
-        stats.insert(g_FCPortStatisticsList.entries[i].instanceId);
-    }
-    EXPECT_EQ(256u, ports.size());
-    EXPECT_EQ(256u, stats.size());
-    EXPECT_STREQ("VXW0063_30000000003F0000_31000000003F0300", port(255).deviceId);
-
-    ASSERT_EQ(64, g_PortControllerList.count);
-    for (int a = 0; a < 64; ++a) {
-        char serial[16];
-        std::snprintf(serial, sizeof(serial), "VXW%04d", a);
-        EXPECT_STREQ(serial, g_PortControllerList.entries[a].deviceId);
-    }
-
-    // Each adapter's first function opens a group; once slots 1 to 3 stayed
-    // unfilled, the duplicate test no longer reaches the newest groups.
-    ASSERT_EQ(253, g_LogicalPortGroupList.count);
-    for (int i = 0; i < 256; ++i)
-        EXPECT_EQ(i >= 1 && i <= 3 ? 0 : 1, g_LogicalPortGroupList.entries[i].valid) << i;
 }
 
 }  // namespace
