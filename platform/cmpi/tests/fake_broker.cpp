@@ -57,7 +57,7 @@ std::string lower(const char* s)
 }
 
 // Only object paths are ever cloned (by the association module); the other
-// tables have no clone function.
+// tables have no clone function, nor entries that nothing calls.
 
 // ---- strings ----------------------------------------------------------
 
@@ -326,13 +326,8 @@ CMPIStatus instFilter(CMPIInstance* i, const char** props, const char** keys)
         in->allowed.push_back(lower(*k));
     return ok();
 }
-CMPIStatus instSetPath(CMPIInstance* i, const CMPIObjectPath* op)
-{
-    inst(i)->op = const_cast<CMPIObjectPath*>(op);
-    return ok();
-}
 CMPIInstanceFT g_instFT = {200, instRelease, nullptr, instGet, instGetAt, instCount, instSet,
-                           instPath, instFilter, instSetPath, nullptr};
+                           instPath, instFilter, nullptr, nullptr};
 
 // ---- args ---------------------------------------------------------------
 
@@ -439,17 +434,12 @@ CMPIData ctxGet(const CMPIContext* c, const char* name, CMPIStatus* rc)
 {
     return getNamed(static_cast<Context*>(c->hdl)->entries, name, rc, CMPI_RC_ERR_NOT_FOUND);
 }
-CMPIData ctxGetAt(const CMPIContext* c, CMPICount i, CMPIString** name, CMPIStatus* rc)
-{
-    return getNamedAt(static_cast<Context*>(c->hdl)->entries, i, name, rc);
-}
-CMPICount ctxCount(const CMPIContext* c, CMPIStatus* rc) { setRc(rc, CMPI_RC_OK); return static_cast<CMPICount>(static_cast<Context*>(c->hdl)->entries.size()); }
 CMPIStatus ctxAdd(const CMPIContext* c, const char* name, const CMPIValue* v, const CMPIType t)
 {
     putNamed(static_cast<Context*>(c->hdl)->entries, name, store(v, t));
     return ok();
 }
-CMPIContextFT g_ctxFT = {200, ctxRelease, nullptr, ctxGet, ctxGetAt, ctxCount, ctxAdd};
+CMPIContextFT g_ctxFT = {200, ctxRelease, nullptr, ctxGet, nullptr, nullptr, ctxAdd};
 
 struct SelectExp : Object {
     CMPISelectExp enc;
