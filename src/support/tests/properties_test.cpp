@@ -138,20 +138,15 @@ TEST_F(SettingsTest, ProviderLogsItsConfigurationWhenDebugIsOn) {
 
 // ---- The settings object's reader -------------------------------------------
 
-TEST_F(SettingsTest, NicWithoutFileKeepsDefaults) {
-    Vexlan_NIC_Properties properties;
-    EXPECT_FALSE(properties.debugLog);
-    EXPECT_FALSE(properties.errorLog);
-    EXPECT_EQ(properties.linkStatusPollIntervalSeconds, 180);
-    EXPECT_STREQ(properties.interopNamespace, "root/PG_InterOp");
-    EXPECT_STREQ(properties.implementationNamespace, "root/vexlan_cmpi");
-}
-
 // The two readers never read each other's file.
 TEST_F(SettingsTest, EachReaderReadsOnlyItsOwnFile) {
-    writeFile(kOptProperties, "LinkStatusPollIntervalSeconds=30\n");
-    Vexlan_NIC_Properties fromOpt;
+    writeFile(kOptProperties, "LinkStatusPollIntervalSeconds=30\nErrorLog=1\nInteropNamespace=root/x\n");
+    Vexlan_NIC_Properties fromOpt;  // no file of its own: the defaults
+    EXPECT_FALSE(fromOpt.debugLog);
+    EXPECT_FALSE(fromOpt.errorLog);
     EXPECT_EQ(fromOpt.linkStatusPollIntervalSeconds, 180);
+    EXPECT_STREQ(fromOpt.interopNamespace, "root/PG_InterOp");
+    EXPECT_STREQ(fromOpt.implementationNamespace, "root/vexlan_cmpi");
     std::remove(kOptProperties.c_str());
 
     Vexlan_NIC_Properties* fromCwd = nullptr;
