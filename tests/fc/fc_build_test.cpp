@@ -207,14 +207,9 @@ TEST_F(FCBuild, NoAdaptersLeavesEveryListEmpty)
     buildPortControllerList();
     buildLogicalPortGroupList();
     buildFCPortStatisticsList();
-    EXPECT_EQ(0, g_FCPortList.count);
-    EXPECT_EQ(nullptr, g_FCPortList.entries);
-    EXPECT_EQ(0, g_PortControllerList.count);
-    EXPECT_EQ(nullptr, g_PortControllerList.entries);
-    EXPECT_EQ(0, g_LogicalPortGroupList.count);
-    EXPECT_EQ(nullptr, g_LogicalPortGroupList.entries);
-    EXPECT_EQ(0, g_FCPortStatisticsList.count);
-    EXPECT_EQ(nullptr, g_FCPortStatisticsList.entries);
+    for (int count : {g_FCPortList.count, g_PortControllerList.count, g_LogicalPortGroupList.count,
+                      g_FCPortStatisticsList.count})
+        EXPECT_EQ(0, count);
 }
 
 TEST_F(FCBuild, LogicalPortGroupSlotsAndCountPartAfterADuplicate)
