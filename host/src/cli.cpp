@@ -32,7 +32,7 @@ const char kUsage[] =
     "(broker) and runs one operation, or many with `batch`.\n"
     "\n"
     "Options (anywhere before or after the verb):\n"
-    "  -p, --provider FILE      provider library (e.g. build/lib/libSample_Provider.so)\n"
+    "  -p, --provider FILE      provider library (e.g. build/lib/libTiny_Provider.so)\n"
     "  -n, --name NAME          provider name, the prefix of NAME_Create_InstanceMI ...;\n"
     "                           default: the library file name without lib and .so\n"
     "  -m, --mof PATH           MOF file, or directory of *.mof files; repeatable\n"

@@ -1,17 +1,18 @@
 #!/usr/bin/env bash
-# Drives the cimhost command through every verb against the sample provider,
+# Drives the cimhost command through every verb against the tiny provider,
 # as a user would from a shell, and checks exit codes and output. Also checks
 # that bad input gives one error line and an exit code, never a crash.
 # Usage: cimhost_cli_test.sh CIMHOST PROVIDER_LIB MOF
 set -u
 CIMHOST=$1 LIB=$2 MOF=$3
-NS=root/sample
+NS=root/tiny
+NAME=Tiny
 failures=0
 run() {   # run EXPECTED_CODE PATTERN ARGS... : PATTERN in stdout (or stderr when EXPECTED_CODE != 0)
   local want=$1 pattern=$2
   shift 2
   local out err code
-  out=$("$CIMHOST" -p "$LIB" -m "$MOF" -N "$NS" --strict "$@" 2>/tmp/cimhost_cli_err.$$)
+  out=$("$CIMHOST" -p "$LIB" -n "$NAME" -m "$MOF" -N "$NS" --strict "$@" 2>/tmp/cimhost_cli_err.$$)
   code=$?
   err=$(cat /tmp/cimhost_cli_err.$$)
   local where=$out
@@ -28,44 +29,46 @@ run() {   # run EXPECTED_CODE PATTERN ARGS... : PATTERN in stdout (or stderr whe
   fi
 }
 
-W1='Sample_Widget.Name="w1"'
-SVC='Sample_Service.Name="svc"'
+W1='Tiny_Thing.Name="alpha",Id=1'
 
-run 0 'Port = 8080;'                          ei Sample_Widget
-run 0 'root/sample:Sample_Gadget.Id="g3"'     ein Sample_Gadget
-run 0 'Level = 3;'                            gi -P Level "$W1"
-run 0 'root/sample:Sample_Widget.Name="w9"'   ci 'Sample_Widget.Name="w9"' Port=9
-run 0 ''                                      mi "$W1" Port=7
-run 0 ''                                      di 'Sample_Widget.Name="w2"'
-run 0 'Name = "w1";'                          ai 'Sample_Gadget.Id="g1"'
-run 0 'Sample_Gadget.Id="g2"'                 ain --role Owner "$W1"
-run 0 'instance of Sample_WidgetGadget'       ri 'Sample_Gadget.Id="g3"'
-run 0 'Sample_WidgetGadget.'                  rin "$W1"
-run 0 'Result = 20;'                          cm "$SVC" Scale Value=4 'Factors={2,3}' Label=x "Target=root/sample:$W1"
-run 0 'instance of Sample_Alert'              listen Sample_Alert 1
+run 0 'Big = 18446744073709551615;'           ei Tiny_Thing
+run 0 'Tags = {"x", "y\"q"};'                  ei Tiny_Thing
+run 0 'When = "00000001020304.000005:000";'   ei Tiny_Thing
+run 0 'root/tiny:Tiny_Thing.Name="beta",Id=2' ein Tiny_Thing
+run 0 'Count = 10;'                           gi -P Count "$W1"
+run 0 'root/tiny:Tiny_Thing.Name="n",Id=5'    ci 'Tiny_Thing.Name="n",Id=5' Count=7
+run 0 ''                                      mi "$W1" Count=8
+run 0 ''                                      di "$W1"
+run 0 'Name = "beta";'                        ai "$W1"
+run 0 'Tiny_Thing.Name="beta",Id=2'           ain --role Left "$W1"
+run 0 'instance of Tiny_Link'                 ri "$W1"
+run 0 'Tiny_Link.'                            rin "$W1"
+run 0 'ReturnValue = 6;'                      cm "$W1" Echo Text=ab Times=3
+run 0 'instance of Tiny_Event'                listen Tiny_Event 1
 run 0 '"rc": 0'                               --json gi "$W1"
-run 0 '"paths"'                               --json ein Sample_Widget
-run 0 '"returnValue"'                         --json cm "$SVC" Scale Value=1 Label=y "Target=root/sample:$W1"
-run 0 'instance of Sample_Alert'              -f sfcb listen Sample_Alert 1
+run 0 '"paths"'                               --json ein Tiny_Thing
+run 0 '"returnValue"'                         --json cm "$W1" Echo Text=q
+run 0 'instance of Tiny_Event'                -f sfcb listen Tiny_Event 1
 
 # Errors: one line with the status name, an exit code below 128.
-run 1 'CMPI_RC_ERR_NOT_FOUND: nope'           gi 'Sample_Widget.Name="nope"'
-run 1 'CMPI_RC_ERR_INVALID_PARAMETER: Fail was asked for' cm "$SVC" Fail
-run 2 'CMPI_RC_ERR_INVALID_PARAMETER: bad object path' gi 'Sample_Widget.Name="open'
+run 1 'CMPI_RC_ERR_NOT_FOUND: no such Tiny_Thing' gi 'Tiny_Thing.Name="nope",Id=1'
+run 1 'CMPI_RC_ERR_FAILED: Fail was asked to fail' cm "$W1" Fail
+run 2 'CMPI_RC_ERR_INVALID_PARAMETER: bad object path' gi 'Tiny_Thing.Name="open'
 run 2 "CMPI_RC_ERR_INVALID_PARAMETER: unknown verb 'zap'" zap "$W1"
-run 2 'CMPI_RC_ERR_INVALID_PARAMETER: Port:' ci 'Sample_Widget.Name="w8"' Port=seventy
-run 1 'CMPI_RC_ERR_FAILED: MOF: /nonexistent.mof' -m /nonexistent.mof ei Sample_Widget
-run 1 'CMPI_RC_ERR_FAILED: cannot load /nonexistent/libX.so' -p /nonexistent/libX.so ei Sample_Widget
-run 1 'exports no Wrong_Create_' -n Wrong ei Sample_Widget
+run 2 'CMPI_RC_ERR_INVALID_PARAMETER: Count:' ci 'Tiny_Thing.Name="n",Id=8' Count=seventy
+run 1 'CMPI_RC_ERR_FAILED: MOF: /nonexistent.mof' -m /nonexistent.mof ei Tiny_Thing
+run 1 'CMPI_RC_ERR_FAILED: cannot load /nonexistent/libX.so' -p /nonexistent/libX.so ei Tiny_Thing
+run 1 'exports no Wrong_Create_' -n Wrong ei Tiny_Thing
 run 1 'CMPI_RC_ERR_FAILED: cannot open batch file' batch /nonexistent/batch.txt
 
-# A batch from standard input: one load, a reload, errors that do not stop it.
-out=$(printf '%s\n' '# widgets' 'di Sample_Widget.Name=\"w2\"' 'ein Sample_Widget' 'gi Sample_Widget.Name=\"w2\"' \
-        'reload' 'ein Sample_Widget' |
-      "$CIMHOST" -p "$LIB" -m "$MOF" -N "$NS" --strict batch - 2>/tmp/cimhost_cli_err.$$)
+# A batch from standard input: one load, a reload (a fresh library: its
+# generation counts from 1 again), errors that do not stop it.
+out=$(printf '%s\n' '# generations' 'cm Tiny_Thing.Name=\"alpha\",Id=1 Generation' 'gi Tiny_Thing.Name=\"nope\",Id=1' \
+        'reload' 'cm Tiny_Thing.Name=\"alpha\",Id=1 Generation' |
+      "$CIMHOST" -p "$LIB" -n "$NAME" -m "$MOF" -N "$NS" --strict batch - 2>/tmp/cimhost_cli_err.$$)
 code=$?
-if [ "$code" -ne 1 ] || [ "$(grep -c 'Sample_Widget.Name="w2"' <<<"$out")" -ne 1 ] ||
-   ! grep -q '^CMPI_RC_ERR_NOT_FOUND: w2$' /tmp/cimhost_cli_err.$$; then
+if [ "$code" -ne 1 ] || [ "$(grep -c '^ReturnValue = 1;$' <<<"$out")" -ne 2 ] ||
+   ! grep -q '^CMPI_RC_ERR_NOT_FOUND: no such Tiny_Thing$' /tmp/cimhost_cli_err.$$; then
   echo "FAIL: batch from stdin -> exit $code"
   echo "stdout: $out"
   echo "stderr: $(cat /tmp/cimhost_cli_err.$$)"

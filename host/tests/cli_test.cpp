@@ -35,7 +35,12 @@ CliRun cli(std::vector<std::string> args, bool withProvider = true) {
 
 const char kAlpha[] = "Tiny_Thing.Name=\"alpha\",Id=1";
 
-TEST(CliVerbs, InstanceVerbsPrintMofAndPaths) {
+// What the command line adds to the host: the path comment before each
+// instance and the blank line between them, options and typed arguments
+// turned into the host's calls, exit codes and error texts. Every verb's
+// output over this provider from a shell is cimhost_cli_test.sh's; what the
+// host does with each call is host_test's.
+TEST(CliVerbs, OptionsAndTypedArgumentsReachTheHost) {
     CliRun r = cli({"gi", kAlpha, "-P", "Count,Flag"});
     ASSERT_EQ(r.code, 0) << r.err;
     EXPECT_EQ(r.out,
@@ -46,62 +51,23 @@ TEST(CliVerbs, InstanceVerbsPrintMofAndPaths) {
               "    Count = 10;\n"
               "    Flag = TRUE;\n"
               "};\n");
-    r = cli({"ein", "Tiny_Thing"});
-    ASSERT_EQ(r.code, 0) << r.err;
-    EXPECT_EQ(r.out, "root/tiny:Tiny_Thing.Name=\"alpha\",Id=1\nroot/tiny:Tiny_Thing.Name=\"beta\",Id=2\n");
     r = cli({"ei", "root/tiny:Tiny_Thing"});
-    ASSERT_EQ(r.code, 0) << r.err;
-    EXPECT_NE(r.out.find("    Tags = {\"x\", \"y\\\"q\"};\n"), std::string::npos) << r.out;
-    EXPECT_NE(r.out.find("    When = \"00000001020304.000005:000\";\n"), std::string::npos);
-    EXPECT_NE(r.out.find("    Big = 18446744073709551615;\n"), std::string::npos);
-    EXPECT_NE(r.out.find("};\n\n// root/tiny:Tiny_Thing.Name=\"beta\",Id=2\n"), std::string::npos);
-}
-
-TEST(CliVerbs, CreateModifyDeleteTypeValuesFromTheMof) {
-    CliRun r = cli({"ci", "Tiny_Thing.Name=\"n\",Id=5", "Count=7", "Tags={a,\"b c\"}"});
-    ASSERT_EQ(r.code, 0) << r.err;
-    EXPECT_EQ(r.out, "root/tiny:Tiny_Thing.Name=\"n\",Id=5\n");
-    r = cli({"ci", "Tiny_Thing.Name=\"n\",Id=5", "Count=seven"});
-    EXPECT_EQ(r.code, 2);
-    EXPECT_EQ(r.err, "CMPI_RC_ERR_INVALID_PARAMETER: Count: 'seven' is not a valid uint32\n");
-    r = cli({"mi", kAlpha, "Count=8"});
-    EXPECT_EQ(r.code, 0) << r.err;
-    EXPECT_EQ(r.out, "");
-    r = cli({"mi", kAlpha, "Count=8", "Flag=false"});   // the provider wants exactly one
-    EXPECT_EQ(r.code, 1);
-    r = cli({"di", "Tiny_Thing.Name=\"nope\",Id=1"});
-    EXPECT_EQ(r.code, 1);
-    EXPECT_EQ(r.err, "CMPI_RC_ERR_NOT_FOUND: no such Tiny_Thing\n");
-    EXPECT_EQ(cli({"di", kAlpha}).code, 0);
-}
-
-TEST(CliVerbs, AssociationVerbsTakeTheirFilters) {
-    CliRun r = cli({"ain", kAlpha});
-    ASSERT_EQ(r.code, 0) << r.err;
-    EXPECT_EQ(r.out, "root/tiny:Tiny_Thing.Name=\"beta\",Id=2\n");
+    EXPECT_NE(r.out.find("};\n\n// root/tiny:Tiny_Thing.Name=\"beta\",Id=2\n"), std::string::npos) << r.out;
     r = cli({"ai", kAlpha, "--assoc-class", "Tiny_Link", "--result-class", "Tiny_Base", "-P", "Count"});
     ASSERT_EQ(r.code, 0) << r.err;
     EXPECT_NE(r.out.find("    Count = 20;\n};\n"), std::string::npos) << r.out;
-    r = cli({"rin", kAlpha, "--role", "Right"});
-    EXPECT_EQ(r.code, 0);
-    EXPECT_EQ(r.out, "");
+    EXPECT_EQ(cli({"rin", kAlpha, "--role", "Right"}).out, "");
     r = cli({"ri", kAlpha, "--role", "Left"});
-    ASSERT_EQ(r.code, 0) << r.err;
     EXPECT_NE(r.out.find("    Left = \"root/tiny:Tiny_Thing.Name=\\\"alpha\\\",Id=1\";\n"), std::string::npos)
         << r.out;
-}
-
-TEST(CliVerbs, InvokeMethodPrintsReturnValueAndOutputs) {
-    CliRun r = cli({"cm", kAlpha, "Echo", "Text=ab", "Times=3"});
-    ASSERT_EQ(r.code, 0) << r.err;
-    EXPECT_EQ(r.out, "ReturnValue = 6;\nReply = \"ababab\";\nCodes = {1, 2, 3};\n");
     // Without MOF, types are given in the argument names.
     r = cli({"-p", TINY_PROVIDER, "-n", "Tiny", "cm", kAlpha, "Echo", "Text:string=x", "Times:uint16=2"}, false);
     ASSERT_EQ(r.code, 0) << r.err;
     EXPECT_EQ(r.out, "ReturnValue = 2;\nReply = \"xx\";\nCodes = {1, 2, 3};\n");
-    r = cli({"cm", kAlpha, "Fail"});
-    EXPECT_EQ(r.code, 1);
-    EXPECT_EQ(r.err, "CMPI_RC_ERR_FAILED: Fail was asked to fail\n");
+    r = cli({"ci", "Tiny_Thing.Name=\"n\",Id=5", "Count=seven"});
+    EXPECT_EQ(r.code, 2);
+    EXPECT_EQ(r.err, "CMPI_RC_ERR_INVALID_PARAMETER: Count: 'seven' is not a valid uint32\n");
+    EXPECT_EQ(cli({"mi", kAlpha, "Count=8", "Flag=false"}).code, 1);  // the provider wants exactly one
     r = cli({"cm", kAlpha, "BadOut"});
     EXPECT_EQ(r.code, 1);
     EXPECT_EQ(r.err.rfind("CMPI_RC_ERR_FAILED: strict check: output Tiny_Thing.BadOut.Reply", 0), 0u) << r.err;
@@ -160,12 +126,8 @@ TEST(CliErrors, OneLineAndAnExitCodeNeverACrash) {
         {{"--bogus", "gi", kAlpha}, true, 2, "CMPI_RC_ERR_INVALID_PARAMETER: unknown option --bogus\n"},
         {{"-f", "openwbem", "gi", kAlpha}, true, 2,
          "CMPI_RC_ERR_INVALID_PARAMETER: unknown server flavour 'openwbem' (pegasus, sfcb)\n"},
-        {{"-m", "/nonexistent/x.mof", "gi", kAlpha}, false, 1,
-         "CMPI_RC_ERR_FAILED: MOF: /nonexistent/x.mof: no such file or directory\n"},
-        {{"-p", "/nonexistent/libX.so", "gi", kAlpha}, false, 1, nullptr},
         {{"-p", TINY_GENERIC_PROVIDER, "-n", "Tiny", "gi", kAlpha}, false, 1, nullptr},
         {{"gi", kAlpha}, false, 1, "CMPI_RC_ERR_FAILED: no provider library given (-p FILE)\n"},
-        {{"batch", "/nonexistent/ops.txt"}, true, 1, "CMPI_RC_ERR_FAILED: cannot open batch file /nonexistent/ops.txt\n"},
         {{"listen", "Tiny_Event", "soon"}, true, 2, "CMPI_RC_ERR_INVALID_PARAMETER: bad number of seconds: soon\n"},
     };
     for (const auto& c : cases) {
@@ -179,9 +141,8 @@ TEST(CliErrors, OneLineAndAnExitCodeNeverACrash) {
     }
     const CliRun help = cli({"--help"}, false);
     EXPECT_EQ(help.code, 0);
-    for (const char* verb : {" ei ", " ein ", " gi ", " ci ", " mi ", " di ", " ai ", " ain ", " ri ", " rin ",
-                             " cm ", " listen ", " batch ", "--json", "--strict", "--flavour"})
-        EXPECT_NE(help.out.find(verb), std::string::npos) << verb;
+    for (const char* option : {"--json", "--strict", "--flavour"})  // the verbs: cimhost_cli_test.sh
+        EXPECT_NE(help.out.find(option), std::string::npos) << option;
 }
 
 TEST(CliListen, PrintsTheIndicationsThatArriveInTime) {

@@ -268,16 +268,12 @@ TEST(HostStrict, ClassesMissingFromTheMofFail) {
 
 // ---------------------------------------------------------------- loading
 
+// A missing library and a wrong name: cimhost_cli_test.sh.
 TEST(HostLoad, RefusesWhatAServerWouldRefuse) {
     Host h;
-    Status s = h.load("/nonexistent/libNothing.so", "Nothing");
-    EXPECT_EQ(s.rc, 1);
-    EXPECT_NE(s.message.find("cannot load /nonexistent/libNothing.so"), std::string::npos);
-    s = h.load(TINY_GENERIC_PROVIDER, "Tiny");
+    const Status s = h.load(TINY_GENERIC_PROVIDER, "Tiny");
     EXPECT_EQ(s.rc, 1);
     EXPECT_NE(s.message.find("_Generic_Create_InstanceMI beside Tiny_Create_*MI"), std::string::npos) << s.message;
-    s = h.load(TINY_PROVIDER, "Other");
-    EXPECT_NE(s.message.find("exports no Other_Create_"), std::string::npos) << s.message;
     EXPECT_FALSE(h.loaded());
     const OpResult r = h.enumerateInstances(path("Tiny_Thing", h));
     EXPECT_EQ(statusLine(r), "CMPI_RC_ERR_FAILED: no provider is loaded");

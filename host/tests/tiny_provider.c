@@ -216,19 +216,9 @@ static CMPIStatus deleteInst(CMPIInstanceMI *mi, const CMPIContext *ctx, const C
     return findThing(op) ? ok() : err(CMPI_RC_ERR_NOT_FOUND, "no such Tiny_Thing");
 }
 
-static CMPIStatus execQuery(CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *rslt,
-                            const CMPIObjectPath *op, const char *q, const char *lang) {
-    (void)mi;
-    (void)ctx;
-    (void)rslt;
-    (void)op;
-    (void)q;
-    (void)lang;
-    return err(CMPI_RC_ERR_NOT_SUPPORTED, "no queries");
-}
-
+/* The host never asks a provider for a query. */
 static CMPIInstanceMIFT instFT = {200, 200, "instanceTiny", instCleanup, enumNames, enumInsts, getInst,
-                                  createInst, modifyInst, deleteInst, execQuery};
+                                  createInst, modifyInst, deleteInst, NULL};
 
 /* ------------------------------------------------------------ association MI */
 

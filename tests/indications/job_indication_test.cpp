@@ -321,10 +321,7 @@ TEST(JobIndicationCleanup, AJobThatEndsDuringCleanupSendsNothingAfterCleanupBega
             // The job ended all the same, and said why nothing was sent.
             EXPECT_EQ(countLog("Job " + id + ": CIM_InstModification not sent, the provider is being cleaned up"), 1);
             EXPECT_EQ(countLog("FCFlashUpdateProc: ZORAP_UpdateFlash returns 0"), 1);
-            std::ifstream file("/var/tmp/vxln_cna_provider.config");
-            std::stringstream text;
-            text << file.rdbuf();
-            EXPECT_NE(text.str().find(id + "#STATUS=2\n"), std::string::npos);
+            EXPECT_NE(fileText("/var/tmp/vxln_cna_provider.config").find(id + "#STATUS=2\n"), std::string::npos);
         }
     }
 }

@@ -4,9 +4,6 @@
 // needed; the log goes to the private /opt of tests/isolate.sh.
 #include <gtest/gtest.h>
 
-#include <sys/stat.h>
-
-#include <fstream>
 #include <string>
 
 #include "classes/Vexlan_NIC_EthernetPort.h"
@@ -18,6 +15,7 @@
 #include "classes/Vexlan_NIC_RegisteredProfile.h"
 #include "classes/Vexlan_NIC_RemoteServiceAccessPoint.h"
 #include "support/Vexlan_FC_Utils_CMPI.h"
+#include "test_files.h"
 
 namespace {
 
@@ -93,12 +91,11 @@ const Module kModules[] = {
     MODULE(RemoteServiceAccessPoint), MODULE(Nic_RegisteredProfile),
 };
 
-const char kLog[] = "/opt/Vexlan_Corporation/CNAProviders/log/Vexlan_CNA_Provider.log";
+using support_test::kLogPath;
 
 std::string logText()
 {
-    std::ifstream in(kLog);
-    return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+    return support_test::readFile(kLogPath);
 }
 
 int count(const std::string& text, const std::string& what)
@@ -113,10 +110,8 @@ class NicPathFailures : public ::testing::Test {
 protected:
     void SetUp() override
     {
-        mkdir("/opt/Vexlan_Corporation", 0755);
-        mkdir("/opt/Vexlan_Corporation/CNAProviders", 0755);
-        mkdir("/opt/Vexlan_Corporation/CNAProviders/log", 0755);
-        std::remove(kLog);
+        support_test::makeDirs(support_test::kLogDir);
+        std::remove(kLogPath);
         Vexlan_FC_Utils_CMPI::InitializeLogFile();
         g_EnableLogError = true;
         g_EnableDebugPrint = true;
@@ -188,7 +183,7 @@ TEST_F(NicPathFailures, KeyThatCantBeReadOrIsNoTextEndsTheRequestWithoutAnAnswer
     // The profile's key lines are debug output: with it off they vanish, the
     // other modules' error lines stay.
     g_EnableDebugPrint = false;
-    std::remove(kLog);
+    std::remove(kLogPath);
     getInstance_Nic_RegisteredProfile(ctx, result, path(), nullptr, true);
     getInstance_EthernetPort(ctx, result, path(), nullptr, true);
     EXPECT_EQ(count(logText(), "Error getting Name key"), 0);

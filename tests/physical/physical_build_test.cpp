@@ -108,15 +108,7 @@ TEST_F(PhysicalBuild, NoAdaptersLeaveEveryListEmpty)
                       g_SCSIProtocolEndpointTargetList.count, g_StorageExtentList.count, g_PhysicalPackageList.count,
                       g_ProductList.count, g_PhysicalConnectorList.count, g_PhysicalPortList.count})
         EXPECT_EQ(0, count);
-    EXPECT_EQ(nullptr, g_StorageExtentList.entries);
-    EXPECT_EQ(nullptr, g_PhysicalPackageList.entries);
-
-    // With no adapter list at all the builds return at once, lists empty.
-    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_GetAdapterList, ZORAP_ERR_FAILED, -1));
-    buildStorageExtentList();
-    buildPhysicalConnectorList();
-    EXPECT_EQ(0, g_StorageExtentList.count);
-    EXPECT_EQ(0, g_PhysicalConnectorList.count);
+    // Without any adapter list: provider.Faults (every library call failing).
 }
 
 // ---- PhysicalPackage and Product -----------------------------------------------------
@@ -338,18 +330,6 @@ TEST_F(PhysicalBuild, MezzanineBoardsShowAGoodModuleAndCagelessBoardsNone)
     EXPECT_EQ(1u, zorap_sim_call_count(ZORAP_FN_GetSFPData));
 }
 
-TEST_F(PhysicalBuild, AFailedModuleReadForOneDeviceDropsOnlyThatConnector)
-{
-    json a = adapterWithPorts("BOARD", "RSX-1620",
-                              json::array({port(0, json::array({fcFunction(1, 0)}), transceiver("SFP0")),
-                                           port(1, json::array({fcFunction(1, 1)}), transceiver("SFP1"))}));
-    use(host(json::array({a})));
-    ASSERT_EQ(0, zorap_sim_fail(ZORAP_FN_GetSFPData, ZORAP_ERR_FAILED, 1));
-    buildPhysicalConnectorList();
-    ASSERT_EQ(1, g_PhysicalConnectorList.count);
-    EXPECT_STREQ("SFP1_BOARD_1", g_PhysicalConnectorList.entries[0].tag);
-}
-
 TEST_F(PhysicalBuild, OneModuleSharedByFcAndNicFunctionsIsOneConnector)
 {
     json cna = adapterWithPorts(
@@ -451,26 +431,14 @@ TEST_F(PhysicalBuild, NicOperationsMakeThePortsSlotOrANullHandle)
 
 // ---- Tag texts ---------------------------------------------------------------------------
 
-TEST(PhysicalTags, CreateAndParseRoundTripAndRefuseShortTags)
+// The tags of the recorded connectors and ports, and the getInstance hits of
+// physical_cim_test, show both forms made and read back; here the tags that
+// are no such form.
+TEST(PhysicalTags, ShortTagsAreRefusedAndLongOnesCut)
 {
     char tag[kPhysicalTagSize];
-    char ts[] = "SFP1";
-    char as[] = "ADAPTER";
-    CreatePhysicalConnectorTag(tag, ts, as, 3);
-    EXPECT_STREQ("SFP1_ADAPTER_3", tag);
     char a[kPhysicalTagPartSize], b[kPhysicalTagPartSize];
     int n = -1;
-    EXPECT_EQ(1, ParsePhysicalConnectorTag(tag, a, b, &n));
-    EXPECT_STREQ("SFP1", a);
-    EXPECT_STREQ("ADAPTER", b);
-    EXPECT_EQ(3, n);
-
-    CreatePhysicalPortTag(tag, as, 12);
-    EXPECT_STREQ("ADAPTER_12", tag);
-    EXPECT_EQ(1, ParsePhysicalPortTag(tag, a, &n));
-    EXPECT_STREQ("ADAPTER", a);
-    EXPECT_EQ(12, n);
-
     // Too few parts.
     char two[] = "A_B";
     char one[] = "A";

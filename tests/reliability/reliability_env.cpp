@@ -47,10 +47,7 @@ std::string defaultDescription()
 {
     if (zorap_sim_load_default() != 0)
         return std::string();
-    std::ifstream in(zorap_sim_description_path());
-    std::stringstream text;
-    text << in.rdbuf();
-    return text.str();
+    return provtest::fileText(zorap_sim_description_path());
 }
 
 namespace {

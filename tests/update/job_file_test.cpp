@@ -9,13 +9,12 @@
 #include <unistd.h>
 
 #include <atomic>
-#include <fstream>
-#include <sstream>
 #include <string>
 #include <thread>
 #include <vector>
 
 #include "support/Vexlan_NIC_PrefFile.h"
+#include "test_files.h"
 #include "update/ConcreteJob.h"
 #include "update/JobPersistence.h"
 
@@ -23,13 +22,7 @@ namespace {
 
 const char kJobFile[] = "/var/tmp/vxln_cna_provider.config";
 
-std::string readFile(const char* path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::stringstream s;
-    s << in.rdbuf();
-    return s.str();
-}
+using support_test::readFile;
 
 void writeFile(const char* path, const std::string& text, mode_t mode = 0600)
 {

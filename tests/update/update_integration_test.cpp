@@ -109,16 +109,10 @@ std::uint64_t waitJobState(Host& host, const Call& call, std::uint64_t wanted)
     return provtest::waitJobState(host, jobPath(call), wanted);
 }
 
-std::string text(const Instance& inst, const std::string& name)
-{
-    const Value* v = inst.property(name);
-    return v != nullptr ? v->s : "<unset>";
-}
-
 const Instance* withId(const std::vector<Instance>& all, const std::string& id)
 {
     for (const Instance& i : all)
-        if (text(i, "InstanceID") == id)
+        if (propertyText(i, "InstanceID") == id)
             return &i;
     return nullptr;
 }
@@ -140,7 +134,7 @@ TEST_F(SoftwareInventory, GetInstanceReadsTheKeyOfEachSide)
     image.setKey("InstanceID", Value::fromString(expectedHost().name + "_" + kFcSerial + "__FlashImage"));
     OpResult got = host().getInstance(image);
     ASSERT_EQ(got.instances.size(), 1u) << statusLine(got);
-    EXPECT_EQ(text(got.instances[0], "VersionString"), "3.64.12");
+    EXPECT_EQ(propertyText(got.instances[0], "VersionString"), "3.64.12");
     image.setKey("InstanceID", Value::fromString("nothing_FlashImage"));
     EXPECT_EQ(host().getInstance(image).rc, CMPI_RC_ERR_NOT_FOUND);
 
@@ -151,17 +145,17 @@ TEST_F(SoftwareInventory, GetInstanceReadsTheKeyOfEachSide)
     p.setKey("InstanceID", Value::fromString(std::string("02_") + kNicSerial));
     got = host().getInstance(p);
     ASSERT_EQ(got.instances.size(), 1u) << statusLine(got);
-    EXPECT_EQ(text(got.instances[0], "Description"), "The CNA Networking Driver");
+    EXPECT_EQ(propertyText(got.instances[0], "Description"), "The CNA Networking Driver");
     p.setKey("InstanceID", Value::fromString(std::string("7_") + kNicSerial));
     got = host().getInstance(p);
     ASSERT_EQ(got.instances.size(), 1u) << statusLine(got);
     EXPECT_EQ(got.instances[0].property("Name"), nullptr);
-    EXPECT_EQ(text(got.instances[0], "Manufacturer"), "Vexlan Corporation");
+    EXPECT_EQ(propertyText(got.instances[0], "Manufacturer"), "Vexlan Corporation");
     // A negative type keeps its sign in the instance's key.
     p.setKey("InstanceID", Value::fromString(std::string("-2147483648_") + kNicSerial));
     got = host().getInstance(p);
     ASSERT_EQ(got.instances.size(), 1u) << statusLine(got);
-    EXPECT_EQ(text(got.instances[0], "InstanceID"), std::string("-2147483648_") + kNicSerial);
+    EXPECT_EQ(propertyText(got.instances[0], "InstanceID"), std::string("-2147483648_") + kNicSerial);
     for (const std::string& key : {std::string("2_NOSUCH"), std::string(kNicSerial)}) {
         p.setKey("InstanceID", Value::fromString(key));
         EXPECT_EQ(host().getInstance(p).rc, CMPI_RC_ERR_NOT_FOUND) << key;
@@ -275,7 +269,7 @@ TEST_F(UpdateMethods, ASynchronousFCUpdateWritesTheFileAndShowsTheNewFlashImage)
     const OpResult r = enumerate(host(), "Vexlan_FCHBA_SoftwareIdentity");
     const Instance* flash = withId(r.instances, expectedHost().name + "_" + kFcSerial + "__FlashImage");
     ASSERT_NE(flash, nullptr);
-    EXPECT_EQ(text(*flash, "VersionString"), "3.66.1");
+    EXPECT_EQ(propertyText(*flash, "VersionString"), "3.66.1");
     EXPECT_EQ(formatValue(*flash->property("ReleaseDate")).substr(1, 8), "20251203");
 }
 
@@ -341,7 +335,7 @@ TEST_F(UpdateJobs, AnFCJobRunsThenCompletesOrFailsAndIsSaved)
     ASSERT_EQ(running.instances.size(), 1u) << statusLine(running);
     const Instance& job = running.instances[0];
     EXPECT_EQ(job.property("JobState")->u, 4u);
-    EXPECT_EQ(text(job, "Name").substr(0, std::string(kFcSerial).size() + 28),
+    EXPECT_EQ(propertyText(job, "Name").substr(0, std::string(kFcSerial).size() + 28),
               std::string(kFcSerial) + " FC flash update with " + image.substr(0, 6));
     EXPECT_EQ(formatValue(*job.property("TimeBeforeRemoval")), "\"00000000003000.000000:000\"");
     const std::uint64_t started = job.property("TimeOfLastStateChange")->dt.usec;

@@ -198,6 +198,18 @@ TEST_F(Drivers, ArgumentsReachTheOperations)
     EXPECT_EQ(fake::text(st.msg), "none");
     EXPECT_EQ(provider()->seen, "A|R|r1|r2");
 
+    CmpiInstance widget(op);
+    widget.setProperty("Name", CmpiData("w3"));
+    CMPIResult* created = fake::newResult();
+    EXPECT_EQ(inst.ft->createInstance(&inst, ctx, created, op.getEnc(), widget.getEnc()).rc, CMPI_RC_OK);
+    EXPECT_EQ(provider()->seen, "w3");
+    ASSERT_EQ(fake::resultItems(created).size(), 1u);
+    EXPECT_EQ(fake::resultItems(created)[0].data.type, CMPI_ref);
+    const char* list[] = {"Port", "Level", nullptr};
+    EXPECT_EQ(inst.ft->modifyInstance(&inst, ctx, fake::newResult(), op.getEnc(), widget.getEnc(), list).rc,
+              CMPI_RC_OK);
+    EXPECT_EQ(provider()->seen, "w3|Port|Level");
+
     CmpiArgs in;
     in.setArg("X", CmpiData(CMPIUint32(21)));
     CmpiArgs out;

@@ -56,6 +56,9 @@ std::string lower(const char* s)
     return out;
 }
 
+// Only object paths are ever cloned (by the association module); the other
+// tables have no clone function, nor entries that nothing calls.
+
 // ---- strings ----------------------------------------------------------
 
 struct String : Object {
@@ -64,13 +67,12 @@ struct String : Object {
 };
 
 CMPIStatus strRelease(CMPIString*) { return ok(); }
-CMPIString* strClone(const CMPIString*, CMPIStatus* rc) { setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED); return nullptr; }
 const char* strChars(const CMPIString* s, CMPIStatus* rc)
 {
     setRc(rc, CMPI_RC_OK);
     return static_cast<String*>(s->hdl)->text.c_str();
 }
-CMPIStringFT g_strFT = {200, strRelease, strClone, strChars};
+CMPIStringFT g_strFT = {200, strRelease, nullptr, strChars};
 
 CMPIString* makeString(const char* text)
 {
@@ -183,7 +185,6 @@ struct Array : Object {
 
 Array* arr(const CMPIArray* a) { return static_cast<Array*>(a->hdl); }
 CMPIStatus arrRelease(CMPIArray*) { return ok(); }
-CMPIArray* arrClone(const CMPIArray*, CMPIStatus* rc) { setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED); return nullptr; }
 CMPICount arrSize(const CMPIArray* a, CMPIStatus* rc) { setRc(rc, CMPI_RC_OK); return static_cast<CMPICount>(arr(a)->items.size()); }
 CMPIType arrType(const CMPIArray* a, CMPIStatus* rc) { setRc(rc, CMPI_RC_OK); return arr(a)->type; }
 CMPIData arrGet(const CMPIArray* a, CMPICount i, CMPIStatus* rc)
@@ -204,7 +205,7 @@ CMPIStatus arrSet(CMPIArray* a, CMPICount i, const CMPIValue* v, CMPIType t)
     arr(a)->items[i] = store(v, t);
     return ok();
 }
-CMPIArrayFT g_arrFT = {200, arrRelease, arrClone, arrSize, arrType, arrGet, arrSet};
+CMPIArrayFT g_arrFT = {200, arrRelease, nullptr, arrSize, arrType, arrGet, arrSet};
 
 // ---- object paths -------------------------------------------------------
 
@@ -283,7 +284,6 @@ struct Instance : Object {
 
 Instance* inst(const CMPIInstance* i) { return static_cast<Instance*>(i->hdl); }
 CMPIStatus instRelease(CMPIInstance*) { return ok(); }
-CMPIInstance* instClone(const CMPIInstance*, CMPIStatus* rc) { setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED); return nullptr; }
 CMPIData instGet(const CMPIInstance* i, const char* name, CMPIStatus* rc)
 {
     return getNamed(inst(i)->props, name, rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
@@ -326,13 +326,8 @@ CMPIStatus instFilter(CMPIInstance* i, const char** props, const char** keys)
         in->allowed.push_back(lower(*k));
     return ok();
 }
-CMPIStatus instSetPath(CMPIInstance* i, const CMPIObjectPath* op)
-{
-    inst(i)->op = const_cast<CMPIObjectPath*>(op);
-    return ok();
-}
-CMPIInstanceFT g_instFT = {200, instRelease, instClone, instGet, instGetAt, instCount, instSet,
-                           instPath, instFilter, instSetPath, nullptr};
+CMPIInstanceFT g_instFT = {200, instRelease, nullptr, instGet, instGetAt, instCount, instSet,
+                           instPath, instFilter, nullptr, nullptr};
 
 // ---- args ---------------------------------------------------------------
 
@@ -343,7 +338,6 @@ struct Args : Object {
 
 Args* args(const CMPIArgs* a) { return static_cast<Args*>(a->hdl); }
 CMPIStatus argsRelease(CMPIArgs*) { return ok(); }
-CMPIArgs* argsClone(const CMPIArgs*, CMPIStatus* rc) { setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED); return nullptr; }
 CMPIStatus argsAdd(const CMPIArgs* a, const char* name, const CMPIValue* v, const CMPIType t)
 {
     if (isChars(t))
@@ -360,7 +354,7 @@ CMPIData argsGetAt(const CMPIArgs* a, CMPICount i, CMPIString** name, CMPIStatus
     return getNamedAt(args(a)->args, i, name, rc);
 }
 CMPICount argsCount(const CMPIArgs* a, CMPIStatus* rc) { setRc(rc, CMPI_RC_OK); return static_cast<CMPICount>(args(a)->args.size()); }
-CMPIArgsFT g_argsFT = {200, argsRelease, argsClone, argsAdd, argsGet, argsGetAt, argsCount};
+CMPIArgsFT g_argsFT = {200, argsRelease, nullptr, argsAdd, argsGet, argsGetAt, argsCount};
 
 // ---- date-times ---------------------------------------------------------
 
@@ -372,7 +366,6 @@ struct DateTime : Object {
 
 DateTime* dt(const CMPIDateTime* d) { return static_cast<DateTime*>(d->hdl); }
 CMPIStatus dtRelease(CMPIDateTime*) { return ok(); }
-CMPIDateTime* dtClone(const CMPIDateTime*, CMPIStatus* rc) { setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED); return nullptr; }
 CMPIUint64 dtBinary(const CMPIDateTime* d, CMPIStatus* rc) { setRc(rc, CMPI_RC_OK); return dt(d)->micros; }
 CMPIString* dtString(const CMPIDateTime* d, CMPIStatus* rc)
 {
@@ -383,7 +376,7 @@ CMPIString* dtString(const CMPIDateTime* d, CMPIStatus* rc)
     return makeString(buf);
 }
 CMPIBoolean dtIsInterval(const CMPIDateTime* d, CMPIStatus* rc) { setRc(rc, CMPI_RC_OK); return dt(d)->interval ? 1 : 0; }
-CMPIDateTimeFT g_dtFT = {200, dtRelease, dtClone, dtBinary, dtString, dtIsInterval};
+CMPIDateTimeFT g_dtFT = {200, dtRelease, nullptr, dtBinary, dtString, dtIsInterval};
 
 CMPIDateTime* makeDateTime(CMPIUint64 micros, bool interval)
 {
@@ -405,7 +398,6 @@ struct Result : Object {
 
 Result* res(const CMPIResult* r) { return static_cast<Result*>(r->hdl); }
 CMPIStatus resRelease(CMPIResult*) { return ok(); }
-CMPIResult* resClone(const CMPIResult*, CMPIStatus* rc) { setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED); return nullptr; }
 CMPIStatus resData(const CMPIResult* r, const CMPIValue* v, const CMPIType t)
 {
     if (isChars(t))
@@ -430,7 +422,7 @@ CMPIStatus resDone(const CMPIResult* r)
     res(r)->done = true;
     return ok();
 }
-CMPIResultFT g_resFT = {200, resRelease, resClone, resData, resInst, resPath, resDone, nullptr};
+CMPIResultFT g_resFT = {200, resRelease, nullptr, resData, resInst, resPath, resDone, nullptr};
 
 struct Context : Object {
     CMPIContext enc;
@@ -438,22 +430,16 @@ struct Context : Object {
 };
 
 CMPIStatus ctxRelease(CMPIContext*) { return ok(); }
-CMPIContext* ctxClone(const CMPIContext*, CMPIStatus* rc) { setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED); return nullptr; }
 CMPIData ctxGet(const CMPIContext* c, const char* name, CMPIStatus* rc)
 {
     return getNamed(static_cast<Context*>(c->hdl)->entries, name, rc, CMPI_RC_ERR_NOT_FOUND);
 }
-CMPIData ctxGetAt(const CMPIContext* c, CMPICount i, CMPIString** name, CMPIStatus* rc)
-{
-    return getNamedAt(static_cast<Context*>(c->hdl)->entries, i, name, rc);
-}
-CMPICount ctxCount(const CMPIContext* c, CMPIStatus* rc) { setRc(rc, CMPI_RC_OK); return static_cast<CMPICount>(static_cast<Context*>(c->hdl)->entries.size()); }
 CMPIStatus ctxAdd(const CMPIContext* c, const char* name, const CMPIValue* v, const CMPIType t)
 {
     putNamed(static_cast<Context*>(c->hdl)->entries, name, store(v, t));
     return ok();
 }
-CMPIContextFT g_ctxFT = {200, ctxRelease, ctxClone, ctxGet, ctxGetAt, ctxCount, ctxAdd};
+CMPIContextFT g_ctxFT = {200, ctxRelease, nullptr, ctxGet, nullptr, nullptr, ctxAdd};
 
 struct SelectExp : Object {
     CMPISelectExp enc;
@@ -461,13 +447,12 @@ struct SelectExp : Object {
 };
 
 CMPIStatus seRelease(CMPISelectExp*) { return ok(); }
-CMPISelectExp* seClone(const CMPISelectExp*, CMPIStatus* rc) { setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED); return nullptr; }
 CMPIString* seString(const CMPISelectExp* se, CMPIStatus* rc)
 {
     setRc(rc, CMPI_RC_OK);
     return makeString(static_cast<SelectExp*>(se->hdl)->query.c_str());
 }
-CMPISelectExpFT g_seFT = {200, seRelease, seClone, nullptr, seString, nullptr, nullptr, nullptr};
+CMPISelectExpFT g_seFT = {200, seRelease, nullptr, nullptr, seString, nullptr, nullptr, nullptr};
 
 // ---- the broker ---------------------------------------------------------
 

@@ -51,6 +51,24 @@ struct TestProvider : public CmpiInstanceMI,
         rslt.returnDone();
         return CmpiStatus(CMPI_RC_OK);
     }
+    // createInstance answers the path it was handed; both note the
+    // instance's Name, setInstance the property list after it.
+    CmpiStatus createInstance(const CmpiContext&, CmpiResult& rslt, const CmpiObjectPath& cop,
+                              const CmpiInstance& inst) override
+    {
+        seen = static_cast<const char*>(inst.getProperty("Name"));
+        rslt.returnData(cop);
+        rslt.returnDone();
+        return CmpiStatus(CMPI_RC_OK);
+    }
+    CmpiStatus setInstance(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const CmpiInstance& inst,
+                           const char** properties) override
+    {
+        seen = static_cast<const char*>(inst.getProperty("Name"));
+        for (const char** p = properties; p != nullptr && *p != nullptr; ++p)
+            seen += std::string("|") + *p;
+        return CmpiStatus(CMPI_RC_OK);
+    }
     CmpiStatus execQuery(const CmpiContext&, CmpiResult&, const CmpiObjectPath&, const char* query,
                          const char* language) override
     {

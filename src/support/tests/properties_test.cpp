@@ -62,44 +62,34 @@ TEST_F(SettingsTest, ProviderWithoutFileKeepsDefaultsAndLogsNothing) {
     EXPECT_FALSE(exists(kLogPath));
 }
 
-TEST_F(SettingsTest, ProviderSwitchesAreOnForValuesAboveZero) {
-    providerReads("DebugLog=0\nErrorLog=5\n");
-    EXPECT_FALSE(g_EnableDebugPrint);
-    EXPECT_TRUE(g_EnableLogError);
-
-    providerReads("DebugLog=true\nErrorLog=-1\nZORAPLog=2\n");
-    EXPECT_FALSE(g_EnableDebugPrint);  // strtol reads 0
-    EXPECT_FALSE(g_EnableLogError);
-    EXPECT_TRUE(g_EnableZORAPLog);
-
-    providerReads("ErrorLog=1\nErrorLog=0\n");  // the last line wins
-    EXPECT_FALSE(g_EnableLogError);
-}
-
-TEST_F(SettingsTest, ProviderLineForms) {
-    providerReads("#ErrorLog=1\n");
-    EXPECT_FALSE(g_EnableLogError);
-
-    providerReads("   ErrorLog=1  \t\n");
-    EXPECT_TRUE(g_EnableLogError);
-
-    providerReads("ErrorLog = 1\n");
-    EXPECT_TRUE(g_EnableLogError);
-
-    providerReads("MyDebugLogSetting=1\n");  // a key anywhere in the line
-    EXPECT_TRUE(g_EnableDebugPrint);
-
-    providerReads("errorlog=1\n");  // case matters
-    EXPECT_FALSE(g_EnableLogError);
-
-    providerReads("ErrorLog 1\n");  // no "=", no change from the default
-    EXPECT_FALSE(g_EnableLogError);
-
-    providerReads("DebugLog=0=1\n");  // the value follows the last "="
-    EXPECT_TRUE(g_EnableDebugPrint);
-
-    providerReads("ErrorLog=1");  // no end of line after the last line
-    EXPECT_TRUE(g_EnableLogError);
+// Each row is one file the provider constructor reads: which of the three
+// log switches it leaves on. A switch is on for a value above zero (strtol's
+// reading), the last line of a key wins, the key may stand anywhere in a
+// line, case matters, and a line without "=" changes nothing.
+TEST_F(SettingsTest, ProviderSwitchesAndLineForms) {
+    struct Row {
+        char const* content;
+        bool debug, error, zorap;
+    } const rows[] = {
+        {"DebugLog=0\nErrorLog=5\n", false, true, false},
+        {"DebugLog=true\nErrorLog=-1\nZORAPLog=2\n", false, false, true},
+        {"ErrorLog=1\nErrorLog=0\n", false, false, false},
+        {"#ErrorLog=1\n", false, false, false},
+        {"   ErrorLog=1  \t\n", false, true, false},
+        {"ErrorLog = 1\n", false, true, false},
+        {"MyDebugLogSetting=1\n", true, false, false},
+        {"errorlog=1\n", false, false, false},
+        {"ErrorLog 1\n", false, false, false},
+        {"DebugLog=0=1\n", true, false, false},  // the value follows the last "="
+        {"ErrorLog=1", false, true, false},       // no end of line after the last line
+    };
+    for (Row const& row : rows) {
+        g_EnableDebugPrint = g_EnableLogError = g_EnableZORAPLog = true;  // each read sets all three
+        providerReads(row.content);
+        EXPECT_EQ(g_EnableDebugPrint, row.debug) << row.content;
+        EXPECT_EQ(g_EnableLogError, row.error) << row.content;
+        EXPECT_EQ(g_EnableZORAPLog, row.zorap) << row.content;
+    }
 }
 
 TEST_F(SettingsTest, ProviderTexts) {
@@ -146,32 +136,25 @@ TEST_F(SettingsTest, ProviderLogsItsConfigurationWhenDebugIsOn) {
     EXPECT_FALSE(exists(kLogPath));
 }
 
-TEST_F(SettingsTest, ProviderIgnoresTheWorkingDirectoryFile) {
-    writeFile(kCwdProperties, "ErrorLog=1\n");
-    LoadProviderProperties();
-    EXPECT_FALSE(g_EnableLogError);
-}
-
 // ---- The settings object's reader -------------------------------------------
 
-TEST_F(SettingsTest, NicWithoutFileKeepsDefaults) {
-    Vexlan_NIC_Properties properties;
-    EXPECT_FALSE(properties.debugLog);
-    EXPECT_FALSE(properties.errorLog);
-    EXPECT_EQ(properties.linkStatusPollIntervalSeconds, 180);
-    EXPECT_STREQ(properties.interopNamespace, "root/PG_InterOp");
-    EXPECT_STREQ(properties.implementationNamespace, "root/vexlan_cmpi");
-}
-
-TEST_F(SettingsTest, NicReadsOnlyTheWorkingDirectoryFile) {
-    writeFile(kOptProperties, "LinkStatusPollIntervalSeconds=30\n");
-    Vexlan_NIC_Properties fromOpt;
+// The two readers never read each other's file.
+TEST_F(SettingsTest, EachReaderReadsOnlyItsOwnFile) {
+    writeFile(kOptProperties, "LinkStatusPollIntervalSeconds=30\nErrorLog=1\nInteropNamespace=root/x\n");
+    Vexlan_NIC_Properties fromOpt;  // no file of its own: the defaults
+    EXPECT_FALSE(fromOpt.debugLog);
+    EXPECT_FALSE(fromOpt.errorLog);
     EXPECT_EQ(fromOpt.linkStatusPollIntervalSeconds, 180);
+    EXPECT_STREQ(fromOpt.interopNamespace, "root/PG_InterOp");
+    EXPECT_STREQ(fromOpt.implementationNamespace, "root/vexlan_cmpi");
+    std::remove(kOptProperties.c_str());
 
     Vexlan_NIC_Properties* fromCwd = nullptr;
-    nicReads("LinkStatusPollIntervalSeconds=30\n", fromCwd);
+    nicReads("LinkStatusPollIntervalSeconds=30\nErrorLog=1\n", fromCwd);
     EXPECT_EQ(fromCwd->linkStatusPollIntervalSeconds, 30);
     delete fromCwd;
+    LoadProviderProperties();
+    EXPECT_FALSE(g_EnableLogError);
 }
 
 TEST_F(SettingsTest, NicSwitchesAndWords) {
