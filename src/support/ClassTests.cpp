@@ -20,6 +20,10 @@ using classtests::KeptAnswers;
 
 std::mutex g_lock;
 
+// At most this many classes, and answers per class, are kept (the provider's
+// classes and the parents it tests are some two hundred).
+constexpr std::size_t kKeptPerClass = 1024;
+
 // The library's unload code may run the provider's cleanup after the
 // library's other objects are gone; the kept answers say when they are.
 bool g_answersGone = false;
@@ -43,9 +47,14 @@ std::shared_ptr<KeptAnswers> answersOf(const char* ns, const char* cls)
         return nullptr;
     const std::string key = lower(ns) + '\x1f' + lower(cls);
     std::lock_guard<std::mutex> guard(g_lock);
-    std::shared_ptr<KeptAnswers>& kept = g_answers.byClass[key];
-    if (!kept)
-        kept = std::make_shared<KeptAnswers>();
+    const auto it = g_answers.byClass.find(key);
+    if (it != g_answers.byClass.end())
+        return it->second;
+    // Past the bound a request's class is tested without keeping answers.
+    if (g_answers.byClass.size() >= kKeptPerClass)
+        return nullptr;
+    auto kept = std::make_shared<KeptAnswers>();
+    g_answers.byClass.emplace(key, kept);
     return kept;
 }
 
@@ -70,7 +79,10 @@ bool answer(Map& table, const typename Map::key_type& key, Ask&& ask)
     }
     const bool is = ask();
     std::lock_guard<std::mutex> guard(g_lock);
-    table.emplace(key, is);
+    // Texts from clients (an association's class names) are kept too; a
+    // client that sends ever new ones is answered without keeping them.
+    if (table.size() < kKeptPerClass)
+        table.emplace(key, is);
     return is;
 }
 
