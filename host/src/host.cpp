@@ -606,12 +606,16 @@ namespace {
 // or resultClass (references), and merges the answers; the first failure
 // ends the request.
 template <class Call>
-OpResult fanOut(Host::Impl& c, const ObjectPath& path, const std::string& named, Call call) {
-    if (c.flavour == Flavour::Sfcb) return call(named);
+OpResult fanOut(Host::Impl& c, const ObjectPath& path, const AssocParams& given, std::string AssocParams::*classParam,
+               Call call) {
+    if (c.flavour == Flavour::Sfcb) return call(given);
+    const std::string& named = given.*classParam;
     OpResult merged;
     merged.done = true;
     for (const std::string& cls : c.associationClassesFor(path.className, named)) {
-        OpResult one = call(cls);
+        AssocParams p = given;
+        p.*classParam = cls;
+        OpResult one = call(p);
         merged.instances.insert(merged.instances.end(), one.instances.begin(), one.instances.end());
         merged.paths.insert(merged.paths.end(), one.paths.begin(), one.paths.end());
         merged.data.insert(merged.data.end(), one.data.begin(), one.data.end());
@@ -629,35 +633,23 @@ OpResult fanOut(Host::Impl& c, const ObjectPath& path, const std::string& named,
 }  // namespace
 
 OpResult Host::associators(const ObjectPath& path, const AssocParams& given, const PropertyList& props) {
-    return fanOut(*impl_, path, given.assocClass, [&](const std::string& cls) {
-        AssocParams p = given;
-        p.assocClass = cls;
-        return associatorsAsCalled(path, p, props);
-    });
+    return fanOut(*impl_, path, given, &AssocParams::assocClass,
+                  [&](const AssocParams& p) { return associatorsAsCalled(path, p, props); });
 }
 
 OpResult Host::associatorNames(const ObjectPath& path, const AssocParams& given) {
-    return fanOut(*impl_, path, given.assocClass, [&](const std::string& cls) {
-        AssocParams p = given;
-        p.assocClass = cls;
-        return associatorNamesAsCalled(path, p);
-    });
+    return fanOut(*impl_, path, given, &AssocParams::assocClass,
+                  [&](const AssocParams& p) { return associatorNamesAsCalled(path, p); });
 }
 
 OpResult Host::references(const ObjectPath& path, const AssocParams& given, const PropertyList& props) {
-    return fanOut(*impl_, path, given.resultClass, [&](const std::string& cls) {
-        AssocParams p = given;
-        p.resultClass = cls;
-        return referencesAsCalled(path, p, props);
-    });
+    return fanOut(*impl_, path, given, &AssocParams::resultClass,
+                  [&](const AssocParams& p) { return referencesAsCalled(path, p, props); });
 }
 
 OpResult Host::referenceNames(const ObjectPath& path, const AssocParams& given) {
-    return fanOut(*impl_, path, given.resultClass, [&](const std::string& cls) {
-        AssocParams p = given;
-        p.resultClass = cls;
-        return referenceNamesAsCalled(path, p);
-    });
+    return fanOut(*impl_, path, given, &AssocParams::resultClass,
+                  [&](const AssocParams& p) { return referenceNamesAsCalled(path, p); });
 }
 
 OpResult Host::associatorsAsCalled(const ObjectPath& path, const AssocParams& p, const PropertyList& props) {
